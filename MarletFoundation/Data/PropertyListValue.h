@@ -1,0 +1,110 @@
+#pragma once
+
+#include <concepts>
+#include <cstdint>
+#include <initializer_list>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <variant>
+#include <vector>
+
+#include "MarletFoundation/Data/PropertyListKey.h"
+#include "MarletFoundation/Platform/Data.h"
+#include "MarletFoundation/Platform/Date.h"
+
+namespace MarletFoundation {
+
+struct PropertyListValue;
+
+/// A dictionary from string to value, kept as one array in ascending key order (by code point), so that
+/// lookup is logarithmic, iteration sorted, and a large one costs one allocation.
+class MARLET_EXPORT PropertyListDictionary {
+ public:
+  struct Entry;
+  using Entries = std::vector<Entry>;
+
+  PropertyListDictionary() = default;
+  /// Of equal keys the last wins.
+  PropertyListDictionary(std::initializer_list<std::pair<std::string_view, PropertyListValue>> entries);
+  /// Takes entries in any order; of equal keys the last wins.
+  explicit PropertyListDictionary(Entries entries);
+
+  std::size_t size() const { return entries_.size(); }
+  bool empty() const { return entries_.empty(); }
+  /// The value under `key`, or null. The pointer holds until the dictionary changes.
+  const PropertyListValue* find(std::string_view key) const;
+  PropertyListValue* find(std::string_view key);
+  bool contains(std::string_view key) const { return find(key) != nullptr; }
+  /// The value under `key`, made when there is none.
+  PropertyListValue& operator[](std::string_view key);
+  /// True when there was one.
+  bool erase(std::string_view key);
+
+  Entries::const_iterator begin() const { return entries_.begin(); }
+  Entries::const_iterator end() const { return entries_.end(); }
+  bool operator==(const PropertyListDictionary& other) const;
+
+ private:
+  friend struct PropertyListValue;
+  Entries entries_;
+};
+
+/// One value of a property list. Copies are independent. Two are equal when they are the same case with equal
+/// payloads: an integer never equals a floating point or a boolean. Copying, comparing and destroying need no
+/// stack, however deep the value is.
+struct MARLET_EXPORT PropertyListValue {
+  using Array = std::vector<PropertyListValue>;
+  using Dictionary = PropertyListDictionary;
+  /// The cases: array, dictionary, string, data, date, integer, floatingPoint, boolean.
+  using Payload = std::variant<Array, Dictionary, std::string, Data, Date, std::int64_t, double, bool>;
+
+  Payload payload;
+
+  PropertyListValue() = default;
+  PropertyListValue(Array value);
+  PropertyListValue(Dictionary value);
+  PropertyListValue(std::string value) : payload(std::move(value)) {}
+  PropertyListValue(std::string_view value) : payload(std::string(value)) {}
+  PropertyListValue(const char* value) : payload(std::string(value)) {}
+  PropertyListValue(Data value) : payload(std::move(value)) {}
+  PropertyListValue(Date value) : payload(value) {}
+  template <std::integral Integer>
+  requires(!std::same_as<Integer, bool>) PropertyListValue(Integer value)
+      : payload(static_cast<std::int64_t>(value)) {}
+  PropertyListValue(double value) : payload(value) {}
+  PropertyListValue(bool value) : payload(value) {}
+
+  PropertyListValue(const PropertyListValue& other);
+  PropertyListValue(PropertyListValue&&) noexcept = default;
+  PropertyListValue& operator=(const PropertyListValue& other);
+  PropertyListValue& operator=(PropertyListValue&& other) noexcept;
+  ~PropertyListValue();
+
+  /// The payload of the named case, or null.
+  const Array* array() const { return std::get_if<Array>(&payload); }
+  const Dictionary* dictionary() const { return std::get_if<Dictionary>(&payload); }
+  const std::string* string() const { return std::get_if<std::string>(&payload); }
+  const Data* data() const { return std::get_if<Data>(&payload); }
+  const Date* date() const { return std::get_if<Date>(&payload); }
+  const std::int64_t* integer() const { return std::get_if<std::int64_t>(&payload); }
+  const double* floatingPoint() const { return std::get_if<double>(&payload); }
+  const bool* boolean() const { return std::get_if<bool>(&payload); }
+
+  bool operator==(const PropertyListValue& other) const;
+
+  /// A value is its own property-list form.
+  const PropertyListValue& propertyListValue() const { return *this; }
+};
+
+struct PropertyListDictionary::Entry {
+  PropertyListKey key;
+  PropertyListValue value;
+};
+
+/// The printed form: `integer(7)`, `string("X")`, `array([…])`, `dictionary(["k": …])`.
+MARLET_EXPORT std::string description(const PropertyListValue& value);
+/// The printed form of an optional value: `Optional(string("X"))`, or `nil` for null.
+MARLET_EXPORT std::string optionalDescription(const PropertyListValue* value);
+
+}  // namespace MarletFoundation

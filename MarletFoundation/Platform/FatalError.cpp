@@ -1,0 +1,37 @@
+#include "MarletFoundation/Platform/FatalError.h"
+
+#include <cstdio>
+#include <cstdlib>
+#include <mutex>
+#include <utility>
+
+namespace MarletFoundation {
+namespace {
+
+std::mutex handlerMutex;
+
+FatalErrorHandler& installedHandler() {
+  static FatalErrorHandler handler;
+  return handler;
+}
+
+}  // namespace
+
+FatalErrorHandler setFatalErrorHandler(FatalErrorHandler handler) {
+  const std::lock_guard lock(handlerMutex);
+  return std::exchange(installedHandler(), std::move(handler));
+}
+
+void fatalError(std::string_view message, const std::source_location& where) {
+  FatalErrorHandler handler;
+  {
+    const std::lock_guard lock(handlerMutex);
+    handler = installedHandler();
+  }
+  if (handler) handler(message, where);
+  std::fprintf(stderr, "fatal error: %.*s (%s:%u)\n", static_cast<int>(message.size()), message.data(),
+               where.file_name(), static_cast<unsigned>(where.line()));
+  std::abort();
+}
+
+}  // namespace MarletFoundation

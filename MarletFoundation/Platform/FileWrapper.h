@@ -1,0 +1,64 @@
+#pragma once
+
+#include <map>
+#include <memory>
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "MarletFoundation/Platform/Data.h"
+#include "MarletFoundation/Platform/URL.h"
+
+namespace MarletFoundation {
+
+/// A node of a directory tree, in memory or read from disk as it is looked at. Copies share the node.
+///
+/// A tree from disk is lazy: a child asked for by name is opened by name, beneath its parent's descriptor, a
+/// whole directory is listed only when `fileWrappers` is asked for, and a file's bytes are read (never
+/// mapped) at first look. What was looked at once stays. Below the root no symbolic link is followed; links,
+/// pipes, sockets and devices are neither directory nor regular file, and nothing blocks on them. What can't
+/// be read shows as absent. One thread at a time may use a tree.
+class MARLET_EXPORT FileWrapper {
+ public:
+  using Children = std::map<std::string, FileWrapper, std::less<>>;
+
+  /// Opens the file or directory at `url`; only this root may be a symbolic link. Its preferred file name is
+  /// the URL's last path component. Throws an `ErrorObject` of the POSIX domain when it can't be opened.
+  explicit FileWrapper(const URL& url);
+  static FileWrapper regularFile(Data contents);
+  static FileWrapper directory(Children children = {});
+
+  bool isDirectory() const;
+  bool isRegularFile() const;
+  /// The bytes of a regular file; nothing for any other node, or if they can't be read.
+  std::optional<Data> regularFileContents() const;
+
+  /// Whether this is a directory whose children can be asked for.
+  bool hasChildren() const;
+  /// The child of that name, or nothing; looks at no other child. Any name may be asked for: one that no file
+  /// can have finds nothing.
+  std::optional<FileWrapper> child(std::string_view name) const;
+  /// All children by name; nothing for a node that isn't a directory or can't be listed.
+  std::optional<Children> fileWrappers() const;
+
+  std::optional<std::string> preferredFilename() const;
+  void setPreferredFilename(std::string name);
+
+  /// Adds a child under its preferred file name, replacing one of that name. Adding to a node that is not a
+  /// directory, or a child without a preferred file name, is a fatal error.
+  void addFileWrapper(FileWrapper child);
+  void removeFileWrapper(std::string_view name);
+
+  /// Writes the tree to `url`, all of it or nothing: it is built in a sibling of `url`, flushed, and takes
+  /// the place of what was there. Throws an `ErrorObject` of the POSIX domain, also for a child whose name is
+  /// empty, ".",
+  /// ".." or holds a slash or NUL (EINVAL), and for a node that couldn't be read or is of no writable kind.
+  void write(const URL& url) const;
+
+ private:
+  struct Node;
+  explicit FileWrapper(std::shared_ptr<Node> node) : node_(std::move(node)) {}
+  std::shared_ptr<Node> node_;
+};
+
+}  // namespace MarletFoundation

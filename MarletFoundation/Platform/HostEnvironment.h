@@ -1,0 +1,40 @@
+#pragma once
+
+#include <cstdint>
+#include <functional>
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "MarletFoundation/Platform/URL.h"
+
+namespace MarletFoundation {
+
+/// What the library asks of its host: places, settings and sinks. A host that wants others than the defaults
+/// sets them once, at start-up, before it uses the library.
+struct MARLET_EXPORT HostEnvironment {
+  /// The user's documents. Default: XDG_DOCUMENTS_DIR, else ~/Documents; nothing without a home.
+  std::optional<URL> documentsDirectory;
+  /// Where the library keeps support files. Default: XDG_DATA_HOME, else ~/.local/share.
+  std::optional<URL> applicationSupportDirectory;
+  /// The shared container of an app group, or nothing. Default: a directory of that name in the support
+  /// directory.
+  std::function<std::optional<URL>(std::string_view identifier)> groupContainer;
+  /// Where "Targets" and "Toolchain" lie. Default: MARLET_RESOURCES, else the installed resources beside the
+  /// library, else those of the source tree that it was built from.
+  std::optional<URL> resourcesDirectory;
+  /// The integer under a user-default key, or nothing. Default: the environment variable
+  /// MARLET_DEFAULTS_<key>.
+  std::function<std::optional<std::int64_t>(std::string_view key)> userDefault;
+  /// Takes one entry of the system log. Default: syslog.
+  std::function<void(std::string_view entry)> systemLog;
+  /// Takes one line of diagnostics, without its line feed. Default: standard output.
+  std::function<void(std::string_view line)> diagnostics;
+
+  static HostEnvironment defaults();
+  /// The environment in force. It may be read from any thread.
+  static const HostEnvironment& current();
+  static void setCurrent(HostEnvironment environment);
+};
+
+}  // namespace MarletFoundation

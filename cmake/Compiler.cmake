@@ -1,0 +1,23 @@
+set(CMAKE_CXX_STANDARD 20)
+set(CMAKE_CXX_STANDARD_REQUIRED ON)
+set(CMAKE_CXX_EXTENSIONS OFF)
+set(CMAKE_CXX_VISIBILITY_PRESET hidden)
+set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
+set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+set(CMAKE_EXPORT_COMPILE_COMMANDS ON)
+set(CMAKE_RUNTIME_OUTPUT_DIRECTORY ${CMAKE_BINARY_DIR}/bin)
+set(CMAKE_LIBRARY_OUTPUT_DIRECTORY ${CMAKE_BINARY_DIR}/lib)
+if(NOT CMAKE_BUILD_TYPE)
+  set(CMAKE_BUILD_TYPE Release)
+endif()
+
+include(GNUInstallDirs)
+
+# Warnings and sanitizers are for our own targets only, never for who links us.
+add_library(marlet_options INTERFACE)
+target_compile_options(marlet_options INTERFACE -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor -Werror)
+if(MARLET_SANITIZE)
+  target_compile_options(marlet_options INTERFACE -fsanitize=${MARLET_SANITIZE} -fno-omit-frame-pointer
+                                                  -fno-sanitize-recover=all)
+  target_link_options(marlet_options INTERFACE -fsanitize=${MARLET_SANITIZE})
+endif()

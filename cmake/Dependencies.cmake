@@ -1,0 +1,7 @@
+find_package(Threads REQUIRED)
+find_package(ICU REQUIRED COMPONENTS i18n uc)
+find_package(LibXml2 REQUIRED)
+find_package(OpenSSL REQUIRED COMPONENTS Crypto)
+find_package(uriparser REQUIRED)
+find_package(nlohmann_json REQUIRED)
+find_package(CLI11 REQUIRED)

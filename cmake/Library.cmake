@@ -1,0 +1,21 @@
+# One shared library. Its rooms are folders; each is listed by what it holds.
+file(GLOB MARLET_SOURCES CONFIGURE_DEPENDS ${CMAKE_SOURCE_DIR}/MarletFoundation/*/*.cpp
+     ${CMAKE_SOURCE_DIR}/MarletFoundation/*.cpp)
+file(GLOB MARLET_DIFF_SOURCES CONFIGURE_DEPENDS ${CMAKE_SOURCE_DIR}/MarletDiff/*.cpp)
+
+# The diff engine is compiled by itself, so that nothing of books can creep into it.
+add_library(MarletDiff OBJECT ${MARLET_DIFF_SOURCES})
+target_include_directories(MarletDiff PRIVATE ${CMAKE_SOURCE_DIR})
+target_link_libraries(MarletDiff PRIVATE marlet_options ICU::uc)
+
+add_library(MarletFoundation SHARED ${MARLET_SOURCES})
+add_library(MarletFoundation::MarletFoundation ALIAS MarletFoundation)
+set_target_properties(MarletFoundation PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${PROJECT_VERSION_MAJOR})
+target_include_directories(MarletFoundation PUBLIC $<BUILD_INTERFACE:${CMAKE_SOURCE_DIR}>
+                                                   $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
+target_compile_features(MarletFoundation PUBLIC cxx_std_20)
+target_compile_definitions(
+  MarletFoundation PRIVATE MARLET_VERSION_STRING="${PROJECT_VERSION}"
+                           MARLET_BUILD_RESOURCES="${CMAKE_SOURCE_DIR}/Resources")
+target_link_libraries(MarletFoundation PRIVATE $<BUILD_INTERFACE:marlet_options> $<BUILD_INTERFACE:MarletDiff> ICU::i18n ICU::uc
+                                               LibXml2::LibXml2 OpenSSL::Crypto uriparser::uriparser Threads::Threads)
