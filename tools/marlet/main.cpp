@@ -1,1 +1,101 @@
-int main() { return 0; }
+#include <CLI/CLI.hpp>
+#include <iostream>
+#include <map>
+
+#include "Check.h"
+#include "FatalProblem.h"
+#include "MarletFoundation/MarletFoundation.h"
+#include "PropertyListCommand.h"
+#include "Show.h"
+
+using namespace MarletFoundation;
+
+namespace {
+
+/// What the library asks of its host: words for its errors, and a place for what it has to say beside its
+/// results.
+void setUpLibrary(const Terminal& terminal) {
+  registerUserVisibleError<MarletBookSnapshot::SerializationError>();
+  registerUserVisibleError<MarletChapterSnapshot::SerializationError>();
+  registerUserVisibleError<AssessmentInformation::SerializationError>();
+  registerUserVisibleError<AssessmentStatus::SerializationError>();
+  auto environment = HostEnvironment::defaults();
+  environment.systemLog =
+      environment.diagnostics = [&terminal](std::string_view line) { terminal.note(printable(line)); };
+  HostEnvironment::setCurrent(std::move(environment));
+  setFatalErrorHandler([](std::string_view message, const std::source_location&) {
+    throw FatalProblem{std::string(message)};
+  });
+}
+
+int run(int argc, char** argv) {
+  CLI::App app("Create, check and ship books of interactive lessons.", "marlet");
+  app.require_subcommand(1);
+  app.fallthrough();
+  app.set_version_flag("--version", "marlet " + std::string(MarletFoundationVersionString));
+
+  Terminal terminal;
+  app.add_flag("-q,--quiet", terminal.quiet, "Print results only");
+  app.add_flag("-v,--verbose", terminal.verbose, "Print more of what is going on");
+  const std::map<std::string, Terminal::Color> colors{{"auto", Terminal::Color::automatic},
+                                                      {"always", Terminal::Color::always},
+                                                      {"never", Terminal::Color::never}};
+  app.add_option("--color", terminal.color, "When to colour: auto, always or never")
+      ->transform(CLI::CheckedTransformer(colors));
+
+  auto status = ExitStatus::good;
+  bool asJSON = false;
+
+  std::vector<std::string> paths;
+  auto* checkCommand =
+      app.add_subcommand("check", "Open each document in full and report what is wrong with it");
+  checkCommand->add_option("PATH", paths, "Documents to check")->required();
+  checkCommand->add_flag("--json", asJSON, "Report as JSON");
+  checkCommand->callback([&] { status = check(paths, asJSON, terminal); });
+
+  std::string path;
+  auto* showCommand =
+      app.add_subcommand("show", "Show a book's table of contents, with marks at the passed pages");
+  showCommand->add_option("PATH", path, "The book")->required();
+  showCommand->add_flag("--json", asJSON, "Show as JSON");
+  showCommand->callback([&] { status = show(path, asJSON, terminal); });
+
+  auto form = PropertyListOutput::xml;
+  std::string output = "-";
+  const std::map<std::string, PropertyListOutput> forms{{"xml", PropertyListOutput::xml},
+                                                        {"binary", PropertyListOutput::binary},
+                                                        {"json", PropertyListOutput::json}};
+  auto* plistCommand = app.add_subcommand("plist", "Print or convert a property list");
+  plistCommand->add_option("FILE", path, "The property list, in either form; - is standard input")
+      ->required();
+  plistCommand->add_option("--to", form, "The form to write: xml (default), binary or json")
+      ->transform(CLI::CheckedTransformer(forms));
+  plistCommand->add_option("-o,--output", output, "Where to write; - is standard output");
+  plistCommand->callback([&] { status = convertPropertyList(path, form, output, terminal); });
+
+  app.parse_complete_callback([&] { setUpLibrary(terminal); });
+  try {
+    app.parse(argc, argv);
+  } catch (const CLI::ParseError& error) {
+    return app.exit(error, std::cout, std::cerr) == 0 ? 0 : static_cast<int>(ExitStatus::wrongUsage);
+  }
+  std::cout.flush();
+  if (!std::cout) {
+    terminal.complain("standard output can't be written.");
+    return static_cast<int>(ExitStatus::failedWrite);
+  }
+  return static_cast<int>(status);
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  try {
+    return run(argc, argv);
+  } catch (const FatalProblem& fatal) {
+    std::cerr << "marlet: " << fatal.message << "\n";
+  } catch (const std::exception& error) {
+    std::cerr << "marlet: " << error.what() << "\n";
+  }
+  return static_cast<int>(ExitStatus::negative);
+}

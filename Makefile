@@ -1,0 +1,51 @@
+# `make` builds build/release/bin/marlet; `make demo` and `make test` install what is missing first.
+.DEFAULT_GOAL := marlet
+.PHONY: marlet demo test asan tsan clang bench fuzz format check-format embed
+
+EXAMPLE := examples/LearnLoops.marletbook
+FUZZ_SECONDS ?= 600
+
+configure = cmake --preset $(1)
+sources = $(shell git ls-files '*.cpp' '*.h')
+
+marlet:
+	scripts/install-dependencies
+	$(call configure,release) -DMARLET_BUILD_TESTS=OFF
+	cmake --build --preset release
+
+demo: marlet
+	build/release/bin/marlet check $(EXAMPLE)
+	build/release/bin/marlet show $(EXAMPLE)
+
+test:
+	scripts/install-dependencies
+	$(call configure,debug)
+	cmake --build --preset debug
+	ctest --test-dir build/debug --output-on-failure -j2
+
+asan tsan clang:
+	scripts/install-dependencies --develop
+	$(call configure,$@)
+	cmake --build --preset $@
+	build/$@/bin/marlet_tests --gtest_brief=1
+
+bench:
+	scripts/install-dependencies --develop
+	$(call configure,bench)
+	cmake --build --preset bench
+	bench/run
+
+fuzz:
+	scripts/install-dependencies --develop
+	$(call configure,fuzz)
+	cmake --build --preset fuzz
+	fuzz/run $(FUZZ_SECONDS)
+
+embed: marlet
+	scripts/test-install
+
+format:
+	clang-format -i $(sources)
+
+check-format:
+	clang-format --dry-run -Werror $(sources)

@@ -1,0 +1,25 @@
+#pragma once
+
+/// Everything of the library, for hosts that don't want to choose.
+
+#include "MarletFoundation/Data/CaseError.h"
+#include "MarletFoundation/Data/PropertyListSerializable.h"
+#include "MarletFoundation/Data/PropertyListValue.h"
+#include "MarletFoundation/DiffPack/DiffPackSnapshot.h"
+#include "MarletFoundation/DiffPack/MergedUserEdit.h"
+#include "MarletFoundation/Environment/SearchPath.h"
+#include "MarletFoundation/Environment/Target.h"
+#include "MarletFoundation/Environment/Toolchain.h"
+#include "MarletFoundation/Logging/Log.h"
+#include "MarletFoundation/Marlet/MarletBookSnapshot.h"
+#include "MarletFoundation/Marlet/MarletResultInfo.h"
+#include "MarletFoundation/Platform/FatalError.h"
+#include "MarletFoundation/Platform/FileManager.h"
+#include "MarletFoundation/Platform/FileWrapper.h"
+#include "MarletFoundation/Platform/HostEnvironment.h"
+#include "MarletFoundation/SourceEditor/SourceEditorPosition.h"
+#include "MarletFoundation/SourceEditor/SourceEditorRange.h"
+#include "MarletFoundation/Utils/Locks.h"
+#include "MarletFoundation/Version/ManifestVersion.h"
+#include "MarletFoundation/Version/MarletFoundationVersion.h"
+#include "MarletFoundation/Version/Version.h"

@@ -1,0 +1,58 @@
+#include "Problem.h"
+
+#include "MarletFoundation/MarletFoundation.h"
+#include "ProblemPlace.h"
+
+using namespace MarletFoundation;
+
+namespace {
+
+template <class T>
+nlohmann::ordered_json orNull(const std::optional<T>& value) {
+  return value ? nlohmann::ordered_json(*value) : nlohmann::ordered_json(nullptr);
+}
+
+Problem described(std::string rule, const Error& error) {
+  const ErrorObject object(error);
+  Problem problem;
+  problem.rule = std::move(rule);
+  problem.domain = object.domain();
+  problem.code = object.code();
+  if (!error.caseName().empty()) problem.caseName = error.caseName();
+  problem.description = object.localizedDescription();
+  problem.recoverySuggestion = object.localizedRecoverySuggestion();
+  return problem;
+}
+
+}  // namespace
+
+Problem problemOfBookLoad(const Error& error) {
+  const auto place = placeInBook(error);
+  auto problem = described(place.rule, error);
+  problem.file = place.file;
+  problem.line = place.line;
+  return problem;
+}
+
+Problem problemOfUnreadablePath(const Error& error) { return described("path.unreadable", error); }
+
+Problem problemOfFatalError(std::string_view message) {
+  Problem problem;
+  problem.rule = "fatal";
+  problem.description = message;
+  return problem;
+}
+
+nlohmann::ordered_json json(const Problem& problem) {
+  return {{"severity", problem.severity},
+          {"rule", problem.rule},
+          {"domain", orNull(problem.domain)},
+          {"code", orNull(problem.code)},
+          {"case", orNull(problem.caseName)},
+          {"description", problem.description},
+          {"recoverySuggestion", orNull(problem.recoverySuggestion)},
+          {"file", orNull(problem.file)},
+          {"line", orNull(problem.line)},
+          {"column", orNull(problem.column)},
+          {"length", orNull(problem.length)}};
+}

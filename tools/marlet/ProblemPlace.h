@@ -1,0 +1,16 @@
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+
+#include "MarletFoundation/Platform/Error.h"
+
+/// Where in a book an error lies, and under which rule it is filed: both follow the innermost error.
+struct ProblemPlace {
+  std::string rule;
+  std::optional<std::string> file;
+  std::optional<std::int64_t> line;
+};
+
+ProblemPlace placeInBook(const MarletFoundation::Error& error);

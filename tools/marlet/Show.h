@@ -1,0 +1,9 @@
+#pragma once
+
+#include <string>
+
+#include "ExitStatus.h"
+#include "Terminal.h"
+
+/// `marlet show`: a book's table of contents.
+ExitStatus show(const std::string& path, bool asJSON, const Terminal& terminal);
