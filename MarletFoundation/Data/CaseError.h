@@ -66,6 +66,7 @@ class MARLET_EXPORT BasicCaseError : public Base, public ErrorPayload {
   std::string description() const override { return errorDescription(row(), *this); }
   ErrorPointer underlyingError() const override { return error; }
   ErrorPointer copy() const override { return std::make_shared<Derived>(static_cast<const Derived&>(*this)); }
+  [[noreturn]] void raise() const override { throw static_cast<const Derived&>(*this); }
   // The names are literals, so each ends in NUL.
   const char* what() const noexcept override { return row().name.data(); }
 

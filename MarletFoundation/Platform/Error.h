@@ -29,6 +29,8 @@ class MARLET_EXPORT Error : public std::exception {
   virtual ErrorPointer underlyingError() const { return nullptr; }
   /// A copy of the whole error, with its own type.
   virtual ErrorPointer copy() const = 0;
+  /// Throws a copy of the whole error, with its own type.
+  [[noreturn]] virtual void raise() const = 0;
 };
 
 }  // namespace MarletFoundation
