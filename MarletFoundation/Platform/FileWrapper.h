@@ -11,6 +11,8 @@
 
 namespace MarletFoundation {
 
+class FileNode;
+
 /// A node of a directory tree, in memory or read from disk as it is looked at. Copies share the node.
 ///
 /// A tree from disk is lazy: a child asked for by name is opened by name, beneath its parent's descriptor, a
@@ -56,9 +58,8 @@ class MARLET_EXPORT FileWrapper {
   void write(const URL& url) const;
 
  private:
-  struct Node;
-  explicit FileWrapper(std::shared_ptr<Node> node) : node_(std::move(node)) {}
-  std::shared_ptr<Node> node_;
+  explicit FileWrapper(std::shared_ptr<FileNode> node) : node_(std::move(node)) {}
+  std::shared_ptr<FileNode> node_;
 };
 
 }  // namespace MarletFoundation

@@ -1,0 +1,2 @@
+/// How bright the lamp shines, in percent.
+public typealias Brightness = Int
