@@ -60,6 +60,12 @@ bool isBlank(char c) { return c == ' ' || c == '\n' || c == '\t' || c == '\r'; }
 
 bool endsName(char c) { return c == '>' || isBlank(c) || c == '/' || c == '=' || c == '<'; }
 
+bool isNameCharacter(char c) {
+  const bool isLetter = (c | 0x20) >= 'a' && (c | 0x20) <= 'z';
+  return isLetter || (c >= '0' && c <= '9') || c == '_' || c == '-' || c == '.' || c == ':' ||
+         static_cast<std::uint8_t>(c) > 0x7F;
+}
+
 std::string_view trimmed(std::string_view text) {
   while (!text.empty() && isBlank(text.front())) text.remove_prefix(1);
   while (!text.empty() && isBlank(text.back())) text.remove_suffix(1);
@@ -170,8 +176,8 @@ void XMLReader::readStartTag() {
   const bool isEmpty = skipAttributes(tag);
   switch (*element) {
     case Element::plist:
+      if (!open_.empty()) fail(misplacedElement, tag, name);
       if (hasRoot_) fail(secondRoot, tag);
-      if (!open_.empty() || hasPlist_) fail(misplacedElement, tag, name);
       if (isEmpty) fail(missingRoot, tag);
       hasPlist_ = true;
       open_.push_back({Element::plist});
@@ -435,11 +441,13 @@ void XMLReader::skipComment() {
 void XMLReader::skipInstruction() {
   const char* const start = place_;
   place_ += 2;
-  const auto target = rest().substr(0, 3);
-  const bool isReserved = target.size() == 3 && (target[0] | 0x20) == 'x' && (target[1] | 0x20) == 'm' &&
-                          (target[2] | 0x20) == 'l' &&
-                          (rest().size() == 3 || isBlank(rest()[3]) || rest()[3] == '?');
-  if (target.empty() || isBlank(target[0]) || target[0] == '?' || isReserved) fail(malformedMarkup, start);
+  const char* const target = place_;
+  while (place_ < end_ && isNameCharacter(*place_)) ++place_;
+  const auto length = place_ - target;
+  const bool isReserved =
+      length == 3 && (target[0] | 0x20) == 'x' && (target[1] | 0x20) == 'm' && (target[2] | 0x20) == 'l';
+  const bool isEnded = place_ < end_ && (isBlank(*place_) || *place_ == '?');
+  if (length == 0 || isReserved || !isEnded) fail(malformedMarkup, start);
   skipPast("?>", start);
 }
 

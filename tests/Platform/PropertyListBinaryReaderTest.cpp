@@ -10,7 +10,7 @@ using namespace std::string_literals;
 
 std::string bigEndian(std::uint64_t number, int width) {
   std::string bytes;
-  while (width-- > 0) bytes += static_cast<char>(number >> (8 * width));
+  while (width-- > 0) bytes += static_cast<char>(width < 8 ? number >> (8 * width) : 0);
   return bytes;
 }
 
@@ -114,7 +114,7 @@ TEST(PropertyListBinaryReader, DecidesEveryObject) {
 }
 
 TEST(PropertyListBinaryReader, ChecksTheTrailer) {
-  const auto good = File{{"\x09"}};
+  const auto good = File{{"\x09", "\x08"}};
   const auto with = [&good](auto change) {
     auto file = good;
     change(file);
@@ -126,14 +126,14 @@ TEST(PropertyListBinaryReader, ChecksTheTrailer) {
   EXPECT_EQ(with([](File& f) { f.referenceWidth = 0; }), failure(invalidTrailer));
   EXPECT_EQ(with([](File& f) { f.referenceWidth = 9; }), failure(invalidTrailer));
   EXPECT_EQ(with([](File& f) { f.count = 0; }), failure(invalidTrailer));
-  EXPECT_EQ(with([](File& f) { f.count = 2; }), failure(invalidTrailer));
+  EXPECT_EQ(with([](File& f) { f.count = 3; }), failure(invalidTrailer));
   EXPECT_EQ(with([](File& f) { f.offsetWidth = 8, f.count = (1ULL << 61) + 1; }), failure(invalidTrailer));
-  EXPECT_EQ(with([](File& f) { f.root = 1; }), failure(invalidTrailer));
+  EXPECT_EQ(with([](File& f) { f.root = 2; }), failure(invalidTrailer));
   EXPECT_EQ(with([](File& f) { f.table = 8; }), failure(invalidTrailer));
-  EXPECT_EQ(with([](File& f) { f.table = 10; }), failure(invalidTrailer));
+  EXPECT_EQ(with([](File& f) { f.table = 12; }), failure(invalidTrailer));
   EXPECT_EQ(with([](File& f) { f.table = ~0ULL; }), failure(invalidTrailer));
   EXPECT_EQ(with([](File& f) { f.firstOffset = 7; }), failure(invalidOffset));
-  EXPECT_EQ(with([](File& f) { f.firstOffset = 9; }), failure(invalidOffset));
+  EXPECT_EQ(with([](File& f) { f.firstOffset = 10; }), failure(invalidOffset));
   EXPECT_EQ(outcome("bplist00"), failure(truncated));
   EXPECT_EQ(outcome("bplist01" + std::string(100, '\0')), failure(unknownFormat));
   for (const int width : {1, 2, 3, 4, 5, 6, 7, 8}) {
