@@ -10,6 +10,14 @@ namespace {
 
 using enum PropertyListErrorCode;
 
+std::string_view referenceFor(char c) {
+  if (c == '&') return "&amp;";
+  if (c == '<') return "&lt;";
+  if (c == '>') return "&gt;";
+  // Readers take a carriage return as it stands for a line feed.
+  return c == '\r' ? "&#13;" : "";
+}
+
 class XMLWriter {
  public:
   std::string write(const PropertyListValue& value) {
@@ -128,24 +136,14 @@ void XMLWriter::checkText(std::string_view text) {
 }
 
 void XMLWriter::writeWithReferences(std::string_view text) {
-  for (const char c : text) {
-    switch (c) {
-      case '&':
-        text_ += "&amp;";
-        break;
-      case '<':
-        text_ += "&lt;";
-        break;
-      case '>':
-        text_ += "&gt;";
-        break;
-      case '\r':
-        text_ += "&#13;";
-        break;
-      default:
-        text_ += c;
-    }
+  std::size_t written = 0;
+  for (std::size_t place = 0; place < text.size(); ++place) {
+    const auto reference = referenceFor(text[place]);
+    if (reference.empty()) continue;
+    text_.append(text, written, place - written).append(reference);
+    written = place + 1;
   }
+  text_.append(text, written);
 }
 
 }  // namespace

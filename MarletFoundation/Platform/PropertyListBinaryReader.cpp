@@ -140,7 +140,7 @@ void BinaryReader::readValue(std::uint64_t object, std::size_t referencedAt) {
       const auto length = count(start);
       const auto data = body(place, start, length, 1);
       spend(0, data.size(), referencedAt);
-      return events_.data(Data(std::string(data)));
+      return events_.data(PropertyListText::copiedData(data));
     }
     case 0x5:
     case 0x6: {

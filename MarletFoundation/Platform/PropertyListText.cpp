@@ -126,6 +126,11 @@ std::size_t appendUTF8FromUTF16(std::string& text, std::string_view bytes, bool 
   std::size_t place = 0;
   while (place + 2 <= bytes.size()) {
     const auto unit = unitAt(place);
+    if (unit < 0x80) {
+      text.push_back(static_cast<char>(unit));
+      place += 2;
+      continue;
+    }
     if (unit < 0xD800 || unit > 0xDFFF) {
       appendUTF8(text, unit);
       place += 2;
@@ -138,6 +143,12 @@ std::size_t appendUTF8FromUTF16(std::string& text, std::string_view bytes, bool 
     place += 4;
   }
   return place;
+}
+
+Data copiedData(std::string_view bytes) {
+  const auto owner = std::make_shared<std::uint8_t[]>(bytes.size());
+  if (!bytes.empty()) std::memcpy(owner.get(), bytes.data(), bytes.size());
+  return {owner, {owner.get(), bytes.size()}};
 }
 
 char32_t nextCharacter(std::string_view text, std::size_t& place) {

@@ -266,7 +266,7 @@ void XMLReader::readScalar(Element element, bool isEmpty, const char* tag) {
     case Element::data: {
       std::string bytes;
       if (!PropertyListScalars::appendFromBase64(bytes, text)) fail(invalidData, tag);
-      return events_.data(Data(std::move(bytes)));
+      return events_.data(PropertyListText::copiedData(bytes));
     }
     default:
       if (!trimmed(text).empty()) fail(misplacedText, tag);
