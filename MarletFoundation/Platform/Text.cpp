@@ -1,0 +1,307 @@
+#include "MarletFoundation/Platform/Text.h"
+
+#include <unicode/ubrk.h>
+#include <unicode/unorm2.h>
+#include <unicode/utext.h>
+
+#include <algorithm>
+#include <charconv>
+#include <cstring>
+#include <limits>
+#include <memory>
+
+#include "MarletFoundation/Platform/FatalError.h"
+
+namespace MarletFoundation {
+namespace {
+
+bool isASCII(char c) { return static_cast<unsigned char>(c) < 0x80; }
+
+/// Length of the run of ASCII from `from` on, found a word at a time.
+template <class Unit>
+std::size_t asciiRunLength(std::basic_string_view<Unit> text, std::size_t from) {
+  constexpr std::size_t unitsPerWord = sizeof(std::uint64_t) / sizeof(Unit);
+  constexpr std::uint64_t nonASCII = sizeof(Unit) == 1 ? 0x8080808080808080 : 0xFF80FF80FF80FF80;
+  std::size_t i = from;
+  for (std::uint64_t word; i + unitsPerWord <= text.size(); i += unitsPerWord) {
+    std::memcpy(&word, text.data() + i, sizeof word);
+    if (word & nonASCII) break;
+  }
+  while (i < text.size() && static_cast<std::make_unsigned_t<Unit>>(text[i]) < 0x80) ++i;
+  return i - from;
+}
+
+bool isAllASCII(std::string_view text) { return asciiRunLength(text, 0) == text.size(); }
+
+struct Scalar {
+  char32_t value = 0;
+  /// Bytes that it takes; 0 for ill-formed ones.
+  std::size_t length = 0;
+};
+
+/// The non-ASCII scalar value at the front of `text`.
+Scalar decodeUTF8(std::string_view text) {
+  const auto continuation = [&](std::size_t i) -> char32_t {
+    return i < text.size() && (text[i] & 0xC0) == 0x80 ? text[i] & 0x3F : 0x80000000;
+  };
+  const auto lead = static_cast<unsigned char>(text[0]);
+  if (lead >= 0xC2 && lead < 0xE0) {
+    const char32_t value = (lead & 0x1Fu) << 6 | continuation(1);
+    if (value < 0x800) return {value, 2};
+  } else if (lead >= 0xE0 && lead < 0xF0) {
+    const char32_t second = continuation(1), third = continuation(2);
+    const char32_t value = (lead & 0x0Fu) << 12 | second << 6 | third;
+    if ((second | third) < 0x40 && value >= 0x800 && (value < 0xD800 || value > 0xDFFF)) return {value, 3};
+  } else if (lead >= 0xF0 && lead < 0xF5) {
+    const char32_t second = continuation(1), third = continuation(2), fourth = continuation(3);
+    const char32_t value = (lead & 0x07u) << 18 | second << 12 | third << 6 | fourth;
+    if ((second | third | fourth) < 0x40 && value >= 0x10000 && value <= 0x10FFFF) return {value, 4};
+  }
+  return {};
+}
+
+/// Writes the UTF-8 form of a non-ASCII scalar value and returns the place behind it.
+char* encodeUTF8(char32_t scalar, char* out) {
+  const auto trail = [&](int shift) { return static_cast<char>(0x80 | (scalar >> shift & 0x3F)); };
+  if (scalar < 0x800) {
+    *out++ = static_cast<char>(0xC0 | scalar >> 6);
+    *out++ = trail(0);
+  } else if (scalar < 0x10000) {
+    *out++ = static_cast<char>(0xE0 | scalar >> 12);
+    *out++ = trail(6);
+    *out++ = trail(0);
+  } else {
+    *out++ = static_cast<char>(0xF0 | scalar >> 18);
+    *out++ = trail(12);
+    *out++ = trail(6);
+    *out++ = trail(0);
+  }
+  return out;
+}
+
+enum class Unpaired { fail, replace };
+
+std::optional<std::string> utf8(std::u16string_view text, Unpaired unpaired) {
+  // Three bytes for each unit of a surrogate pair are more than it takes, and enough for U+FFFD.
+  std::size_t bound = 0;
+  for (const char16_t unit : text) bound += 1u + (unit >= 0x80) + (unit >= 0x800);
+  std::string result(bound, '\0');
+  char* out = result.data();
+  for (std::size_t i = 0; i < text.size(); ++i) {
+    if (text[i] < 0x80) {
+      const auto run = asciiRunLength(text, i);
+      out = std::copy_n(text.data() + i, run, out);
+      i += run - 1;
+      continue;
+    }
+    char32_t scalar = text[i];
+    if (scalar >= 0xD800 && scalar <= 0xDFFF) {
+      const bool paired =
+          scalar < 0xDC00 && i + 1 < text.size() && text[i + 1] >= 0xDC00 && text[i + 1] <= 0xDFFF;
+      if (!paired && unpaired == Unpaired::fail) return std::nullopt;
+      scalar = paired ? 0x10000 + ((scalar - 0xD800) << 10) + (text[++i] - 0xDC00u) : 0xFFFD;
+    }
+    out = encodeUTF8(scalar, out);
+  }
+  result.resize(static_cast<std::size_t>(out - result.data()));
+  return result;
+}
+
+/// Whether a character ends behind the ASCII character at `at` whatever surrounds it. Two ASCII characters
+/// never belong together, but for CR LF, which ends at its own end.
+bool standsAlone(std::string_view text, std::size_t at) {
+  return isASCII(text[at]) && (at + 1 == text.size() || isASCII(text[at + 1]));
+}
+
+std::size_t lengthOfASCIICharacter(std::string_view text, std::size_t at) {
+  return text[at] == '\r' && at + 1 < text.size() && text[at + 1] == '\n' ? 2 : 1;
+}
+
+/// ICU's walk over characters. Opening one is costly, so each thread keeps its own.
+class CharacterWalk {
+ public:
+  static CharacterWalk& ofThisThread() {
+    thread_local CharacterWalk walk;
+    return walk;
+  }
+
+  ~CharacterWalk() {
+    ubrk_close(iterator_);
+    utext_close(&text_);
+  }
+
+  /// Starts at the front of `text`, which must be the start of a character.
+  void start(std::string_view text) {
+    UErrorCode status = U_ZERO_ERROR;
+    utext_openUTF8(&text_, text.data(), static_cast<std::int64_t>(text.size()), &status);
+    ubrk_setUText(iterator_, &text_, &status);
+    if (U_FAILURE(status)) fatalError("the character break iterator takes no text");
+  }
+  /// Bytes from the start to the end of the next character. Not to be called at the end.
+  std::size_t next() { return static_cast<std::size_t>(ubrk_next(iterator_)); }
+
+ private:
+  CharacterWalk() {
+    UErrorCode status = U_ZERO_ERROR;
+    iterator_ = ubrk_open(UBRK_CHARACTER, "", nullptr, 0, &status);
+    if (U_FAILURE(status)) fatalError("no character break iterator");
+  }
+
+  UText text_ = UTEXT_INITIALIZER;
+  UBreakIterator* iterator_ = nullptr;
+};
+
+struct Run {
+  std::size_t end;
+  std::int64_t count;
+};
+
+/// Walks at most `limit` characters from `from` on. Starts ICU only where a character isn't ASCII by itself,
+/// and always at the start of a character, so that nothing in front is looked at again.
+Run walk(std::string_view text, std::size_t from, std::int64_t limit) {
+  // ICU counts its offsets in 32 bits.
+  constexpr std::size_t window = std::size_t{1} << 30;
+  std::size_t at = std::min(from, text.size());
+  std::int64_t count = 0;
+  while (at < text.size() && count < limit) {
+    if (standsAlone(text, at)) {
+      at += lengthOfASCIICharacter(text, at);
+      ++count;
+      continue;
+    }
+    const auto base = at;
+    const auto end = std::min(text.size(), base + window);
+    auto& characters = CharacterWalk::ofThisThread();
+    characters.start(text.substr(base, window));
+    do {
+      at = base + characters.next();
+      ++count;
+    } while (at < end && count < limit && !standsAlone(text, at));
+  }
+  return {at, count};
+}
+
+std::optional<std::u16string> canonicalDecomposition(std::string_view text) {
+  const auto source = utf16FromUTF8(text);
+  if (!source || source->size() > std::numeric_limits<std::int32_t>::max() / 4) return std::nullopt;
+  UErrorCode status = U_ZERO_ERROR;
+  const auto* normalizer = unorm2_getNFDInstance(&status);
+  const auto length = static_cast<std::int32_t>(source->size());
+  // No character decomposes into more than four units for each of its own.
+  std::u16string result(source->size() * 4, u'\0');
+  const auto size = unorm2_normalize(normalizer, source->data(), length, result.data(),
+                                     static_cast<std::int32_t>(result.size()), &status);
+  if (U_FAILURE(status)) return std::nullopt;
+  result.resize(static_cast<std::size_t>(size));
+  return result;
+}
+
+}  // namespace
+
+std::optional<std::u16string> utf16FromUTF8(std::string_view text) {
+  // Exact for well-formed text, and enough for what stands in front of the first ill-formed byte.
+  std::size_t units = 0;
+  for (const char byte : text) units += ((byte & 0xC0) != 0x80) + (static_cast<unsigned char>(byte) >= 0xF0);
+  std::u16string result(units, u'\0');
+  char16_t* out = result.data();
+  for (std::size_t i = 0; i < text.size();) {
+    if (isASCII(text[i])) {
+      const auto run = asciiRunLength(text, i);
+      out = std::copy_n(text.data() + i, run, out);
+      i += run;
+      continue;
+    }
+    const auto scalar = decodeUTF8(text.substr(i));
+    if (!scalar.length) return std::nullopt;
+    if (scalar.value < 0x10000) {
+      *out++ = static_cast<char16_t>(scalar.value);
+    } else {
+      *out++ = static_cast<char16_t>(0xD7C0 + (scalar.value >> 10));
+      *out++ = static_cast<char16_t>(0xDC00 | (scalar.value & 0x3FF));
+    }
+    i += scalar.length;
+  }
+  return result;
+}
+
+std::optional<std::string> utf8FromUTF16(std::u16string_view text) { return utf8(text, Unpaired::fail); }
+
+std::string utf8FromUTF16Lossy(std::u16string_view text) { return *utf8(text, Unpaired::replace); }
+
+bool isValidUTF8(std::string_view text) {
+  for (std::size_t i = asciiRunLength(text, 0); i < text.size(); i += asciiRunLength(text, i)) {
+    const auto scalar = decodeUTF8(text.substr(i));
+    if (!scalar.length) return false;
+    i += scalar.length;
+  }
+  return true;
+}
+
+std::int64_t graphemeCount(std::string_view text) {
+  if (isAllASCII(text) && text.find('\r') == std::string_view::npos)
+    return static_cast<std::int64_t>(text.size());
+  return walk(text, 0, std::numeric_limits<std::int64_t>::max()).count;
+}
+
+std::size_t graphemeRunEnd(std::string_view text, std::size_t from, std::int64_t count) {
+  return walk(text, from, count).end;
+}
+
+bool canonicallyEquivalent(std::string_view a, std::string_view b) {
+  if (a == b) return true;
+  // ASCII decomposes into itself; but U+212A decomposes into "K", so one ASCII side doesn't decide.
+  if (isAllASCII(a) && isAllASCII(b)) return false;
+  const auto first = canonicalDecomposition(a);
+  const auto second = canonicalDecomposition(b);
+  return first && first == second;
+}
+
+std::optional<std::int64_t> parseDecimalInteger(std::string_view text) {
+  if (text.starts_with('+')) {
+    text.remove_prefix(1);
+    if (text.starts_with('-')) return std::nullopt;
+  }
+  std::int64_t value = 0;
+  const auto result = std::from_chars(text.data(), text.data() + text.size(), value);
+  if (result.ec != std::errc() || result.ptr != text.data() + text.size()) return std::nullopt;
+  return value;
+}
+
+std::vector<std::string_view> split(std::string_view text, char separator) {
+  std::vector<std::string_view> pieces;
+  while (true) {
+    const auto end = text.find(separator);
+    pieces.push_back(text.substr(0, end));
+    if (end == std::string_view::npos) return pieces;
+    text.remove_prefix(end + 1);
+  }
+}
+
+std::string quoted(std::string_view text) {
+  constexpr char digits[] = "0123456789ABCDEF";
+  std::string result = "\"";
+  result.reserve(text.size() + 2);
+  for (const char c : text) {
+    const auto byte = static_cast<unsigned char>(c);
+    if (c == '"' || c == '\\') {
+      result += {'\\', c};
+    } else if (c == '\n') {
+      result += "\\n";
+    } else if (c == '\r') {
+      result += "\\r";
+    } else if (c == '\t') {
+      result += "\\t";
+    } else if (byte < 0x20 || byte == 0x7F) {
+      result += {'\\', 'u', '{', digits[byte >> 4], digits[byte & 0xF], '}'};
+    } else {
+      result += c;
+    }
+  }
+  return result += '"';
+}
+
+std::string optionalDescription(const std::optional<std::string>& text) {
+  return text ? "Optional(\"" + *text + "\")" : "nil";
+}
+
+}  // namespace MarletFoundation
