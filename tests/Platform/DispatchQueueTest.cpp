@@ -172,7 +172,7 @@ TEST(DispatchQueue, PoolThreadsThatAllWaitForQueuesDontStarveTheirBlocks) {
   std::atomic<int> right{0};
   Event done;
   for (int i = 0; i < jobs; ++i) {
-    DispatchQueue::global().async([&] {
+    DispatchQueue::global().async([&, i] {
       const DispatchQueue queue("own", i % 2 ? Kind::serial : Kind::concurrent);
       int value = 0;
       for (int k = 0; k < 3; ++k) queue.asyncBarrier([&] { ++value; });
