@@ -10,9 +10,8 @@
 namespace MarletFoundation {
 
 /// One case of an error type: its name and, where users see it, its words. In the words, `{}` stands for the
-/// case's string,
-/// `{filename}` for its file name, `{error}` for the localized description of the error it carries,
-/// `{suggestion}` for that error's recovery suggestion in the debug form of an optional, and
+/// case's string, `{filename}` for its file name, `{error}` for the localized description of the error it
+/// carries, `{suggestion}` for that error's recovery suggestion in the debug form of an optional, and
 /// `{suggestion|WORDS}` for that suggestion or, if there is none, WORDS.
 struct ErrorRow {
   std::string_view name;

@@ -53,8 +53,8 @@ class MARLET_EXPORT FileWrapper {
 
   /// Writes the tree to `url`, all of it or nothing: it is built in a sibling of `url`, flushed, and takes
   /// the place of what was there. Throws an `ErrorObject` of the POSIX domain, also for a child whose name is
-  /// empty, ".",
-  /// ".." or holds a slash or NUL (EINVAL), and for a node that couldn't be read or is of no writable kind.
+  /// empty, ".", ".." or holds a slash or NUL (EINVAL), and for a node that couldn't be read or is of no
+  /// writable kind.
   void write(const URL& url) const;
 
  private:

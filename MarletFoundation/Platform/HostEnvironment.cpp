@@ -36,8 +36,8 @@ bool isDirectory(const URL& url) {
   }
 }
 
-/// The resources of an installed library lie in the prefix that it was installed to, one or, where the
-/// system has a directory for each architecture, two directories up.
+/// The resources of an installed library lie in the prefix that it was installed to, one or, where the system
+/// has a directory for each architecture, two directories up.
 std::optional<URL> installedResources() {
   Dl_info library{};
   if (!::dladdr(reinterpret_cast<const void*>(&installedResources), &library) || !library.dli_fname) {

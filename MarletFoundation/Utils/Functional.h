@@ -19,11 +19,9 @@ namespace MarletFoundation {
 /// `f` for callers that know that it won't throw: an error is fatal.
 template <class F>
 auto fatalOnError(F f) {
-  return [f = std::move(f)]<class... Arguments>(Arguments &&
-                                                ... arguments) -> std::invoke_result_t<const F&, Arguments...>
-  requires std::invocable<const F&, Arguments...> {
+  return [f = std::move(f)](auto&&... arguments) -> std::invoke_result_t<const F&, decltype(arguments)...> {
     try {
-      return std::invoke(f, std::forward<Arguments>(arguments)...);
+      return std::invoke(f, std::forward<decltype(arguments)>(arguments)...);
     } catch (...) {
       fatalError("failure in ^!: " + currentError()->description());
     }
