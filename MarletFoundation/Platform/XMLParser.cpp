@@ -14,13 +14,11 @@ namespace MarletFoundation {
 namespace {
 
 constexpr int depthLimit = 256;
+/// Bytes of all different names together. The reader's table of names becomes slow with more.
+constexpr std::size_t nameLimit = 1 << 20;
 
-/// Also frees the document that the reader makes in passing when it sees an entity declared.
 struct ContextCloser {
-  void operator()(xmlParserCtxt* context) const {
-    if (context->myDoc) xmlFreeDoc(context->myDoc);
-    xmlFreeParserCtxt(context);
-  }
+  void operator()(xmlParserCtxt* context) const { xmlFreeParserCtxt(context); }
 };
 using Context = std::unique_ptr<xmlParserCtxt, ContextCloser>;
 
@@ -75,7 +73,7 @@ struct XMLParserEvents {
 
   template <class Call>
   void tellDelegate(const Call& call) {
-    if (!parser.delegate || parser.aborted_ || thrown) return;
+    if (!parser.delegate || parser.error_) return;
     try {
       call(*parser.delegate);
     } catch (...) {
@@ -112,12 +110,11 @@ struct XMLParserEvents {
     });
   }
 
-  static void entityDeclaration(void* self, const xmlChar*, int, const xmlChar*, const xmlChar*, xmlChar*) {
-    of(self).stop(XML_ERR_ENTITY_PROCESSING, "The document declares an entity.");
-  }
-  static void unparsedEntityDeclaration(void* self, const xmlChar*, const xmlChar*, const xmlChar*,
-                                        const xmlChar*) {
-    entityDeclaration(self, nullptr, 0, nullptr, nullptr, nullptr);
+  /// Called behind the name of the document type, in front of what is declared within the document.
+  static void documentType(void* self, const xmlChar*, const xmlChar*, const xmlChar*) {
+    auto& events = of(self);
+    if (*events.context->input->cur == '[')
+      events.stop(XML_ERR_ENTITY_PROCESSING, "The document declares a document type of its own.");
   }
   /// Asked for all but the five entities of XML itself. Beside a document type the reader would only warn.
   static xmlEntity* entity(void* self, const xmlChar* name) {
@@ -130,6 +127,7 @@ struct XMLParserEvents {
     if (error->level < XML_ERR_FATAL) return;
     std::string message = error->message ? error->message : "The document isn't well-formed.";
     message.erase(message.find_last_not_of('\n') + 1);
+    if (error->code == XML_ERR_NO_MEMORY) message = "The document's names take more than a megabyte.";
     events.fail(error->code, std::move(message), error->line);
     // The reader goes on to report every further error. Its buffers are in use, so it can't be stopped as
     // from an event, only made to leave its loops.
@@ -145,8 +143,7 @@ struct XMLParserEvents {
     sax.endElement = endElement;
     sax.characters = characters;
     sax.ignorableWhitespace = characters;
-    sax.entityDecl = entityDeclaration;
-    sax.unparsedEntityDecl = unparsedEntityDeclaration;
+    sax.internalSubset = documentType;
     sax.getEntity = entity;
     return sax;
   }
@@ -162,7 +159,9 @@ struct XMLParserEvents {
     context->userData = this;
     const ErrorRoute route(this, error);
     // Only the entities of XML itself are ever replaced, since no other comes to exist.
-    xmlCtxtUseOptions(context, XML_PARSE_NONET | XML_PARSE_NOENT | XML_PARSE_IGNORE_ENC);
+    // The reader's limits on size give way to ours, as theirs depend on where its buffer happens to end.
+    xmlCtxtUseOptions(context, XML_PARSE_NONET | XML_PARSE_NOENT | XML_PARSE_IGNORE_ENC | XML_PARSE_HUGE);
+    xmlDictSetLimit(context->dict, nameLimit);
     xmlParseDocument(context);
     if (!context->wellFormed) fail(XML_ERR_DOCUMENT_END, "The document isn't well-formed.", 1);
     context = nullptr;
@@ -179,7 +178,7 @@ bool XMLParser::parse() {
   const auto utf8 = document.utf8.view();
   XMLParserEvents events(*this);
   events.tellDelegate([&](Delegate& d) { d.didStartDocument(*this); });
-  if (!aborted_) events.read(utf8);
+  if (!error_) events.read(utf8);
   if (document.refusal && !aborted_ && (!error_ || line(*error_) >= lastLine(utf8))) {
     // Where the text was cut, the cut's reason tells more than that the text ends too early.
     error_.reset();

@@ -16,9 +16,11 @@ inline constexpr std::string_view XMLParserErrorDomain = "XMLParser";
 /// A streaming XML parser: calls its delegate as it goes. It opens no network connection and no file. Names
 /// are taken as they stand, prefix included, and attribute values with their references replaced.
 ///
-/// What is refused, besides ill-formed XML: a document that declares or uses an entity of its own, nests more
-/// than 256 elements, has more than 256 attributes on one, or declares an encoding other than UTF-8, UTF-16,
-/// ISO-8859-1, US-ASCII or windows-1252. The delegate sees what stands in front of the refused place.
+/// What is refused, besides ill-formed XML: a document that declares anything of a document type within
+/// itself (entities above all) or uses an entity that isn't XML's own, nests more than 256 elements, has more
+/// than 256 attributes on one, has different names of more than a megabyte together, or declares an encoding
+/// other than UTF-8, UTF-16, ISO-8859-1, US-ASCII or windows-1252. The delegate sees what stands in front of
+/// the refused place.
 class MARLET_EXPORT XMLParser {
  public:
   using Attributes = std::map<std::string, std::string, std::less<>>;
