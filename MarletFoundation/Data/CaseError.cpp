@@ -8,6 +8,7 @@ namespace {
 std::string placeholderValue(std::string_view name, const ErrorPayload& payload) {
   if (name.empty()) return payload.string.value_or("");
   if (name == "filename") return payload.filename.value_or("");
+  if (!payload.error) return {};
   const ErrorObject error(*payload.error);
   if (name == "error") return error.localizedDescription();
   const auto suggestion = error.localizedRecoverySuggestion();
@@ -32,7 +33,7 @@ std::string expanded(std::string_view words, const ErrorPayload& payload) {
 
 std::string errorDescription(const ErrorRow& row, const ErrorPayload& payload) {
   const std::string name(row.name);
-  if (payload.filename) {
+  if (payload.filename && payload.error) {
     return name + "(filename: " + quoted(*payload.filename) + ", error: " + payload.error->description() +
            ")";
   }

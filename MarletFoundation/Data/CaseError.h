@@ -10,9 +10,8 @@
 namespace MarletFoundation {
 
 /// One case of an error type: its name and, where users see it, its words. In the words, `{}` stands for the
-/// case's string,
-/// `{filename}` for its file name, `{error}` for the localized description of the error it carries,
-/// `{suggestion}` for that error's recovery suggestion in the debug form of an optional, and
+/// case's string, `{filename}` for its file name, `{error}` for the localized description of the error it
+/// carries, `{suggestion}` for that error's recovery suggestion in the debug form of an optional, and
 /// `{suggestion|WORDS}` for that suggestion or, if there is none, WORDS.
 struct ErrorRow {
   std::string_view name;
@@ -66,6 +65,7 @@ class MARLET_EXPORT BasicCaseError : public Base, public ErrorPayload {
   std::string description() const override { return errorDescription(row(), *this); }
   ErrorPointer underlyingError() const override { return error; }
   ErrorPointer copy() const override { return std::make_shared<Derived>(static_cast<const Derived&>(*this)); }
+  [[noreturn]] void raise() const override { throw static_cast<const Derived&>(*this); }
   // The names are literals, so each ends in NUL.
   const char* what() const noexcept override { return row().name.data(); }
 

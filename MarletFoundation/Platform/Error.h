@@ -14,8 +14,8 @@ class Error;
 /// An error that another one carries. Immutable and shared; null stands for none.
 using ErrorPointer = std::shared_ptr<const Error>;
 
-/// What every thrown failure of the library answers: a domain and a code that identify it, and a printed
-/// form for logs. The words for a user are asked of its error object (`ErrorObject`).
+/// What every thrown failure of the library answers: a domain and a code that identify it, and a printed form
+/// for logs. The words for a user are asked of its error object (`ErrorObject`).
 class MARLET_EXPORT Error : public std::exception {
  public:
   /// The error's type, stable between releases.
@@ -29,6 +29,8 @@ class MARLET_EXPORT Error : public std::exception {
   virtual ErrorPointer underlyingError() const { return nullptr; }
   /// A copy of the whole error, with its own type.
   virtual ErrorPointer copy() const = 0;
+  /// Throws a copy of the whole error, with its own type.
+  [[noreturn]] virtual void raise() const = 0;
 };
 
 }  // namespace MarletFoundation

@@ -26,6 +26,11 @@ std::optional<std::string> text(const std::optional<UserInfoValue>& value) {
   return std::nullopt;
 }
 
+UserInfo::const_iterator findKey(const UserInfo& info, std::string_view key) {
+  return std::find_if(info.begin(), info.end(),
+                      [&](const auto& entry) { return canonicallyEquivalent(entry.first, key); });
+}
+
 bool equal(const UserInfoValue& a, const UserInfoValue& b) {
   const auto* first = std::get_if<ErrorPointer>(&a);
   const auto* second = std::get_if<ErrorPointer>(&b);
@@ -73,8 +78,7 @@ ErrorPointer ErrorObject::underlyingError() const {
 }
 
 std::optional<UserInfoValue> ErrorObject::value(std::string_view key) const {
-  const auto own = std::find_if(userInfo_.begin(), userInfo_.end(),
-                                [&](const auto& entry) { return canonicallyEquivalent(entry.first, key); });
+  const auto own = findKey(userInfo_, key);
   if (own != userInfo_.end()) return own->second;
   const auto provider = valueProvider(domain_);
   return provider ? provider(*this, key) : std::nullopt;
@@ -94,10 +98,11 @@ std::optional<std::string> ErrorObject::localizedRecoverySuggestion() const {
 }
 
 bool ErrorObject::operator==(const ErrorObject& other) const {
-  return domain_ == other.domain_ && code_ == other.code_ &&
-         std::equal(
-             userInfo_.begin(), userInfo_.end(), other.userInfo_.begin(), other.userInfo_.end(),
-             [](const auto& a, const auto& b) { return a.first == b.first && equal(a.second, b.second); });
+  return domain_ == other.domain_ && code_ == other.code_ && userInfo_.size() == other.userInfo_.size() &&
+         std::all_of(userInfo_.begin(), userInfo_.end(), [&](const auto& entry) {
+           const auto same = findKey(other.userInfo_, entry.first);
+           return same != other.userInfo_.end() && equal(entry.second, same->second);
+         });
 }
 
 void ErrorObject::setValueProvider(std::string domain, ValueProvider provider) {

@@ -51,6 +51,7 @@ class MARLET_EXPORT ErrorObject final : public Error {
   std::string description() const override;
   ErrorPointer underlyingError() const override;
   ErrorPointer copy() const override { return std::make_shared<ErrorObject>(*this); }
+  [[noreturn]] void raise() const override { throw *this; }
   const char* what() const noexcept override { return domain_.c_str(); }
 
   const UserInfo& userInfo() const { return userInfo_; }

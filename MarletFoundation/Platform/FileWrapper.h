@@ -11,6 +11,8 @@
 
 namespace MarletFoundation {
 
+class FileNode;
+
 /// A node of a directory tree, in memory or read from disk as it is looked at. Copies share the node.
 ///
 /// A tree from disk is lazy: a child asked for by name is opened by name, beneath its parent's descriptor, a
@@ -51,14 +53,13 @@ class MARLET_EXPORT FileWrapper {
 
   /// Writes the tree to `url`, all of it or nothing: it is built in a sibling of `url`, flushed, and takes
   /// the place of what was there. Throws an `ErrorObject` of the POSIX domain, also for a child whose name is
-  /// empty, ".",
-  /// ".." or holds a slash or NUL (EINVAL), and for a node that couldn't be read or is of no writable kind.
+  /// empty, ".", ".." or holds a slash or NUL (EINVAL), and for a node that couldn't be read or is of no
+  /// writable kind.
   void write(const URL& url) const;
 
  private:
-  struct Node;
-  explicit FileWrapper(std::shared_ptr<Node> node) : node_(std::move(node)) {}
-  std::shared_ptr<Node> node_;
+  explicit FileWrapper(std::shared_ptr<FileNode> node) : node_(std::move(node)) {}
+  std::shared_ptr<FileNode> node_;
 };
 
 }  // namespace MarletFoundation

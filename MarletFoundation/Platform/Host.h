@@ -20,7 +20,7 @@ MARLET_EXPORT std::optional<URL> libraryResourcesURL();
 /// none, whatever the system calls it.
 MARLET_EXPORT std::string currentThreadName();
 MARLET_EXPORT void setCurrentThreadName(std::string name);
-/// Whether this is the thread that loaded the library, or the one last named by `becomeMainThread`.
+/// Whether this is the thread in which the process began.
 MARLET_EXPORT bool isMainThread();
 
 }  // namespace MarletFoundation

@@ -32,8 +32,10 @@ struct MARLET_EXPORT HostEnvironment {
   std::function<void(std::string_view line)> diagnostics;
 
   static HostEnvironment defaults();
-  /// The environment in force. It may be read from any thread.
+  /// The environment in force, the defaults unless a host set another. May be called from any thread; the
+  /// reference stays valid for the life of the process, also when another environment is set.
   static const HostEnvironment& current();
+  /// Any thread. Every environment ever set is kept, so this is for start-up and for tests, not for traffic.
   static void setCurrent(HostEnvironment environment);
 };
 

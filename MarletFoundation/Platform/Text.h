@@ -25,8 +25,8 @@ MARLET_EXPORT std::string utf8FromUTF16Lossy(std::u16string_view text);
 /// Number of user-perceived characters (extended grapheme clusters). ASCII is counted without ICU.
 MARLET_EXPORT std::int64_t graphemeCount(std::string_view text);
 
-/// Byte offset just behind the first `count` characters from byte offset `from` on; the end of the text
-/// when there are fewer. Linear in the bytes passed over when called run after run.
+/// Byte offset just behind the first `count` characters from byte offset `from` on; the end of the text when
+/// there are fewer. Linear in the bytes passed over when called run after run.
 MARLET_EXPORT std::size_t graphemeRunEnd(std::string_view text, std::size_t from, std::int64_t count);
 
 /// Equality by Unicode canonical equivalence.

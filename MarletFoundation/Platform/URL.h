@@ -25,7 +25,8 @@ class MARLET_EXPORT URL {
   /// reference. A relative reference is kept beside its base; a "file:" URL becomes a file URL.
   static std::optional<URL> parse(std::string_view string, const URL* base = nullptr);
 
-  bool isFileURL() const { return isFile_; }
+  /// Whether the URL, resolved against its base, is one of a file.
+  bool isFileURL() const;
   /// The scheme of the string, or of the base for a relative reference.
   std::optional<std::string> scheme() const;
   /// The decoded path, without a slash at its end but for the root; empty when the URL has none.

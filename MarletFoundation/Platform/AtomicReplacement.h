@@ -1,0 +1,67 @@
+#pragma once
+
+#include <memory>
+#include <optional>
+#include <string>
+
+#include "MarletFoundation/Platform/Descriptor.h"
+#include "MarletFoundation/Platform/DiskTree.h"
+
+namespace MarletFoundation {
+
+/// Builds a file or directory beside the one whose place it is to take, and changes the two at once. A crash
+/// at any instruction leaves the old item or the new one, and what it left of the other the next replacement
+/// of that item clears away. Failures throw.
+class AtomicReplacement {
+ public:
+  /// Takes the place of the item at `path`, or of what it links to in the end; it need not exist. Only files
+  /// and directories are replaced (EINVAL).
+  explicit AtomicReplacement(std::string path);
+  /// Removes what was built but not committed.
+  ~AtomicReplacement();
+  AtomicReplacement(const AtomicReplacement&) = delete;
+  AtomicReplacement& operator=(const AtomicReplacement&) = delete;
+
+  /// What the path named at the start.
+  const std::optional<struct stat>& replaced() const { return replaced_; }
+  bool replacesFile() const { return replaced_ && S_ISREG(replaced_->st_mode); }
+  bool replacesDirectory() const { return replaced_ && S_ISDIR(replaced_->st_mode); }
+  /// The replaced item, opened for reading.
+  Descriptor openReplaced() const;
+
+  /// Starts a file, to be filled through the descriptor, which stays this object's. It has the mode and the
+  /// extended attributes of a replaced file.
+  int makeFile();
+  /// Starts a directory.
+  std::shared_ptr<DiskDirectory> makeDirectory(mode_t mode);
+  /// Flushes what was started, puts it in place, flushes the directory, and removes the old item.
+  void commit();
+
+  /// For an item that a replacement in two steps was cut off in between, where the old one lies now. Null
+  /// unless there is one.
+  static std::optional<std::string> displacedPath(const std::string& path);
+
+ private:
+  void findDestination();
+  void clearLeftovers();
+  void start(const std::string& name, Descriptor descriptor);
+  void putInPlace();
+  void replaceInTwoSteps();
+
+  std::string path_;
+  Descriptor parent_;
+  std::string name_;
+  std::string prefix_;  // of the names of what is built for this name
+  std::optional<struct stat> replaced_;
+  std::string staging_;  // the name of what is being built, or of the old item once it is replaced
+  Descriptor built_;
+};
+
+/// Gives `to` the owner, mode and extended attributes of `from`, as far as the file system and our rights go;
+/// a mode or an attribute of a user's that can't be kept is an error.
+int copyAttributes(int from, int to);
+
+/// Removes a file or a whole directory, of any depth; what can't be removed stays.
+void removeTree(int parent, const std::string& name);
+
+}  // namespace MarletFoundation

@@ -1,0 +1,189 @@
+#include "MarletFoundation/Platform/DiskTree.h"
+
+#include <dirent.h>
+#include <unistd.h>
+
+#include <algorithm>
+
+namespace MarletFoundation {
+
+/// The open descriptors of a tree below its root: those of directories, which may be needed again, and those
+/// that wait to be closed. They are closed in runs of consecutive numbers, one system call a run, since a
+/// book of many pages would otherwise spend a third of its opening on closing.
+class DiskTree {
+ public:
+  static constexpr std::size_t Capacity = 64;
+  /// How many ancestors of the directory in use stay open when the others are closed.
+  static constexpr int KeptAncestors = 12;
+
+  DiskTree() { open_.reserve(Capacity); }
+  ~DiskTree() { closeAllBut(nullptr); }
+
+  /// Takes over an open descriptor; `owner` is its directory or null. The descriptors of `inUse` and of its
+  /// nearest ancestors stay open.
+  void adopt(int descriptor, DiskDirectory* owner, const DiskDirectory* inUse) {
+    if (open_.size() == Capacity) closeAllBut(inUse);
+    open_.push_back({descriptor, owner});
+  }
+
+  void disown(const DiskDirectory* owner) {
+    const auto found =
+        std::find_if(open_.rbegin(), open_.rend(), [&](const Entry& entry) { return entry.owner == owner; });
+    if (found != open_.rend()) found->owner = nullptr;
+  }
+
+  void closeAllBut(const DiskDirectory* inUse) {
+    std::vector<const DiskDirectory*> kept;
+    for (; inUse && kept.size() <= KeptAncestors; inUse = inUse->parent_.get()) kept.push_back(inUse);
+    const auto closing = std::partition(open_.begin(), open_.end(), [&](const Entry& entry) {
+      return entry.owner && std::find(kept.begin(), kept.end(), entry.owner) != kept.end();
+    });
+    std::sort(closing, open_.end(),
+              [](const Entry& a, const Entry& b) { return a.descriptor < b.descriptor; });
+    for (auto run = closing; run != open_.end();) {
+      auto end = run;
+      int next = run->descriptor;
+      for (; end != open_.end() && end->descriptor == next; ++end, ++next) {
+        if (end->owner) end->owner->descriptor_ = -1;
+      }
+      closeRun(run->descriptor, next - 1);
+      run = end;
+    }
+    open_.erase(closing, open_.end());
+  }
+
+  /// Opens beneath `directory`'s descriptor. Short of descriptors, this tree gives up its own and tries
+  /// again.
+  int openAt(const DiskDirectory* directory, int directoryDescriptor, const char* name, int flags) {
+    const auto attempt = [&] { return retrying([&] { return ::openat(directoryDescriptor, name, flags); }); };
+    const int opened = attempt();
+    if (opened >= 0 || (errno != EMFILE && errno != ENFILE)) return opened;
+    closeAllBut(directory);
+    return attempt();
+  }
+
+  Descriptor root;
+
+ private:
+  struct Entry {
+    int descriptor;
+    DiskDirectory* owner;
+  };
+
+  static void closeRun(int first, int last) {
+    if (first != last && ::close_range(static_cast<unsigned>(first), static_cast<unsigned>(last), 0) == 0)
+      return;
+    for (int number = first; number <= last; ++number) ::close(number);
+  }
+
+  std::vector<Entry> open_;
+};
+
+DiskDirectory::DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string name)
+    : parent_(std::move(parent)), name_(std::move(name)), tree_(parent_ ? parent_->tree_ : nullptr) {}
+
+DiskDirectory::~DiskDirectory() {
+  if (descriptor_ >= 0) tree_->disown(this);
+  // A long chain of ancestors that nothing else holds goes link by link, not in a recursion.
+  auto ancestor = std::move(parent_);
+  while (ancestor && ancestor.use_count() == 1) ancestor = std::shared_ptr(std::move(ancestor->parent_));
+}
+
+std::shared_ptr<DiskDirectory> DiskDirectory::root(Descriptor descriptor) {
+  auto directory = std::make_shared<DiskDirectory>(Key(), nullptr, std::string());
+  directory->ownTree_ = std::make_unique<DiskTree>();
+  directory->tree_ = directory->ownTree_.get();
+  directory->tree_->root = std::move(descriptor);
+  return directory;
+}
+
+std::shared_ptr<DiskDirectory> DiskDirectory::child(std::shared_ptr<DiskDirectory> parent, std::string name) {
+  return std::make_shared<DiskDirectory>(Key(), std::move(parent), std::move(name));
+}
+
+std::shared_ptr<DiskDirectory> DiskDirectory::openChild(const std::shared_ptr<DiskDirectory>& parent,
+                                                        std::string name) {
+  const int parentDescriptor = parent->descriptor();
+  if (parentDescriptor < 0) return nullptr;
+  const int opened = parent->tree_->openAt(parent.get(), parentDescriptor, name.c_str(), DirectoryFlags);
+  if (opened < 0) return nullptr;
+  auto directory = child(parent, std::move(name));
+  directory->tree_->adopt(opened, directory.get(), parent.get());
+  directory->descriptor_ = opened;
+  return directory;
+}
+
+int DiskDirectory::descriptor() {
+  if (!parent_) return tree_->root.get();
+  if (descriptor_ >= 0) return descriptor_;
+  std::vector<DiskDirectory*> closed;
+  DiskDirectory* open = this;
+  for (; open->parent_ && open->descriptor_ < 0; open = open->parent_.get()) closed.push_back(open);
+  int number = open->parent_ ? open->descriptor_ : tree_->root.get();
+  for (auto next = closed.rbegin(); next != closed.rend(); ++next) {
+    number = tree_->openAt(open, number, (*next)->name_.c_str(), DirectoryFlags);
+    if (number < 0) return -1;
+    tree_->adopt(number, *next, open);
+    (*next)->descriptor_ = number;
+    open = *next;
+  }
+  return number;
+}
+
+int DiskDirectory::status(const char* name, struct stat& status) {
+  const int number = descriptor();
+  return number < 0 ? -1 : retrying([&] { return ::fstatat(number, name, &status, AT_SYMLINK_NOFOLLOW); });
+}
+
+Descriptor DiskDirectory::openFile(const char* name) {
+  const int number = descriptor();
+  if (number < 0) return Descriptor();
+  return Descriptor(tree_->openAt(this, number, name, ReadingFlags | O_NOFOLLOW));
+}
+
+void DiskDirectory::closeLater(Descriptor descriptor) { tree_->adopt(descriptor.release(), nullptr, this); }
+
+std::optional<std::vector<DiskDirectory::Entry>> DiskDirectory::entries() {
+  const int number = descriptor();
+  if (number < 0) return std::nullopt;
+  // A description of its own: the listing must begin at the start, and closes with the stream.
+  const int listed = tree_->openAt(this, number, ".", DirectoryFlags);
+  if (listed < 0) return std::nullopt;
+  const std::unique_ptr<DIR, int (*)(DIR*)> stream(::fdopendir(listed), &::closedir);
+  if (!stream) {
+    ::close(listed);
+    return std::nullopt;
+  }
+  std::vector<Entry> result;
+  while (true) {
+    errno = 0;
+    const dirent* entry = ::readdir(stream.get());
+    if (!entry) break;
+    if (isFileName(entry->d_name)) result.push_back({entry->d_name, entry->d_type});
+  }
+  if (errno != 0) return std::nullopt;
+  return result;
+}
+
+void DiskDirectory::setRoot(Descriptor descriptor) {
+  tree_->closeAllBut(nullptr);
+  tree_->root = std::move(descriptor);
+}
+
+DiskDirectory& DiskDirectory::rootDirectory() {
+  auto* directory = this;
+  while (directory->parent_) directory = directory->parent_.get();
+  return *directory;
+}
+
+std::string DiskDirectory::path() const {
+  std::vector<const DiskDirectory*> chain;
+  for (const auto* directory = this; directory->parent_; directory = directory->parent_.get()) {
+    chain.push_back(directory);
+  }
+  std::string path;
+  for (auto next = chain.rbegin(); next != chain.rend(); ++next) path.append((*next)->name_).append(1, '/');
+  return path;
+}
+
+}  // namespace MarletFoundation

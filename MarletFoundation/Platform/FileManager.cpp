@@ -1,0 +1,91 @@
+#include "MarletFoundation/Platform/FileManager.h"
+
+#include <limits.h>
+#include <stdlib.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <memory>
+
+#include "MarletFoundation/Platform/AtomicReplacement.h"
+#include "MarletFoundation/Platform/Descriptor.h"
+#include "MarletFoundation/Platform/DiskTree.h"
+#include "MarletFoundation/Platform/HostEnvironment.h"
+
+namespace MarletFoundation::FileManager {
+namespace {
+
+struct stat statusOf(const std::string& path) {
+  struct stat status;
+  if (retrying([&] { return ::stat(path.c_str(), &status); }) != 0) throwPosix(errno, path);
+  return status;
+}
+
+}  // namespace
+
+std::optional<URL> documentsDirectory() { return HostEnvironment::current().documentsDirectory; }
+
+Relationship relationship(const URL& directory, const URL& item) {
+  const auto wanted = statusOf(systemPath(directory));
+  const auto itemPath = systemPath(item);
+  const std::unique_ptr<char, decltype(&std::free)> real(::realpath(itemPath.c_str(), nullptr), &std::free);
+  if (!real) throwPosix(errno, itemPath);
+  auto relationship = Relationship::same;
+  for (std::string path = real.get(); !path.empty(); path.resize(path == "/" ? 0 : path.rfind('/'))) {
+    const auto status = statusOf(path);
+    if (status.st_dev == wanted.st_dev && status.st_ino == wanted.st_ino) return relationship;
+    relationship = Relationship::contains;
+  }
+  const auto root = statusOf("/");
+  const bool isRoot = root.st_dev == wanted.st_dev && root.st_ino == wanted.st_ino;
+  return isRoot ? relationship : Relationship::other;
+}
+
+bool fileExists(const URL& url) {
+  const auto path = url.path();
+  struct stat status;
+  return url.isFileURL() && !path.empty() && path.find('\0') == std::string::npos &&
+         retrying([&] { return ::stat(path.c_str(), &status); }) == 0;
+}
+
+bool isDirectory(const URL& url) { return S_ISDIR(statusOf(systemPath(url)).st_mode); }
+
+bool resourceIsReachable(const URL& url) {
+  statusOf(systemPath(url));
+  return true;
+}
+
+std::vector<std::string> contentsOfDirectory(const URL& url, bool skipHidden) {
+  const auto path = systemPath(url);
+  Descriptor root(retrying([&] { return ::open(path.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC); }));
+  if (!root) throwPosix(errno, path);
+  const auto entries = DiskDirectory::root(std::move(root))->entries();
+  if (!entries) throwPosix(errno, path);
+  std::vector<std::string> names;
+  for (const auto& entry : *entries) {
+    if (!skipHidden || !entry.name.starts_with('.')) names.push_back(entry.name);
+  }
+  std::sort(names.begin(), names.end());
+  return names;
+}
+
+Data readFile(const URL& url) {
+  const auto path = systemPath(url);
+  const auto status = statusOf(path);
+  if (!S_ISREG(status.st_mode)) throwPosix(S_ISDIR(status.st_mode) ? EISDIR : EINVAL, path);
+  const Descriptor file(retrying([&] { return ::open(path.c_str(), ReadingFlags); }));
+  if (!file) throwPosix(errno, path);
+  auto contents = readToEnd(file.get(), status.st_size);
+  if (contents.error != 0) throwPosix(contents.error, path);
+  return std::move(contents.data);
+}
+
+void writeFileAtomically(const URL& url, const Data& contents) {
+  AtomicReplacement replacement(systemPath(url));
+  if (replacement.replacesDirectory()) throwPosix(EISDIR, url.path());
+  if (writeAll(replacement.makeFile(), contents.view()) != 0) throwPosix(errno, url.path());
+  replacement.commit();
+}
+
+}  // namespace MarletFoundation::FileManager

@@ -1,0 +1,62 @@
+#include "MarletFoundation/Platform/FileWrapper.h"
+
+#include "MarletFoundation/Platform/FatalError.h"
+#include "MarletFoundation/Platform/FileNode.h"
+
+namespace MarletFoundation {
+
+FileWrapper::FileWrapper(const URL& url) : node_(FileNode::atPath(systemPath(url))) {
+  node_->setPreferredName(url.lastPathComponent());
+}
+
+FileWrapper FileWrapper::regularFile(Data contents) {
+  return FileWrapper(FileNode::inMemory(std::move(contents)));
+}
+
+FileWrapper FileWrapper::directory(Children children) {
+  auto node = FileNode::directoryInMemory();
+  for (auto& [name, child] : children) {
+    if (!child.preferredFilename()) child.setPreferredFilename(name);
+    node->setChild(name, child.node_);
+  }
+  return FileWrapper(std::move(node));
+}
+
+bool FileWrapper::isDirectory() const { return node_->kind() == FileNode::Kind::directory; }
+
+bool FileWrapper::isRegularFile() const { return node_->kind() == FileNode::Kind::regularFile; }
+
+std::optional<Data> FileWrapper::regularFileContents() const { return node_->contents(); }
+
+bool FileWrapper::hasChildren() const { return node_->hasChildren(); }
+
+std::optional<FileWrapper> FileWrapper::child(std::string_view name) const {
+  auto child = node_->child(name);
+  if (!child || child->kind() == FileNode::Kind::unreadable) return std::nullopt;
+  return FileWrapper(std::move(child));
+}
+
+std::optional<FileWrapper::Children> FileWrapper::fileWrappers() const {
+  const auto* children = node_->allChildren();
+  if (!children) return std::nullopt;
+  Children wrappers;
+  for (const auto& [name, child] : *children) {
+    if (child && child->kind() != FileNode::Kind::unreadable) wrappers.emplace(name, FileWrapper(child));
+  }
+  return wrappers;
+}
+
+std::optional<std::string> FileWrapper::preferredFilename() const { return node_->preferredName(); }
+
+void FileWrapper::setPreferredFilename(std::string name) { node_->setPreferredName(std::move(name)); }
+
+void FileWrapper::addFileWrapper(FileWrapper child) {
+  if (!isDirectory()) fatalError("A file wrapper that isn't a directory takes no children.");
+  auto name = child.preferredFilename();
+  if (!name) fatalError("A file wrapper needs a preferred file name to be added to a directory.");
+  node_->setChild(std::move(*name), std::move(child.node_));
+}
+
+void FileWrapper::removeFileWrapper(std::string_view name) { node_->removeChild(name); }
+
+}  // namespace MarletFoundation

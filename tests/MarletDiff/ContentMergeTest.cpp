@@ -1,0 +1,163 @@
+#include "MarletDiff/ContentMerge.h"
+
+#include <gtest/gtest.h>
+
+#include "MarletDiff/ContentDiff.h"
+#include "MarletDiff/Texts.h"
+#include "MarletFoundation/Platform/ErrorObject.h"
+
+namespace MarletFoundation::test {
+namespace {
+
+using MarletDiff::DiffDescriptor;
+using MarletDiff::mergeContent;
+using Hunks = std::vector<DiffDescriptor>;
+constexpr auto largest = std::numeric_limits<std::int64_t>::max();
+
+/// The merged text, or the error's printed form.
+std::string merged(std::u16string_view base, const Hunks& diff, const Hunks& otherDiff = {}) {
+  try {
+    return utf8FromUTF16Lossy(mergeContent(base, diff, otherDiff));
+  } catch (const ErrorObject& error) {
+    return error.description();
+  }
+}
+
+TEST(ContentMerge, RefusesHunksThatAreNotOfTheBase) {
+  const auto error = [](int code, const std::string& words) {
+    return "Error(domain: MarletDiff, code: " + std::to_string(code) + ", \"" + words + "\")";
+  };
+  const auto beyond = [&](const std::string& place) {
+    return error(1, "The change at " + place + " reaches beyond the text.");
+  };
+  const auto early = [&](const std::string& place) {
+    return error(2, "The change at " + place + " starts ahead of the end of the one before it.");
+  };
+  const std::u16string base = u"abc\U0001F600def";
+  const std::pair<Hunks, std::string> cases[] = {
+      {{{{-1, 1}, {}, u"", u""}}, beyond("{-1, 1}")},
+      {{{{1, -1}, {}, u"", u""}}, beyond("{1, -1}")},
+      {{{{7, 2}, {}, u"f", u""}}, beyond("{7, 2}")},
+      {{{{9, 0}, {}, u"", u""}}, beyond("{9, 0}")},
+      {{{{largest, largest}, {}, u"", u""}}, beyond("{9223372036854775807, 9223372036854775807}")},
+      {{{{1, largest}, {}, u"", u""}}, beyond("{1, 9223372036854775807}")},
+      {{hunk(5, u"d", u"x"), hunk(0, u"a", u"x")}, early("{0, 1}")},
+      {{hunk(0, u"abc", u"x"), hunk(2, u"c", u"y")}, early("{2, 1}")},
+      {{hunk(0, u"a", u"x"), hunk(0, u"", u"y")}, early("{0, 0}")},
+      {{hunk(4, u"", u"x")}, error(3, "The change at {4, 0} divides a character.")},
+      {{{{2, 2}, {}, {u'c', char16_t{0xD83D}}, u"x"}}, error(3, "The change at {2, 2} divides a character.")},
+      {{hunk(1, u"x", u"y")}, error(4, "The change at {1, 1} is of other text than stands there.")},
+      {{{{1, 1}, {}, u"bc", u"y"}}, error(4, "The change at {1, 1} is of other text than stands there.")},
+  };
+  for (const auto& [hunks, words] : cases) {
+    EXPECT_EQ(merged(base, hunks), words);
+    EXPECT_EQ(merged(base, {hunk(0, u"abc", u"")}, hunks), words);
+  }
+}
+
+TEST(ContentMerge, AppliesOneDiffByItsOriginalRanges) {
+  const std::pair<Hunks, std::string> cases[] = {
+      {{}, "one two"},
+      {{hunk(0, u"", u"zero "), hunk(0, u"one", u"1"), hunk(3, u"", u"!"), hunk(7, u"", u" three")},
+       "zero 1! two three"},
+      {{hunk(3, u"", u"a"), hunk(3, u"", u"b"), hunk(3, u" two", u"")}, "oneab"},
+      {{{{4, 3}, {largest, -5}, u"two", u"2"}}, "one 2"},
+  };
+  for (const auto& [hunks, text] : cases) EXPECT_EQ(merged(u"one two", hunks), text);
+}
+
+TEST(ContentMerge, JoinsTwoSidesUnlessTheyMeet) {
+  struct {
+    std::u16string base;
+    Hunks diff, otherDiff;
+    std::string expected;  // the text, or the place of the conflict
+  } cases[] = {
+      // Apart, if only by a blank.
+      {u"foo bar", {hunk(0, u"foo", u"1")}, {hunk(4, u"bar", u"2")}, "1 2"},
+      {u"foo bar", {hunk(1, u"oo", u"ee")}, {hunk(4, u"bar", u"2")}, "fee 2"},
+      {u"foo bar", {hunk(1, u"o", u"e")}, {hunk(3, u" ", u"-")}, "feo-bar"},
+      {u"a\nb\nc\n", {hunk(0, u"a\n", u"")}, {hunk(4, u"", u"x\n")}, "b\nx\nc\n"},
+      // Both the same.
+      {u"foo bar", {hunk(0, u"foo", u"1")}, {hunk(0, u"foo", u"1")}, "1 bar"},
+      {u"foo", {hunk(3, u"", u"!")}, {hunk(3, u"", u"!")}, "foo!"},
+      {u"abc", {hunk(0, u"ab", u"xy")}, {hunk(0, u"a", u"x"), hunk(1, u"b", u"y")}, "xyc"},
+      // One side changes nothing there.
+      {u"foo bar", {hunk(0, u"foo", u"foo")}, {hunk(0, u"foo", u"1")}, "1 bar"},
+      {u"foo bar", {hunk(0, u"foo", u"1")}, {hunk(1, u"oo b", u"oo b")}, "1 bar"},
+      // Overlapping and touching.
+      {u"foo bar", {hunk(0, u"foo b", u"1")}, {hunk(4, u"bar", u"2")}, "{0, 7}"},
+      {u"(foo)", {hunk(0, u"(", u"[")}, {hunk(1, u"foo", u"2")}, "{0, 4}"},
+      {u"foo", {hunk(3, u"", u"!")}, {hunk(3, u"", u"?")}, "{3, 0}"},
+      {u"a b", {hunk(1, u"", u",")}, {hunk(1, u" ", u"-")}, "{1, 1}"},
+      {u"0123456789", {hunk(0, u"012", u"a"), hunk(5, u"567", u"b")}, {hunk(2, u"2345", u"c")}, "{0, 8}"},
+      // The same word.
+      {u"window", {hunk(0, u"w", u"W")}, {hunk(5, u"w", u"ws")}, "{0, 6}"},
+      {u"window", {hunk(0, u"", u"my")}, {hunk(6, u"", u"s")}, "{0, 6}"},
+      {u"foo bar", {hunk(3, u" ", u"")}, {hunk(5, u"ar", u"us")}, "{3, 4}"},
+      {u"foo bar", {hunk(0, u"f", u"g")}, {hunk(3, u" ", u"_")}, "{0, 4}"},
+      {u"\u00e4\u00f6\u00fc", {hunk(0, u"\u00e4", u"a")}, {hunk(2, u"\u00fc", u"u")}, "{0, 3}"},
+      // A conflict is one even if all else fits.
+      {u"a b c", {hunk(0, u"a", u"x"), hunk(4, u"c", u"1")}, {hunk(4, u"c", u"2")}, "{4, 1}"},
+  };
+  for (const auto& [base, diff, otherDiff, expected] : cases) {
+    const auto result = expected.front() != '{'
+                            ? expected
+                            : "Error(domain: MarletDiff, code: 5, \"Both sides change the text at " +
+                                  expected + " in different ways.\")";
+    EXPECT_EQ(merged(base, diff, otherDiff), result);
+    EXPECT_EQ(merged(base, otherDiff, diff), result);
+  }
+}
+
+TEST(ContentMerge, ConflictNamesThePlaceAndTheThreeTexts) {
+  try {
+    mergeContent(u"let x = 1", Hunks{hunk(8, u"1", u"2")}, Hunks{hunk(8, u"1", u"\U0001F600")});
+    FAIL();
+  } catch (const ErrorObject& error) {
+    EXPECT_EQ(error.value(MarletDiff::LocationKey), UserInfoValue(std::int64_t{8}));
+    EXPECT_EQ(error.value(MarletDiff::LengthKey), UserInfoValue(std::int64_t{1}));
+    EXPECT_EQ(error.value(MarletDiff::BaseTextKey), UserInfoValue("1"));
+    EXPECT_EQ(error.value(MarletDiff::TextKey), UserInfoValue("2"));
+    EXPECT_EQ(error.value(MarletDiff::OtherTextKey), UserInfoValue("\U0001F600"));
+  }
+}
+
+TEST(ContentMerge, SidesAreAlikeAndAgreeWithThemselves) {
+  EXPECT_TRUE(rc::check([] {
+    const auto base = *similarText(), text = *similarText(), otherText = *similarText();
+    const auto diff = MarletDiff::diffContent(base, text, MarletDiff::DiffOptions::SmallerHunks);
+    const auto otherDiff = MarletDiff::diffContent(base, otherText, MarletDiff::DiffOptions::SmallerHunks);
+    RC_ASSERT(mergeContent(base, diff, diff) == text);
+    RC_ASSERT(mergeContent(base, {}, diff) == text);
+    RC_ASSERT(merged(base, diff, otherDiff) == merged(base, otherDiff, diff));
+  }));
+}
+
+TEST(ContentMerge, ChangesOfDifferentPlacesAllGoIn) {
+  EXPECT_TRUE(rc::check([] {
+    const auto head = *similarText(), newHead = *similarText(), tail = *similarText(),
+               newTail = *similarText();
+    const std::u16string between = u" - ";
+    const auto diff = MarletDiff::diffContent(head, newHead, MarletDiff::DiffOptions::SmallerHunks);
+    auto otherDiff = MarletDiff::diffContent(tail, newTail, MarletDiff::DiffOptions::SmallerHunks);
+    for (auto& hunk : otherDiff) hunk.originalRange.location += std::ssize(head + between);
+    RC_ASSERT(mergeContent(head + between + tail, diff, otherDiff) == newHead + between + newTail);
+  }));
+}
+
+/// Many changes of both sides within one endless word are one conflict, found in one pass.
+TEST(ContentMerge, CostsNoMoreThanTheBaseIsLong) {
+  const std::u16string base(2'000'000, u'w');
+  Hunks diff, otherDiff;
+  for (int at = 0; at + 4 < std::ssize(base); at += 4) {
+    diff.push_back(hunk(at, u"w", u"x"));
+    otherDiff.push_back(hunk(at + 2, u"w", u"y"));
+  }
+  const auto start = std::chrono::steady_clock::now();
+  EXPECT_THROW(mergeContent(base, diff, otherDiff), ErrorObject);
+  EXPECT_EQ(mergeContent(base, diff).size(), base.size());
+  EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(30));
+}
+
+}  // namespace
+}  // namespace MarletFoundation::test
