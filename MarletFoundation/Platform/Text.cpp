@@ -228,13 +228,21 @@ std::optional<std::string> utf8FromUTF16(std::u16string_view text) { return utf8
 
 std::string utf8FromUTF16Lossy(std::u16string_view text) { return *utf8(text, Unpaired::replace); }
 
-bool isValidUTF8(std::string_view text) {
-  for (std::size_t i = asciiRunLength(text, 0); i < text.size(); i += asciiRunLength(text, i)) {
+bool isValidUTF8(std::string_view text) { return utf8PrefixLength(text) == text.size(); }
+
+std::size_t asciiPrefixLength(std::string_view text) { return asciiRunLength(text, 0); }
+
+std::size_t utf8PrefixLength(std::string_view text) {
+  for (std::size_t i = 0; i < text.size();) {
+    if (isASCII(text[i])) {
+      i += asciiRunLength(text, i);
+      continue;
+    }
     const auto scalar = decodeUTF8(text.substr(i));
-    if (!scalar.length) return false;
+    if (!scalar.length) return i;
     i += scalar.length;
   }
-  return true;
+  return text.size();
 }
 
 std::int64_t graphemeCount(std::string_view text) {

@@ -15,6 +15,9 @@ namespace MarletFoundation {
 MARLET_EXPORT std::optional<std::u16string> utf16FromUTF8(std::string_view text);
 MARLET_EXPORT std::optional<std::string> utf8FromUTF16(std::u16string_view text);
 MARLET_EXPORT bool isValidUTF8(std::string_view text);
+/// Bytes in front of the first one that isn't ASCII, or that belongs to no well-formed UTF-8 character.
+MARLET_EXPORT std::size_t asciiPrefixLength(std::string_view text);
+MARLET_EXPORT std::size_t utf8PrefixLength(std::string_view text);
 
 /// Conversions for printing only: what is ill-formed becomes U+FFFD.
 MARLET_EXPORT std::string utf8FromUTF16Lossy(std::u16string_view text);
