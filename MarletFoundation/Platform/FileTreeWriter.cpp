@@ -38,7 +38,7 @@ class TreeWriter {
  public:
   TreeWriter(const AtomicReplacement& replacement, std::shared_ptr<DiskDirectory> target)
       : replacement_(replacement), target_(std::move(target)) {
-    if (::fstat(target_->descriptor(), &targetStatus_) != 0) throwPosix(errno, "");
+    if (::fstat(target_->descriptor(), &targetStatus_) != 0) throwPosix(errno, replacement.path());
     if (replacement.replacesDirectory()) original_ = DiskDirectory::root(replacement.openReplaced());
   }
 
@@ -69,8 +69,8 @@ class TreeWriter {
     std::shared_ptr<DiskDirectory> target, attributes;
   };
 
-  [[noreturn]] static void fail(int error, DiskDirectory& directory, const std::string& name = {}) {
-    throwPosix(error, directory.path() + name);
+  [[noreturn]] void fail(int error, const DiskDirectory& directory, const std::string& name = {}) const {
+    throwPosix(error, replacement_.path() + "/" + directory.path() + name);
   }
 
   void writeDirectory(const Job& job) {
@@ -175,7 +175,7 @@ class TreeWriter {
     return job.original->openFile(name.c_str());
   }
 
-  static void copyLink(DiskDirectory& target, const std::string& name, FileNode& link) {
+  void copyLink(DiskDirectory& target, const std::string& name, FileNode& link) {
     std::string text(static_cast<std::size_t>(PATH_MAX), '\0');
     const auto length =
         ::readlinkat(link.parent()->descriptor(), link.diskName().c_str(), text.data(), text.size() - 1);
@@ -209,11 +209,11 @@ class TreeWriter {
 
 void writeRegularFile(AtomicReplacement& replacement, FileNode& file) {
   const Descriptor source = file.isOnDisk() ? file.openOnDisk() : Descriptor();
-  if (!source && !file.isLoaded()) throwPosix(errno, file.diskName());
+  if (!source && !file.isLoaded()) throwPosix(errno, replacement.path());
   const int target = replacement.makeFile();
   if ((source && !replacement.replacesFile() && copyAttributes(source.get(), target) != 0) ||
       (file.isLoaded() ? writeAll(target, file.contents()->view()) : copyBytes(source.get(), target)) != 0) {
-    throwPosix(errno, file.diskName());
+    throwPosix(errno, replacement.path());
   }
 }
 
@@ -238,7 +238,8 @@ void FileWrapper::write(const URL& url) const {
   struct stat status;
   if (source && replacement.replaced() && ::fstat(source->descriptor(), &status) == 0 &&
       sameItem(status, *replacement.replaced())) {
-    source->setRoot(Descriptor(::fcntl(target->descriptor(), F_DUPFD_CLOEXEC, 0)));
+    Descriptor root(::fcntl(target->descriptor(), F_DUPFD_CLOEXEC, 0));
+    if (root) source->setRoot(std::move(root));
   }
 }
 

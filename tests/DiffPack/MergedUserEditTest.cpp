@@ -41,6 +41,7 @@ class MergedUserEdit : public testing::Test {
   }
   static std::string posix(int code) { return "POSIX " + std::to_string(code); }
 
+  const TemporaryDirectory directory_;
   const std::vector<std::string> unreadable = {"missing",
                                                "a",
                                                "a/plain/x",
@@ -54,7 +55,6 @@ class MergedUserEdit : public testing::Test {
                                                "",
                                                directory_.path() / "secret",
                                                std::string("a\0b", 3)};
-  TemporaryDirectory directory_;
 };
 
 TEST_F(MergedUserEdit, WithoutAnEntryIsTheAuthoredFileIfItCanBeRead) {
