@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <charconv>
+#include <cmath>
 #include <cstring>
 #include <limits>
 #include <memory>
@@ -273,6 +274,14 @@ std::optional<std::int64_t> parseDecimalInteger(std::string_view text) {
   const auto result = std::from_chars(text.data(), text.data() + text.size(), value);
   if (result.ec != std::errc() || result.ptr != text.data() + text.size()) return std::nullopt;
   return value;
+}
+
+std::string shortestDecimal(double number) {
+  // The largest double has 309 digits in front of the point, the smallest 1074 places behind it.
+  char buffer[1100];
+  std::string text(buffer, std::to_chars(buffer, std::end(buffer), number, std::chars_format::fixed).ptr);
+  if (std::isfinite(number) && text.find('.') == std::string::npos) text += ".0";
+  return text;
 }
 
 std::vector<std::string_view> split(std::string_view text, char separator) {

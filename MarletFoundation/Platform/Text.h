@@ -35,6 +35,10 @@ MARLET_EXPORT bool canonicallyEquivalent(std::string_view a, std::string_view b)
 /// A decimal integer: an optional sign, then ASCII digits and nothing else. Nothing when it doesn't fit.
 MARLET_EXPORT std::optional<std::int64_t> parseDecimalInteger(std::string_view text);
 
+/// The shortest decimal form that reads back as the same number, without an exponent and always with a point:
+/// `500000000.0`.
+MARLET_EXPORT std::string shortestDecimal(double number);
+
 /// The pieces between separators, as views into `text`; an empty text gives one empty piece.
 MARLET_EXPORT std::vector<std::string_view> split(std::string_view text, char separator);
 
