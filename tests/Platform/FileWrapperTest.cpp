@@ -202,7 +202,7 @@ TEST(FileWrapper, WhatCannotBeReadShowsAsAbsent) {
 
 TEST(FileWrapper, GetsByWithFewDescriptors) {
   const TemporaryDirectory directory;
-  for (int i = 0; i < 300; ++i) {
+  for (int i = 0; i < 100; ++i) {
     const auto sub = directory.path() / std::to_string(i);
     fs::create_directories(sub / "deep/deeper");
     fill(sub / "deep/deeper/file", std::to_string(i));
@@ -213,13 +213,13 @@ TEST(FileWrapper, GetsByWithFewDescriptors) {
   std::vector<FileWrapper> kept;
   const rlimit few{static_cast<rlim_t>(::dup(0) + 6), before.rlim_max};
   ::setrlimit(RLIMIT_NOFILE, &few);
-  for (int i = 0; i < 300; ++i) kept.push_back(*root.child(std::to_string(i))->child("deep"));
+  for (int i = 0; i < 100; ++i) kept.push_back(*root.child(std::to_string(i))->child("deep"));
   int found = 0;
-  for (int i = 0; i < 300; ++i)
+  for (int i = 0; i < 100; ++i)
     found += contents(kept[i].child("deeper")->child("file")) == std::to_string(i);
-  const bool isListed = root.fileWrappers()->size() == 300;
+  const bool isListed = root.fileWrappers()->size() == 100;
   ::setrlimit(RLIMIT_NOFILE, &before);
-  EXPECT_EQ(found, 300);
+  EXPECT_EQ(found, 100);
   EXPECT_TRUE(isListed);
 }
 

@@ -1,4 +1,5 @@
 #include <gtest/gtest.h>
+#include <pthread.h>
 #include <signal.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
@@ -8,6 +9,7 @@
 #include <cerrno>
 #include <filesystem>
 #include <fstream>
+#include <functional>
 
 #include "MarletFoundation/Platform/Digest.h"
 #include "MarletFoundation/Platform/ErrorObject.h"
@@ -155,10 +157,24 @@ TEST(FileWrapperWriting, AFailureLeavesTheOldDocument) {
   EXPECT_EQ(names(directory), (std::vector<std::string>{"book"}));
 }
 
-TEST(FileWrapperWriting, DeeperThanAnyStack) {
-  constexpr int depth = 5000;
+/// Runs a function on a thread of little stack.
+void onSmallStack(std::function<void()> function) {
+  pthread_attr_t attributes;
+  ::pthread_attr_init(&attributes);
+  ASSERT_EQ(::pthread_attr_setstacksize(&attributes, std::size_t{256} << 10), 0);
+  pthread_t thread;
+  const auto run = [](void* argument) -> void* {
+    (*static_cast<std::function<void()>*>(argument))();
+    return nullptr;
+  };
+  ASSERT_EQ(::pthread_create(&thread, &attributes, run, &function), 0);
+  ::pthread_join(thread, nullptr);
+}
+
+TEST(FileWrapperWriting, DeeperThanTheStack) {
+  constexpr int depth = 700;
   const TemporaryDirectory directory;
-  {
+  onSmallStack([&] {
     auto deep = file("leaf", "here");
     for (int level = 0; level < depth; ++level) {
       auto above = FileWrapper::directory();
@@ -167,15 +183,15 @@ TEST(FileWrapperWriting, DeeperThanAnyStack) {
       deep = std::move(above);
     }
     deep.write(directory.url("deep"));
-  }
-  FileWrapper root(directory.url("deep"));
-  auto node = root;
-  for (int level = 1; level < depth; ++level) node = *node.child("d");
-  EXPECT_EQ(node.child("leaf")->regularFileContents()->view(), "here");
-  root.write(directory.url("deep"));
-  EXPECT_EQ(node.child("leaf")->regularFileContents()->view(), "here");
-  // Also takes the deep tree away again.
-  file("x", "").write(directory.url("deep"));
+    FileWrapper root(directory.url("deep"));
+    auto node = root;
+    for (int level = 1; level < depth; ++level) node = *node.child("d");
+    root.write(directory.url("deep"));
+    const auto leaf = node.child("leaf");
+    EXPECT_TRUE(leaf && leaf->regularFileContents()->view() == "here");
+    // Also takes the deep tree away again.
+    file("x", "").write(directory.url("deep"));
+  });
   EXPECT_EQ(names(directory), (std::vector<std::string>{"deep"}));
 }
 
