@@ -182,6 +182,26 @@ TEST(DispatchQueue, PoolThreadsThatAllWaitForQueuesDontStarveTheirBlocks) {
   EXPECT_TRUE(done.wait());
 }
 
+TEST(DispatchQueue, AWholePoolAsleepBehindAQueueWakesForItsBlocks) {
+  constexpr int jobs = 100;
+  const DispatchQueue queue("busy");
+  std::atomic<int> started{0}, finished{0};
+  bool ran = false;
+  Event done;
+  queue.sync([&] {
+    queue.async([&] { ran = true; });
+    for (int i = 0; i < jobs; ++i) {
+      DispatchQueue::global().async([&] {
+        ++started;
+        queue.sync([&] { EXPECT_TRUE(ran); });
+        if (++finished == jobs) done.set();
+      });
+    }
+    for (int before = -1; before != started; std::this_thread::sleep_for(50ms)) before = started;
+  });
+  EXPECT_TRUE(done.wait());
+}
+
 TEST(DispatchQueue, AQueueOutlivesItsHandlesWhileItHasWork) {
   Event release, ran;
   {
