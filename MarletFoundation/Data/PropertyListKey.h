@@ -1,8 +1,8 @@
 #pragma once
 
 #include <atomic>
-#include <cstdint>
 #include <string_view>
+#include <utility>
 
 #include "MarletFoundation/Platform/Export.h"
 
@@ -14,15 +14,19 @@ class MARLET_EXPORT PropertyListKey {
  public:
   explicit PropertyListKey(std::string_view text);
   PropertyListKey(const PropertyListKey& other) noexcept;
-  PropertyListKey(PropertyListKey&& other) noexcept;
+  PropertyListKey(PropertyListKey&& other) noexcept : buffer_(std::exchange(other.buffer_, nullptr)) {}
   PropertyListKey& operator=(PropertyListKey other) noexcept;
-  ~PropertyListKey();
+  ~PropertyListKey() {
+    if (buffer_) release();
+  }
 
   std::string_view view() const;
   operator std::string_view() const { return view(); }
 
  private:
   struct Buffer;
+  void release() noexcept;
+
   Buffer* buffer_;
 };
 

@@ -47,6 +47,8 @@ class MARLET_EXPORT PropertyListDictionary {
 
  private:
   friend struct PropertyListValue;
+  void sortEntries();
+
   Entries entries_;
 };
 
@@ -79,7 +81,9 @@ struct MARLET_EXPORT PropertyListValue {
   PropertyListValue(PropertyListValue&&) noexcept = default;
   PropertyListValue& operator=(const PropertyListValue& other);
   PropertyListValue& operator=(PropertyListValue&& other) noexcept;
-  ~PropertyListValue();
+  ~PropertyListValue() {
+    if (payload.index() < 2) clearContainer();
+  }
 
   /// The payload of the named case, or null.
   const Array* array() const { return std::get_if<Array>(&payload); }
@@ -95,6 +99,9 @@ struct MARLET_EXPORT PropertyListValue {
 
   /// A value is its own property-list form.
   const PropertyListValue& propertyListValue() const { return *this; }
+
+ private:
+  void clearContainer() noexcept;
 };
 
 struct PropertyListDictionary::Entry {

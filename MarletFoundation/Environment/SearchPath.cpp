@@ -18,12 +18,12 @@ SearchPath::SearchPath(std::vector<URL> searchPaths) : searchPaths_(std::move(se
 }
 
 SearchPath::SearchPath(const PropertyListValue& value) {
-  using Error = PropertyListSerializationError;
+  using Failure = PropertyListSerializationError;
   const auto* array = value.array();
-  if (!array) throw Error(Error::Case::RootNotAnArray);
+  if (!array) throw Failure(Failure::Case::RootNotAnArray);
   for (const auto& element : *array) {
     const auto* path = element.string();
-    if (!path) throw Error(Error::Case::SearchPathNotAString);
+    if (!path) throw Failure(Failure::Case::SearchPathNotAString);
     searchPaths_.push_back(URL::file(*path));
   }
 }

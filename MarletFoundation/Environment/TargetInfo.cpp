@@ -13,27 +13,26 @@ const std::string& string(const PropertyListDictionary& info, std::string_view k
   return *value->string();
 }
 
-URL beneath(const URL& directory, const PropertyListValue& path, bool isDirectory = true) {
-  if (!path.string() || path.string()->empty() || path.string()->starts_with('/')) throw BadTargetInfo{};
-  return directory.appendingPathComponent(*path.string(), isDirectory);
-}
-
-URL beneath(const URL& directory, const PropertyListDictionary& info, std::string_view key) {
-  return beneath(directory, string(info, key));
+URL beneath(const URL& directory, const std::string& path) {
+  if (path.empty() || path.starts_with('/')) throw BadTargetInfo{};
+  return directory.appendingPathComponent(path, true);
 }
 
 TargetPointer makeTarget(const URL& directory, const PropertyListDictionary& info) {
   const auto& identifier = string(info, "TargetIdentifier");
-  auto SDKRoot = beneath(directory, info, "SDKRoot");
+  auto SDKRoot = beneath(directory, string(info, "SDKRoot"));
   const auto& SDKVersion = string(info, "SDKVersion");
   const auto& deploymentTarget = string(info, "DeploymentTarget");
   std::optional<URL> toolchain;
-  if (info.contains("ToolchainPath")) toolchain = beneath(directory, info, "ToolchainPath");
+  if (info.contains("ToolchainPath")) toolchain = beneath(directory, string(info, "ToolchainPath"));
   const auto& targetOS = string(info, "TargetOS");
   const auto* executables = info.find("ExecutableSearchPath");
   if (!executables || !executables->array()) throw BadTargetInfo{};
   std::vector<URL> executableSearchPath;
-  for (const auto& path : *executables->array()) executableSearchPath.push_back(beneath(directory, path));
+  for (const auto& path : *executables->array()) {
+    if (!path.string()) throw BadTargetInfo{};
+    executableSearchPath.push_back(beneath(directory, *path.string()));
+  }
 
   return std::make_shared<const Target>(
       identifier, std::move(SDKRoot), SDKVersion, deploymentTarget, std::move(toolchain),

@@ -39,8 +39,8 @@ struct MARLET_EXPORT LogAspect {
   std::optional<Loggers> loggers;
 
   /// The registered aspect of that name. When there is none, one is registered whose level stands under the
-  /// user default named `<name>LogLevel`, and is `Critical` without one; so a later change of the default
-  /// is not seen.
+  /// user default named `<name>LogLevel`, and is `Critical` without one; so a later change of the default is
+  /// not seen.
   explicit LogAspect(std::string_view name);
   /// A new aspect. With `registers`, it takes the place of any registered one of its name.
   LogAspect(std::string name, LogLevel logLevel, std::optional<Loggers> loggers, bool registers);

@@ -12,7 +12,7 @@ namespace MarletFoundation {
 /// book of many pages would otherwise spend a third of its opening on closing.
 class DiskTree {
  public:
-  static constexpr std::size_t Capacity = 32;
+  static constexpr std::size_t Capacity = 64;
   /// How many ancestors of the directory in use stay open when the others are closed.
   static constexpr int KeptAncestors = 12;
 
@@ -79,7 +79,7 @@ class DiskTree {
   std::vector<Entry> open_;
 };
 
-DiskDirectory::DiskDirectory(std::shared_ptr<DiskDirectory> parent, std::string name)
+DiskDirectory::DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string name)
     : parent_(std::move(parent)), name_(std::move(name)), tree_(parent_ ? parent_->tree_ : nullptr) {}
 
 DiskDirectory::~DiskDirectory() {
@@ -90,7 +90,7 @@ DiskDirectory::~DiskDirectory() {
 }
 
 std::shared_ptr<DiskDirectory> DiskDirectory::root(Descriptor descriptor) {
-  std::shared_ptr<DiskDirectory> directory(new DiskDirectory(nullptr, {}));
+  auto directory = std::make_shared<DiskDirectory>(Key(), nullptr, std::string());
   directory->ownTree_ = std::make_unique<DiskTree>();
   directory->tree_ = directory->ownTree_.get();
   directory->tree_->root = std::move(descriptor);
@@ -98,7 +98,7 @@ std::shared_ptr<DiskDirectory> DiskDirectory::root(Descriptor descriptor) {
 }
 
 std::shared_ptr<DiskDirectory> DiskDirectory::child(std::shared_ptr<DiskDirectory> parent, std::string name) {
-  return std::shared_ptr<DiskDirectory>(new DiskDirectory(std::move(parent), std::move(name)));
+  return std::make_shared<DiskDirectory>(Key(), std::move(parent), std::move(name));
 }
 
 std::shared_ptr<DiskDirectory> DiskDirectory::openChild(const std::shared_ptr<DiskDirectory>& parent,

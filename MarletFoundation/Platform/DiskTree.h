@@ -22,6 +22,8 @@ class DiskDirectory {
   /// The directory of that name, opened; null and errno when there is none.
   static std::shared_ptr<DiskDirectory> openChild(const std::shared_ptr<DiskDirectory>& parent,
                                                   std::string name);
+  struct Key {};  // only the functions above make directories
+  DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string name);
   ~DiskDirectory();
   DiskDirectory(const DiskDirectory&) = delete;
   DiskDirectory& operator=(const DiskDirectory&) = delete;
@@ -46,13 +48,13 @@ class DiskDirectory {
   void setRoot(Descriptor descriptor);
   /// The root of this directory's tree.
   DiskDirectory& rootDirectory();
+  const std::shared_ptr<DiskDirectory>& parent() const { return parent_; }
+  const std::string& name() const { return name_; }
   /// The path from the tree's root, for messages.
   std::string path() const;
 
  private:
   friend class DiskTree;
-  DiskDirectory(std::shared_ptr<DiskDirectory> parent, std::string name);
-  int open(int parentDescriptor);
 
   std::shared_ptr<DiskDirectory> parent_;
   std::string name_;

@@ -47,8 +47,8 @@ class DispatchLane final : public DispatchQueueCore, public std::enable_shared_f
 
   bool tryAcquire(bool exclusive);
   void waitToAcquire(bool exclusive);
-  /// Gives the queue back and hands it on. Returns the number of blocks that became ready by that; the
-  /// caller sees to it that they run.
+  /// Gives the queue back and hands it on. Returns the number of blocks that became ready by that; the caller
+  /// sees to it that they run.
   std::size_t release(bool exclusive);
 
   /// These are called with the mutex held.

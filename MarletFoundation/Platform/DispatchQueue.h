@@ -32,8 +32,7 @@ enum class DispatchQuality { userInteractive, userInitiated, defaultQuality, uti
 ///
 /// - A serial queue runs one block at a time, in the order of submission.
 /// - A concurrent queue starts plain blocks in that order and lets them overlap. A barrier block waits for
-/// all
-///   blocks before it, runs alone, and holds back all blocks after it, synchronous ones too.
+///   all blocks before it, runs alone, and holds back all blocks after it, synchronous ones too.
 /// - A global queue starts blocks in order, as threads are free. It is shared, so barriers are plain blocks.
 /// - The main queue is serial, and its blocks run on the thread that pumps it (`runMainQueueUntil`).
 ///

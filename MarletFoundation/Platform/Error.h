@@ -14,8 +14,8 @@ class Error;
 /// An error that another one carries. Immutable and shared; null stands for none.
 using ErrorPointer = std::shared_ptr<const Error>;
 
-/// What every thrown failure of the library answers: a domain and a code that identify it, and a printed
-/// form for logs. The words for a user are asked of its error object (`ErrorObject`).
+/// What every thrown failure of the library answers: a domain and a code that identify it, and a printed form
+/// for logs. The words for a user are asked of its error object (`ErrorObject`).
 class MARLET_EXPORT Error : public std::exception {
  public:
   /// The error's type, stable between releases.

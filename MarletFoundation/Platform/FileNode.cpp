@@ -4,6 +4,8 @@
 
 #include <vector>
 
+#include "MarletFoundation/Platform/AtomicReplacement.h"
+
 namespace MarletFoundation {
 namespace {
 
@@ -14,74 +16,88 @@ FileNode::Kind kindOf(mode_t mode) {
   return FileNode::Kind::other;
 }
 
-bool isAbsence(int error) { return error == ENOENT || error == ENOTDIR || error == ENAMETOOLONG; }
+/// Whether a look by name failed since nothing of that name can be there.
+bool isAbsence(int error) { return error == ENOENT || error == ENAMETOOLONG; }
 
 }  // namespace
 
 FileNode::Stamp::Stamp(const struct stat& status)
-    : device(status.st_dev), number(status.st_ino), size(status.st_size), changed(status.st_ctim) {}
+    : number(status.st_ino), size(status.st_size), changed(status.st_ctim) {}
 
 bool FileNode::Stamp::operator==(const Stamp& other) const {
-  return device == other.device && number == other.number && size == other.size &&
-         changed.tv_sec == other.changed.tv_sec && changed.tv_nsec == other.changed.tv_nsec;
+  return number == other.number && size == other.size && changed.tv_sec == other.changed.tv_sec &&
+         changed.tv_nsec == other.changed.tv_nsec;
 }
 
 std::shared_ptr<FileNode> FileNode::inMemory(Data contents) {
-  std::shared_ptr<FileNode> node(new FileNode);
+  auto node = std::make_shared<FileNode>(Key());
   node->kind_ = Kind::regularFile;
-  node->contents_.data = std::move(contents);
-  node->contentsRead_ = true;
+  node->contents_ = std::move(contents);
+  node->contentsWereRead_ = true;
   return node;
 }
 
 std::shared_ptr<FileNode> FileNode::directoryInMemory() {
-  std::shared_ptr<FileNode> node(new FileNode);
-  node->kind_ = Kind::directory;
-  node->listed_ = true;
-  node->opened_ = true;
+  auto node = std::make_shared<FileNode>(Key());
+  node->becomeDirectory(nullptr, true);
+  node->directory_->isListed = true;
   return node;
 }
 
 std::shared_ptr<FileNode> FileNode::onDisk(std::shared_ptr<DiskDirectory> parent, std::string_view name) {
-  std::shared_ptr<FileNode> node(new FileNode);
+  auto node = std::make_shared<FileNode>(Key());
   node->parent_ = std::move(parent);
   node->diskName_ = name;
   return node;
 }
 
 std::shared_ptr<FileNode> FileNode::atPath(const std::string& path) {
-  std::shared_ptr<FileNode> node(new FileNode);
-  node->path_ = path;
+  auto node = onDisk(nullptr, path);
   node->look();
-  if (node->kind_ == Kind::unreadable) throwPosix(node->error_, path);
+  if (node->kind_ == Kind::unreadable) {
+    const auto displaced = node->error_ == ENOENT ? AtomicReplacement::displacedPath(path) : std::nullopt;
+    if (!displaced) throwPosix(node->error_, path);
+    node = onDisk(nullptr, *displaced);
+    node->look();
+  }
   if (node->kind_ == Kind::directory) {
-    Descriptor root(retrying([&] { return ::open(path.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC); }));
+    Descriptor root(retrying([&] { return ::open(node->diskName_.c_str(), DirectoryFlags & ~O_NOFOLLOW); }));
     if (!root) throwPosix(errno, path);
-    node->directory_ = DiskDirectory::root(std::move(root));
-    node->opened_ = true;
-  } else if (node->kind_ == Kind::regularFile && !node->openOnDisk()) {
+    node->becomeDirectory(DiskDirectory::root(std::move(root)), true);
+  } else if (node->kind_ == Kind::regularFile && !node->openUnchecked()) {
     throwPosix(errno, path);
   }
   return node;
 }
 
 FileNode::~FileNode() {
+  if (!directory_) return;
   // Level by level: a tree may be deeper than the stack.
-  std::vector<Children> pending;
-  if (!children_.empty()) pending.push_back(std::move(children_));
+  std::vector<std::unique_ptr<Directory>> pending;
+  pending.push_back(std::move(directory_));
   while (!pending.empty()) {
-    Children level = std::move(pending.back());
+    const auto directory = std::move(pending.back());
     pending.pop_back();
-    for (auto& [name, node] : level) {
-      if (node && node.use_count() == 1 && !node->children_.empty())
-        pending.push_back(std::move(node->children_));
+    for (const auto& [name, node] : directory->children) {
+      if (node && node->directory_ && node.use_count() == 1) pending.push_back(std::move(node->directory_));
     }
   }
 }
 
+std::optional<std::string> FileNode::preferredName() const {
+  if (preferredName_) return *preferredName_;
+  if (directory_ && directory_->onDisk && !directory_->onDisk->name().empty())
+    return directory_->onDisk->name();
+  return parent_ ? std::optional(diskName_) : std::nullopt;
+}
+
+void FileNode::setPreferredName(std::string name) {
+  preferredName_ = std::make_unique<std::string>(std::move(name));
+}
+
 int FileNode::lookAgain(struct stat& status) {
   if (parent_) return parent_->status(diskName_.c_str(), status);
-  return retrying([&] { return ::stat(path_.c_str(), &status); });
+  return retrying([&] { return ::stat(diskName_.c_str(), &status); });
 }
 
 void FileNode::look() {
@@ -95,41 +111,53 @@ void FileNode::look() {
   }
 }
 
+void FileNode::becomeDirectory(std::shared_ptr<DiskDirectory> onDisk, std::optional<bool> wasOpened) {
+  kind_ = Kind::directory;
+  directory_ = std::make_unique<Directory>();
+  directory_->onDisk = std::move(onDisk);
+  directory_->wasOpened = wasOpened;
+}
+
 FileNode::Kind FileNode::kind() {
   if (kind_ == Kind::unknown) look();
-  if (kind_ == Kind::directory && !directory_ && parent_)
-    directory_ = DiskDirectory::child(parent_, diskName_);
+  if (kind_ == Kind::directory && !directory_) {
+    becomeDirectory(DiskDirectory::child(parent_, diskName_), std::nullopt);
+  }
   return kind_;
+}
+
+const std::shared_ptr<DiskDirectory>& FileNode::diskDirectory() const {
+  static const std::shared_ptr<DiskDirectory> none;
+  return directory_ ? directory_->onDisk : none;
 }
 
 bool FileNode::hasChildren() {
   if (kind() != Kind::directory) return false;
-  if (!opened_) opened_ = directory_->descriptor() >= 0;
-  return *opened_;
+  if (!directory_->wasOpened) directory_->wasOpened = directory_->onDisk->descriptor() >= 0;
+  return *directory_->wasOpened;
 }
 
 std::shared_ptr<FileNode> FileNode::child(std::string_view name) {
   if (kind() != Kind::directory || !isFileName(name)) return nullptr;
-  const auto found = children_.find(name);
-  if (found != children_.end()) return found->second;
-  if (listed_ || !hasChildren()) return nullptr;
-  return children_.emplace(name, lookUp(name)).first->second;
+  const auto found = directory_->children.lower_bound(name);
+  if (found != directory_->children.end() && found->first == name) return found->second;
+  if (directory_->isListed || !hasChildren()) return nullptr;
+  return directory_->children.emplace_hint(found, name, lookUp(name))->second;
 }
 
 std::shared_ptr<FileNode> FileNode::lookUp(std::string_view name) {
-  auto node = onDisk(directory_, name);
-  if (expectsDirectories_) {
-    node->directory_ = DiskDirectory::openChild(directory_, node->diskName_);
-    if (node->directory_) {
-      node->kind_ = Kind::directory;
-      node->opened_ = true;
+  if (directory_->expectsDirectories) {
+    if (auto opened = DiskDirectory::openChild(directory_->onDisk, std::string(name))) {
+      auto node = std::make_shared<FileNode>(Key());
+      node->becomeDirectory(std::move(opened), true);
       return node;
     }
-    if (isAbsence(errno) && errno != ENOTDIR) return nullptr;
+    if (isAbsence(errno)) return nullptr;
   }
+  auto node = onDisk(directory_->onDisk, name);
   node->look();
   if (node->kind_ == Kind::unreadable && isAbsence(node->error_)) return nullptr;
-  expectsDirectories_ = node->kind_ == Kind::directory;
+  directory_->expectsDirectories = node->kind_ == Kind::directory;
   return node;
 }
 
@@ -138,57 +166,65 @@ const FileNode::Children* FileNode::allChildren() {
     errno = kind_ == Kind::directory ? EACCES : ENOTDIR;
     return nullptr;
   }
-  if (listed_) return &children_;
-  const auto entries = directory_->entries();
+  auto& [onDiskDirectory, children, isListed, wasOpened, expectsDirectories] = *directory_;
+  if (isListed) return &children;
+  const auto entries = onDiskDirectory->entries();
   if (!entries) return nullptr;
   for (const auto& [name, type] : *entries) {
-    const auto [place, isNew] = children_.try_emplace(name);
+    const auto [place, isNew] = children.try_emplace(name);
     if (!isNew) continue;
-    place->second = onDisk(directory_, name);
+    place->second = onDisk(onDiskDirectory, name);
     if (type != DT_UNKNOWN) place->second->kind_ = kindOf(DTTOIF(type));
   }
-  listed_ = true;
-  return &children_;
+  isListed = true;
+  return &children;
 }
 
 void FileNode::setChild(std::string name, std::shared_ptr<FileNode> child) {
-  children_.insert_or_assign(std::move(name), std::move(child));
+  directory_->children.insert_or_assign(std::move(name), std::move(child));
 }
 
 void FileNode::removeChild(std::string_view name) {
-  const auto found = children_.find(name);
-  if (found != children_.end()) {
-    found->second = nullptr;
-  } else if (!listed_) {
-    children_.emplace(name, nullptr);
-  }
+  if (kind() == Kind::directory) directory_->children.insert_or_assign(std::string(name), nullptr);
 }
 
-const FileContents& FileNode::contents() {
-  if (contentsRead_) return contents_;
-  contentsRead_ = true;
+std::optional<Data> FileNode::contents() {
+  if (kind() != Kind::regularFile) return std::nullopt;
+  if (!contentsWereRead_) readContents();
+  return isLoaded() ? std::optional(contents_) : std::nullopt;
+}
+
+void FileNode::readContents() {
+  contentsWereRead_ = true;
+  // A file that was only seen in a listing is looked at first: whatever stands there now, only a regular
+  // file is opened.
+  const bool wasLookedAt = stamp_.number != 0;
+  auto file = wasLookedAt ? openUnchecked() : openOnDisk();
+  if (!file) {
+    error_ = errno;
+    return;
+  }
   struct stat status;
-  // Without a stamp the name was only seen in a listing; whatever stands there now, no device is opened.
-  const bool isListedOnly = stamp_.number == 0;
-  if (isListedOnly && lookAgain(status) != 0) {
-    contents_.error = errno;
-    return contents_;
-  }
-  if (isListedOnly) stamp_ = Stamp(status);
-  if (kind_ != Kind::regularFile || (isListedOnly && !S_ISREG(status.st_mode))) {
-    contents_.error = EINVAL;
-  } else if (auto file = openOnDisk(); !file) {
-    contents_.error = errno;
-  } else {
-    contents_ = readToEnd(file.get(), stamp_.size);
-    if (parent_) parent_->closeLater(std::move(file));
-  }
-  return contents_;
+  if (!wasLookedAt && ::fstat(file.get(), &status) == 0) stamp_ = Stamp(status);
+  auto read = readToEnd(file.get(), stamp_.size);
+  contents_ = std::move(read.data);
+  error_ = read.error;
+  if (parent_) parent_->closeLater(std::move(file));
+}
+
+Descriptor FileNode::openUnchecked() {
+  if (parent_) return parent_->openFile(diskName_.c_str());
+  return Descriptor(retrying([&] { return ::open(diskName_.c_str(), ReadingFlags); }));
 }
 
 Descriptor FileNode::openOnDisk() {
-  if (parent_) return parent_->openFile(diskName_.c_str());
-  return Descriptor(retrying([&] { return ::open(path_.c_str(), ReadingFlags); }));
+  struct stat status;
+  if (lookAgain(status) != 0) return Descriptor();
+  Descriptor file = S_ISREG(status.st_mode) ? openUnchecked() : Descriptor();
+  if (file && ::fstat(file.get(), &status) != 0) return Descriptor();
+  if (S_ISREG(status.st_mode)) return file;
+  errno = EINVAL;
+  return Descriptor();
 }
 
 }  // namespace MarletFoundation

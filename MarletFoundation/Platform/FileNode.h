@@ -21,7 +21,6 @@ class FileNode {
 
   /// What a look at a file's name found, enough to tell whether it has changed since.
   struct Stamp {
-    dev_t device = 0;
     ino_t number = 0;
     off_t size = 0;
     timespec changed{};
@@ -35,10 +34,19 @@ class FileNode {
   static std::shared_ptr<FileNode> directoryInMemory();
   /// The item at a path, links followed. Throws when it can't be opened.
   static std::shared_ptr<FileNode> atPath(const std::string& path);
+  struct Key {};  // only the functions above make nodes
+  explicit FileNode(Key) {}
   ~FileNode();
+  FileNode(const FileNode&) = delete;
+  FileNode& operator=(const FileNode&) = delete;
+
+  std::optional<std::string> preferredName() const;
+  void setPreferredName(std::string name);
 
   /// The kind, looked up if need be; never `unknown`.
   Kind kind();
+  /// The errno of an unreadable node.
+  int error() const { return error_; }
   bool hasChildren();
   /// The child of that name, or null.
   std::shared_ptr<FileNode> child(std::string_view name);
@@ -46,49 +54,53 @@ class FileNode {
   const Children* allChildren();
   void setChild(std::string name, std::shared_ptr<FileNode> child);
   void removeChild(std::string_view name);
-  /// The bytes of a regular file, read at first call; `error` tells why there are none.
-  const FileContents& contents();
+  /// The bytes of a regular file, read at first call; nothing when they can't be read.
+  std::optional<Data> contents();
 
-  /// Whether the node stands for an item on disk, below a root or by itself.
-  bool isOnDisk() const { return parent_ || directory_ || !path_.empty(); }
-  bool contentsWereRead() const { return contentsRead_; }
+  /// Whether a regular file's bytes are held in memory.
+  bool isLoaded() const { return contentsWereRead_ && error_ == 0; }
+  bool isOnDisk() const { return !diskName_.empty(); }
+  /// What the look found that came before the bytes were read.
   const Stamp& stamp() const { return stamp_; }
-  /// The errno of an unreadable node.
-  int error() const { return error_; }
-  /// The directory on disk that holds the item under `diskName`; null for a root.
+  /// The directory on disk that holds a file or link under `diskName`. Without one, that name is a path.
   const std::shared_ptr<DiskDirectory>& parent() const { return parent_; }
   const std::string& diskName() const { return diskName_; }
   /// The directory on disk that a directory node stands for; null for one in memory.
-  const std::shared_ptr<DiskDirectory>& diskDirectory() const { return directory_; }
-  /// Opens the file on disk for reading; the caller looks at what it got.
-  Descriptor openOnDisk();
+  const std::shared_ptr<DiskDirectory>& diskDirectory() const;
   /// Looks at the item on disk as it is now; what the node knows stays.
   int lookAgain(struct stat& status);
-
-  std::optional<std::string> preferredName;
+  /// Opens the file on disk for reading, after a look that it is a regular one; none and errno otherwise.
+  Descriptor openOnDisk();
 
  private:
-  FileNode() = default;
+  struct Directory {
+    std::shared_ptr<DiskDirectory> onDisk;
+    Children children;
+    /// Whether `children` are all.
+    bool isListed = false;
+    /// Whether it could be opened for reading, once that was tried.
+    std::optional<bool> wasOpened;
+    /// Brothers tend to be of one kind: tells what the next child by name is taken for at first. A wrong
+    /// guess costs one more system call and nothing else.
+    bool expectsDirectories = false;
+  };
+
   static std::shared_ptr<FileNode> onDisk(std::shared_ptr<DiskDirectory> parent, std::string_view name);
   void look();
+  void becomeDirectory(std::shared_ptr<DiskDirectory> onDisk, std::optional<bool> wasOpened);
   std::shared_ptr<FileNode> lookUp(std::string_view name);
+  void readContents();
+  Descriptor openUnchecked();
 
   Kind kind_ = Kind::unknown;
-  bool listed_ = false;
-  bool contentsRead_ = false;
-  /// Whether the directory could be opened for reading, once that was tried.
-  std::optional<bool> opened_;
-  /// Brothers tend to be of one kind: tells what the next child by name is taken for at first. A wrong guess
-  /// costs one more system call and nothing else.
-  bool expectsDirectories_ = false;
+  bool contentsWereRead_ = false;
   int error_ = 0;
+  std::unique_ptr<std::string> preferredName_;
   std::shared_ptr<DiskDirectory> parent_;
   std::string diskName_;
-  std::string path_;  // of a file that is a root
-  std::shared_ptr<DiskDirectory> directory_;
-  Children children_;
-  FileContents contents_;
+  std::unique_ptr<Directory> directory_;  // of a directory node
   Stamp stamp_;
+  Data contents_;
 };
 
 }  // namespace MarletFoundation

@@ -38,7 +38,7 @@ class TreeWriter {
  public:
   TreeWriter(const AtomicReplacement& replacement, std::shared_ptr<DiskDirectory> target)
       : replacement_(replacement), target_(std::move(target)) {
-    if (::fstat(target_->descriptor(), &targetStatus_) != 0) throwPosix(errno, "");
+    if (::fstat(target_->descriptor(), &targetStatus_) != 0) throwPosix(errno, replacement.path());
     if (replacement.replacesDirectory()) original_ = DiskDirectory::root(replacement.openReplaced());
   }
 
@@ -69,8 +69,8 @@ class TreeWriter {
     std::shared_ptr<DiskDirectory> target, attributes;
   };
 
-  [[noreturn]] static void fail(int error, DiskDirectory& directory, const std::string& name = {}) {
-    throwPosix(error, directory.path() + name);
+  [[noreturn]] void fail(int error, const DiskDirectory& directory, const std::string& name = {}) const {
+    throwPosix(error, replacement_.path() + "/" + directory.path() + name);
   }
 
   void writeDirectory(const Job& job) {
@@ -123,7 +123,7 @@ class TreeWriter {
     struct stat status;
     if (!file.parent() || !isReplaced(file.parent()->rootDirectory())) return false;
     if (file.parent()->status(file.diskName().c_str(), status) != 0 || !S_ISREG(status.st_mode)) return false;
-    if (file.contentsWereRead() && FileNode::Stamp(status) != file.stamp()) return false;
+    if (file.isLoaded() && FileNode::Stamp(status) != file.stamp()) return false;
     const auto number = status.st_ino;
     if (::linkat(file.parent()->descriptor(), file.diskName().c_str(), target.descriptor(), name.c_str(),
                  0) != 0) {
@@ -151,9 +151,8 @@ class TreeWriter {
 
   void writeFile(const Job& job, const std::string& name, FileNode& file) {
     auto& target = *job.target;
-    const Descriptor source = file.isOnDisk() ? openRegularFile(file) : Descriptor();
-    const bool isLoaded = file.contentsWereRead() && file.contents().error == 0;
-    if (!source && !isLoaded) fail(errno, target, name);
+    const Descriptor source = file.isOnDisk() ? file.openOnDisk() : Descriptor();
+    if (!source && !file.isLoaded()) fail(errno, target, name);
     const Descriptor original = source ? Descriptor() : openOriginal(job, name);
     const int attributes = source ? source.get() : original.get();
     Descriptor written(::openat(target.descriptor(), name.c_str(),
@@ -161,8 +160,8 @@ class TreeWriter {
                                 attributes >= 0 ? 0600 : 0666));
     if (!written) fail(errno, target, name);
     if ((attributes >= 0 && copyAttributes(attributes, written.get()) != 0) ||
-        (isLoaded ? writeAll(written.get(), file.contents().data.view())
-                  : copyBytes(source.get(), written.get())) != 0 ||
+        (file.isLoaded() ? writeAll(written.get(), file.contents()->view())
+                         : copyBytes(source.get(), written.get())) != 0 ||
         ::fsync(written.get()) != 0) {
       fail(errno, target, name);
     }
@@ -176,7 +175,7 @@ class TreeWriter {
     return job.original->openFile(name.c_str());
   }
 
-  static void copyLink(DiskDirectory& target, const std::string& name, FileNode& link) {
+  void copyLink(DiskDirectory& target, const std::string& name, FileNode& link) {
     std::string text(static_cast<std::size_t>(PATH_MAX), '\0');
     const auto length =
         ::readlinkat(link.parent()->descriptor(), link.diskName().c_str(), text.data(), text.size() - 1);
@@ -198,20 +197,6 @@ class TreeWriter {
     }
   }
 
- public:
-  /// The file on disk, opened after a look that it is a regular one; none and errno otherwise.
-  static Descriptor openRegularFile(FileNode& file) {
-    struct stat status;
-    if (file.lookAgain(status) != 0) return Descriptor();
-    errno = EINVAL;
-    if (!S_ISREG(status.st_mode)) return Descriptor();
-    auto opened = file.openOnDisk();
-    if (!opened || ::fstat(opened.get(), &status) != 0) return Descriptor();
-    errno = EINVAL;
-    return S_ISREG(status.st_mode) ? std::move(opened) : Descriptor();
-  }
-
- private:
   const AtomicReplacement& replacement_;
   std::shared_ptr<DiskDirectory> target_;
   std::shared_ptr<DiskDirectory> original_;
@@ -223,13 +208,12 @@ class TreeWriter {
 };
 
 void writeRegularFile(AtomicReplacement& replacement, FileNode& file) {
-  const Descriptor source = file.isOnDisk() ? TreeWriter::openRegularFile(file) : Descriptor();
-  const bool isLoaded = file.contentsWereRead() && file.contents().error == 0;
-  if (!source && !isLoaded) throwPosix(errno, file.diskName());
+  const Descriptor source = file.isOnDisk() ? file.openOnDisk() : Descriptor();
+  if (!source && !file.isLoaded()) throwPosix(errno, replacement.path());
   const int target = replacement.makeFile();
   if ((source && !replacement.replacesFile() && copyAttributes(source.get(), target) != 0) ||
-      (isLoaded ? writeAll(target, file.contents().data.view()) : copyBytes(source.get(), target)) != 0) {
-    throwPosix(errno, file.diskName());
+      (file.isLoaded() ? writeAll(target, file.contents()->view()) : copyBytes(source.get(), target)) != 0) {
+    throwPosix(errno, replacement.path());
   }
 }
 
@@ -254,7 +238,8 @@ void FileWrapper::write(const URL& url) const {
   struct stat status;
   if (source && replacement.replaced() && ::fstat(source->descriptor(), &status) == 0 &&
       sameItem(status, *replacement.replaced())) {
-    source->setRoot(Descriptor(::fcntl(target->descriptor(), F_DUPFD_CLOEXEC, 0)));
+    Descriptor root(::fcntl(target->descriptor(), F_DUPFD_CLOEXEC, 0));
+    if (root) source->setRoot(std::move(root));
   }
 }
 

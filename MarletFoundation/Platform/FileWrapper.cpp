@@ -6,7 +6,7 @@
 namespace MarletFoundation {
 
 FileWrapper::FileWrapper(const URL& url) : node_(FileNode::atPath(systemPath(url))) {
-  node_->preferredName = url.lastPathComponent();
+  node_->setPreferredName(url.lastPathComponent());
 }
 
 FileWrapper FileWrapper::regularFile(Data contents) {
@@ -26,11 +26,7 @@ bool FileWrapper::isDirectory() const { return node_->kind() == FileNode::Kind::
 
 bool FileWrapper::isRegularFile() const { return node_->kind() == FileNode::Kind::regularFile; }
 
-std::optional<Data> FileWrapper::regularFileContents() const {
-  if (!isRegularFile()) return std::nullopt;
-  const auto& contents = node_->contents();
-  return contents.error == 0 ? std::optional(contents.data) : std::nullopt;
-}
+std::optional<Data> FileWrapper::regularFileContents() const { return node_->contents(); }
 
 bool FileWrapper::hasChildren() const { return node_->hasChildren(); }
 
@@ -50,12 +46,9 @@ std::optional<FileWrapper::Children> FileWrapper::fileWrappers() const {
   return wrappers;
 }
 
-std::optional<std::string> FileWrapper::preferredFilename() const {
-  if (node_->preferredName) return node_->preferredName;
-  return node_->diskName().empty() ? std::nullopt : std::optional(node_->diskName());
-}
+std::optional<std::string> FileWrapper::preferredFilename() const { return node_->preferredName(); }
 
-void FileWrapper::setPreferredFilename(std::string name) { node_->preferredName = std::move(name); }
+void FileWrapper::setPreferredFilename(std::string name) { node_->setPreferredName(std::move(name)); }
 
 void FileWrapper::addFileWrapper(FileWrapper child) {
   if (!isDirectory()) fatalError("A file wrapper that isn't a directory takes no children.");

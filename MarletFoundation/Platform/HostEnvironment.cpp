@@ -9,6 +9,7 @@
 #include <forward_list>
 #include <mutex>
 
+#include "MarletFoundation/Platform/Descriptor.h"
 #include "MarletFoundation/Platform/Error.h"
 #include "MarletFoundation/Platform/FileManager.h"
 #include "MarletFoundation/Platform/Text.h"
@@ -36,8 +37,8 @@ bool isDirectory(const URL& url) {
   }
 }
 
-/// The resources of an installed library lie in the prefix that it was installed to, one or, where the
-/// system has a directory for each architecture, two directories up.
+/// The resources of an installed library lie in the prefix that it was installed to, one or, where the system
+/// has a directory for each architecture, two directories up.
 std::optional<URL> installedResources() {
   Dl_info library{};
   if (!::dladdr(reinterpret_cast<const void*>(&installedResources), &library) || !library.dli_fname) {
@@ -59,11 +60,6 @@ std::optional<URL> findResources() {
   if (auto installed = installedResources()) return installed;
   if (auto built = URL::file(MARLET_BUILD_RESOURCES, true); isDirectory(built)) return built;
   return std::nullopt;
-}
-
-bool isFileName(std::string_view name) {
-  return !name.empty() && name != "." && name != ".." &&
-         name.find_first_of(std::string_view("/\0", 2)) == std::string_view::npos;
 }
 
 std::optional<std::int64_t> userDefaultFromEnvironment(std::string_view key) {

@@ -22,7 +22,9 @@ TEST(Version, ParsesDottedIntegersOnly) {
   for (const auto& c : cases) {
     const auto version = Version::fromString(c.text);
     ASSERT_EQ(version.has_value(), c.printed != nullptr) << c.text;
-    if (version) EXPECT_EQ(version->versionString(), c.printed);
+    if (version) {
+      EXPECT_EQ(version->versionString(), c.printed);
+    }
   }
   EXPECT_EQ(Version({7}).minorVersion(), std::nullopt);
   EXPECT_EQ(Version({7, 8, 9}).patchVersion(), 9);

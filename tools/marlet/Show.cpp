@@ -53,7 +53,7 @@ ordered_json json(const MarletBookSnapshot& book) {
           {"target", {{"identifier", book.target->identifier}, {"targetOS", book.target->targetOS}}},
           {"imageReference", orNull(book.imageReference)},
           {"chapters", std::move(chapters)},
-          {"keyValueStore", json(PropertyListValue(book.keyValueStore.contents()))}};
+          {"keyValueStore", ::json(PropertyListValue(book.keyValueStore.contents()))}};
 }
 
 void printTree(const MarletBookSnapshot& book, const Terminal& terminal) {

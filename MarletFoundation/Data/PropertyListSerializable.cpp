@@ -1,0 +1,32 @@
+#include "MarletFoundation/Data/PropertyListSerializable.h"
+
+#include "MarletFoundation/Data/PropertyListValueBuilder.h"
+#include "MarletFoundation/Data/PropertyListWriters.h"
+
+namespace MarletFoundation {
+
+PropertyListValue PropertyListSerialization::read(const Data& data) {
+  PropertyListValueBuilder builder;
+  readPropertyList(data, builder);
+  return builder.take();
+}
+
+Data PropertyListSerialization::write(const PropertyListValue& value, PropertyListFormat format) {
+  return Data(format == PropertyListFormat::xml ? xmlPropertyList(value) : binaryPropertyList(value));
+}
+
+Data propertyListData(const PropertyListValue& value, PropertyListFormat format, int) {
+  try {
+    return PropertyListSerialization::write(value, format);
+  } catch (const ErrorObject& error) {
+    fatalError("A property-list value could not be written: " + error.localizedDescription());
+  }
+}
+
+PropertyListValue convertiblePropertyListValue(const PropertyListObjectPointer& object) {
+  auto value = propertyListValue(object);
+  if (!value) fatalError("An object that is no property-list value was given to be converted.");
+  return std::move(*value);
+}
+
+}  // namespace MarletFoundation

@@ -1,0 +1,198 @@
+#include "MarletFoundation/Data/PropertyListValue.h"
+
+#include <algorithm>
+
+#include "MarletFoundation/Platform/Text.h"
+
+namespace MarletFoundation {
+namespace {
+
+using Array = PropertyListValue::Array;
+using Dictionary = PropertyListValue::Dictionary;
+using Entry = PropertyListDictionary::Entry;
+
+// How deep destructors may follow a value on the stack. What lies deeper waits for the outermost one.
+constexpr int clearDepthLimit = 64;
+thread_local int clearDepth = 0;
+thread_local std::vector<PropertyListValue>* waiting = nullptr;
+
+bool isContainer(const PropertyListValue& value) { return value.payload.index() < 2; }
+
+bool equalScalars(const PropertyListValue& a, const PropertyListValue& b) {
+  switch (a.payload.index()) {
+    case 2:
+      return *a.string() == *b.string();
+    case 3:
+      return *a.data() == *b.data();
+    case 4:
+      return *a.date() == *b.date();
+    case 5:
+      return *a.integer() == *b.integer();
+    case 6:
+      return *a.floatingPoint() == *b.floatingPoint();
+    default:
+      return *a.boolean() == *b.boolean();
+  }
+}
+
+}  // namespace
+
+PropertyListDictionary::PropertyListDictionary(
+    std::initializer_list<std::pair<std::string_view, PropertyListValue>> entries) {
+  entries_.reserve(entries.size());
+  for (const auto& [key, value] : entries) entries_.push_back({PropertyListKey(key), value});
+  sortEntries();
+}
+
+PropertyListDictionary::PropertyListDictionary(Entries entries) : entries_(std::move(entries)) {
+  sortEntries();
+}
+
+void PropertyListDictionary::sortEntries() {
+  const auto notAscending = [](const Entry& a, const Entry& b) { return a.key.view() >= b.key.view(); };
+  if (std::adjacent_find(entries_.begin(), entries_.end(), notAscending) == entries_.end()) return;
+  std::stable_sort(entries_.begin(), entries_.end(),
+                   [](const Entry& a, const Entry& b) { return a.key.view() < b.key.view(); });
+  // Of equal keys the last stays: walking backwards, unique keeps the first that it meets.
+  const auto sameKey = [](const Entry& a, const Entry& b) { return a.key.view() == b.key.view(); };
+  const auto kept = std::unique(entries_.rbegin(), entries_.rend(), sameKey);
+  entries_.erase(entries_.begin(), kept.base());
+}
+
+const PropertyListValue* PropertyListDictionary::find(std::string_view key) const {
+  const auto found = std::lower_bound(entries_.begin(), entries_.end(), key,
+                                      [](const Entry& e, std::string_view k) { return e.key.view() < k; });
+  return found != entries_.end() && found->key.view() == key ? &found->value : nullptr;
+}
+
+PropertyListValue* PropertyListDictionary::find(std::string_view key) {
+  return const_cast<PropertyListValue*>(std::as_const(*this).find(key));
+}
+
+PropertyListValue& PropertyListDictionary::operator[](std::string_view key) {
+  const auto place = std::lower_bound(entries_.begin(), entries_.end(), key,
+                                      [](const Entry& e, std::string_view k) { return e.key.view() < k; });
+  if (place != entries_.end() && place->key.view() == key) return place->value;
+  return entries_.insert(place, {PropertyListKey(key), PropertyListValue()})->value;
+}
+
+bool PropertyListDictionary::erase(std::string_view key) {
+  auto* const value = find(key);
+  if (!value) return false;
+  entries_.erase(std::find_if(entries_.begin(), entries_.end(),
+                              [value](const Entry& entry) { return &entry.value == value; }));
+  return true;
+}
+
+bool PropertyListDictionary::operator==(const PropertyListDictionary& other) const {
+  return std::equal(
+      entries_.begin(), entries_.end(), other.entries_.begin(), other.entries_.end(),
+      [](const Entry& a, const Entry& b) { return a.key.view() == b.key.view() && a.value == b.value; });
+}
+
+PropertyListValue::PropertyListValue(Array value) : payload(std::move(value)) {}
+PropertyListValue::PropertyListValue(Dictionary value) : payload(std::move(value)) {}
+
+PropertyListValue::PropertyListValue(const PropertyListValue& other) {
+  if (!isContainer(other)) {
+    payload = other.payload;
+    return;
+  }
+  // Each container is given its final room before it is filled, so the places to be filled stay where they
+  // are.
+  std::vector<std::pair<const PropertyListValue*, PropertyListValue*>> open{{&other, this}};
+  const auto copyChild = [&open](const PropertyListValue& child, PropertyListValue& place) {
+    if (isContainer(child)) {
+      open.emplace_back(&child, &place);
+    } else {
+      place.payload = child.payload;
+    }
+  };
+  while (!open.empty()) {
+    const auto [source, target] = open.back();
+    open.pop_back();
+    if (const auto* from = source->array()) {
+      auto& to = target->payload.emplace<Array>(from->size());
+      for (std::size_t i = 0; i < from->size(); ++i) copyChild((*from)[i], to[i]);
+    } else {
+      auto& to = target->payload.emplace<Dictionary>().entries_;
+      to.reserve(source->dictionary()->size());
+      for (const auto& entry : *source->dictionary())
+        copyChild(entry.value, to.emplace_back(Entry{entry.key, {}}).value);
+    }
+  }
+}
+
+PropertyListValue& PropertyListValue::operator=(const PropertyListValue& other) {
+  return *this = PropertyListValue(other);
+}
+
+PropertyListValue& PropertyListValue::operator=(PropertyListValue&& other) noexcept {
+  // `other` may lie within this value, which therefore lives until the end.
+  const PropertyListValue old(std::move(*this));
+  payload = std::move(other.payload);
+  return *this;
+}
+
+void PropertyListValue::clearContainer() noexcept {
+  auto* const array = std::get_if<Array>(&payload);
+  auto* const dictionary = std::get_if<Dictionary>(&payload);
+  if (array ? array->empty() : dictionary->empty()) return;
+  if (clearDepth == clearDepthLimit) {
+    waiting->push_back(std::move(*this));
+    return;
+  }
+  const auto clear = [array, dictionary] {
+    ++clearDepth;
+    if (array) {
+      array->clear();
+    } else {
+      dictionary->entries_.clear();
+    }
+    --clearDepth;
+  };
+  if (clearDepth > 0) return clear();
+  std::vector<PropertyListValue> deeper;
+  waiting = &deeper;
+  clear();
+  while (!deeper.empty()) {
+    ++clearDepth;
+    {
+      const auto next = std::move(deeper.back());
+      deeper.pop_back();
+    }
+    --clearDepth;
+  }
+}
+
+bool PropertyListValue::operator==(const PropertyListValue& other) const {
+  std::vector<std::pair<const PropertyListValue*, const PropertyListValue*>> open;
+  const auto differ = [&open](const PropertyListValue& a, const PropertyListValue& b) {
+    if (a.payload.index() != b.payload.index()) return true;
+    if (!isContainer(a)) return !equalScalars(a, b);
+    open.emplace_back(&a, &b);
+    return false;
+  };
+  if (differ(*this, other)) return false;
+  while (!open.empty()) {
+    const auto [a, b] = open.back();
+    open.pop_back();
+    if (const auto* first = a->array()) {
+      const auto* second = b->array();
+      if (first->size() != second->size()) return false;
+      for (std::size_t i = 0; i < first->size(); ++i) {
+        if (differ((*first)[i], (*second)[i])) return false;
+      }
+    } else {
+      if (a->dictionary()->size() != b->dictionary()->size()) return false;
+      auto theirs = b->dictionary()->begin();
+      for (const auto& entry : *a->dictionary()) {
+        if (entry.key.view() != theirs->key.view() || differ(entry.value, theirs->value)) return false;
+        ++theirs;
+      }
+    }
+  }
+  return true;
+}
+
+}  // namespace MarletFoundation

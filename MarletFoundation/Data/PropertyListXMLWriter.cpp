@@ -1,0 +1,137 @@
+#include "MarletFoundation/Data/PropertyListWriters.h"
+#include "MarletFoundation/Platform/PropertyListError.h"
+#include "MarletFoundation/Platform/PropertyListEvents.h"
+#include "MarletFoundation/Platform/PropertyListScalars.h"
+#include "MarletFoundation/Platform/PropertyListText.h"
+#include "MarletFoundation/Platform/Text.h"
+
+namespace MarletFoundation {
+namespace {
+
+using enum PropertyListErrorCode;
+
+class XMLWriter {
+ public:
+  std::string write(const PropertyListValue& value) {
+    text_ = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<plist version=\"1.0\">\n";
+    writeValue(value);
+    text_ += "</plist>\n";
+    return std::move(text_);
+  }
+
+ private:
+  void writeValue(const PropertyListValue& value);
+  void writeArray(const PropertyListValue::Array& array);
+  void writeDictionary(const PropertyListDictionary& dictionary);
+  void writeText(std::string_view text);
+  void open();
+  void close();
+  void indent() { text_.append(depth_, '\t'); }
+
+  std::string text_;
+  std::size_t depth_ = 0;
+};
+
+void XMLWriter::writeValue(const PropertyListValue& value) {
+  indent();
+  if (const auto* string = value.string()) {
+    text_ += "<string>";
+    writeText(*string);
+    text_ += "</string>\n";
+  } else if (const auto* integer = value.integer()) {
+    text_ += "<integer>";
+    PropertyListScalars::appendInteger(text_, *integer);
+    text_ += "</integer>\n";
+  } else if (const auto* real = value.floatingPoint()) {
+    text_ += "<real>";
+    PropertyListScalars::appendReal(text_, *real);
+    text_ += "</real>\n";
+  } else if (const auto* boolean = value.boolean()) {
+    text_ += *boolean ? "<true/>\n" : "<false/>\n";
+  } else if (const auto* date = value.date()) {
+    text_ += "<date>";
+    if (!PropertyListScalars::appendDate(text_, *date))
+      throw propertyListError(unwritableDate, "XML has a form for the years 0 to 9999 only");
+    text_ += "</date>\n";
+  } else if (const auto* data = value.data()) {
+    text_ += "<data>";
+    PropertyListScalars::appendBase64(text_, data->view());
+    text_ += "</data>\n";
+  } else if (const auto* array = value.array()) {
+    writeArray(*array);
+  } else {
+    writeDictionary(*value.dictionary());
+  }
+}
+
+void XMLWriter::writeArray(const PropertyListValue::Array& array) {
+  open();
+  if (array.empty()) {
+    text_ += "<array/>\n";
+  } else {
+    text_ += "<array>\n";
+    for (const auto& child : array) writeValue(child);
+  }
+  close();
+  if (array.empty()) return;
+  indent();
+  text_ += "</array>\n";
+}
+
+void XMLWriter::writeDictionary(const PropertyListDictionary& dictionary) {
+  open();
+  if (dictionary.empty()) {
+    text_ += "<dict/>\n";
+  } else {
+    text_ += "<dict>\n";
+    for (const auto& [key, child] : dictionary) {
+      indent();
+      text_ += "<key>";
+      writeText(key);
+      text_ += "</key>\n";
+      writeValue(child);
+    }
+  }
+  close();
+  if (dictionary.empty()) return;
+  indent();
+  text_ += "</dict>\n";
+}
+
+void XMLWriter::open() {
+  if (depth_++ == PropertyListDepthLimit) throw propertyListError(tooDeep);
+}
+
+void XMLWriter::close() { --depth_; }
+
+void XMLWriter::writeText(std::string_view text) {
+  if (PropertyListText::findInvalidUTF8(text) != PropertyListText::npos)
+    throw propertyListError(unwritableText, "it is not valid UTF-8");
+  if (PropertyListText::findInvalidXMLCharacter(text) != PropertyListText::npos)
+    throw propertyListError(unwritableText, "XML has no form for a character in " + quoted(text));
+  while (true) {
+    const auto special = text.find_first_of("&<>\r");
+    text_ += text.substr(0, special);
+    if (special == std::string_view::npos) return;
+    switch (text[special]) {
+      case '&':
+        text_ += "&amp;";
+        break;
+      case '<':
+        text_ += "&lt;";
+        break;
+      case '>':
+        text_ += "&gt;";
+        break;
+      default:
+        text_ += "&#13;";
+    }
+    text.remove_prefix(special + 1);
+  }
+}
+
+}  // namespace
+
+std::string xmlPropertyList(const PropertyListValue& value) { return XMLWriter().write(value); }
+
+}  // namespace MarletFoundation

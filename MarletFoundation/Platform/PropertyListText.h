@@ -1,0 +1,32 @@
+#pragma once
+
+#include <cstdint>
+#include <cstring>
+#include <string>
+#include <string_view>
+
+/// The scans of text that the property-list readers and writers share.
+namespace MarletFoundation::PropertyListText {
+
+inline constexpr std::size_t npos = std::string_view::npos;
+
+/// Offset of the first byte over 0x7F, or `npos`.
+std::size_t findNonASCII(std::string_view text);
+/// Offset of the first ill-formed sequence, or `npos`.
+std::size_t findInvalidUTF8(std::string_view text);
+/// Offset of the first character that XML has none of (most controls, U+FFFE, U+FFFF), or `npos`. The text is
+/// valid UTF-8.
+std::size_t findInvalidXMLCharacter(std::string_view text);
+
+/// Whether XML can carry the character.
+bool isXMLCharacter(char32_t character);
+void appendUTF8(std::string& text, char32_t character);
+
+/// The UTF-8 form of 16-bit units, the bytes of each in the given order; nothing is appended from an unpaired
+/// surrogate on. Gives the number of bytes that were read: all of them when the text is valid.
+std::size_t appendUTF8FromUTF16(std::string& text, std::string_view bytes, bool bigEndian);
+
+/// The character at `place` of valid UTF-8; moves `place` behind it.
+char32_t nextCharacter(std::string_view text, std::size_t& place);
+
+}  // namespace MarletFoundation::PropertyListText
