@@ -143,11 +143,11 @@ TEST(DispatchQueue, ValuesFollowTheTargetOfTheInnermostQueue) {
   const DispatchQueue queue("values", Kind::serial, DispatchQuality::background), plain("plain");
   const auto current = [] { return DispatchQueue::currentSpecific(key); };
 
-  background.setSpecific(key, std::optional(1));
+  background.setSpecific(key, 1);
   EXPECT_EQ(current(), std::nullopt) << "outside of blocks";
   EXPECT_EQ(queue.getSpecific(key), std::nullopt) << "a queue's own value only";
   EXPECT_EQ(queue.sync(current), 1);
-  queue.setSpecific(key, std::optional(2));
+  queue.setSpecific(key, 2);
   EXPECT_EQ(queue.sync(current), 2);
   EXPECT_EQ(queue.sync([&] { return plain.sync(current); }), std::nullopt);
   EXPECT_EQ(queue.sync([&] {
@@ -162,9 +162,9 @@ TEST(DispatchQueue, ValuesFollowTheTargetOfTheInnermostQueue) {
     done.set();
   });
   EXPECT_TRUE(done.wait());
-  queue.setSpecific(key, std::optional<int>());
+  queue.setSpecific(key, std::nullopt);
   EXPECT_EQ(queue.sync(current), 1);
-  background.setSpecific(key, std::optional<int>());
+  background.setSpecific(key, std::nullopt);
 }
 
 TEST(DispatchQueue, PoolThreadsThatAllWaitForQueuesDontStarveTheirBlocks) {
