@@ -18,6 +18,8 @@ struct ErrorRow {
   std::string_view recoverySuggestion = {};
   /// Empty where the table's description holds.
   std::string_view description = {};
+  /// The error code where it isn't the case's index.
+  std::optional<int> code = {};
 };
 
 /// All cases of an error type in their stated order.
@@ -43,7 +45,7 @@ MARLET_EXPORT UserVisibleErrorContents errorContents(const ErrorTable& table, co
                                                      const ErrorPayload& payload);
 
 /// What plain and user-visible case errors share. `errorTable(Case)`, declared beside the enumeration, gives
-/// the names and words; a code is the case's index.
+/// the names and words; a code is the case's index, unless its row states another.
 template <class Derived, class CaseType, class Base>
 class MARLET_EXPORT BasicCaseError : public Base, public ErrorPayload {
  public:
@@ -60,7 +62,7 @@ class MARLET_EXPORT BasicCaseError : public Base, public ErrorPayload {
   const ErrorRow& row() const { return errorTable(kind).rows[static_cast<std::size_t>(kind)]; }
 
   std::string_view domain() const override { return errorDomain(); }
-  int code() const override { return static_cast<int>(kind); }
+  int code() const override { return row().code.value_or(static_cast<int>(kind)); }
   std::string_view caseName() const override { return row().name; }
   std::string description() const override { return errorDescription(row(), *this); }
   ErrorPointer underlyingError() const override { return error; }

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <concepts>
 #include <functional>
 #include <optional>
 #include <type_traits>
@@ -24,8 +23,6 @@ class Either {
 
   Either(Left left) : payload_(std::move(left)) {}
   Either(Right right) : payload_(std::move(right)) {}
-  explicit Either(L value) requires(!std::same_as<L, R>) : Either(Left{std::move(value)}) {}
-  explicit Either(R value) requires(!std::same_as<L, R>) : Either(Right{std::move(value)}) {}
 
   static Either left(L value) { return Left{std::move(value)}; }
   static Either right(R value) { return Right{std::move(value)}; }

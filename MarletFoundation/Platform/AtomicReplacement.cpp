@@ -43,6 +43,7 @@ constexpr std::string_view DisplacedSuffix = "displaced";
 AtomicReplacement::AtomicReplacement(std::string path) : path_(std::move(path)) {
   findDestination();
   prefix_ = prefixFor(name_);
+  if (!replaced_) undoHalfReplacement();
   clearLeftovers();
 }
 
@@ -78,21 +79,25 @@ void AtomicReplacement::findDestination() {
   }
 }
 
+void AtomicReplacement::undoHalfReplacement() {
+  const auto displaced = prefix_ + std::string(DisplacedSuffix);
+  if (::renameat2(parent_.get(), displaced.c_str(), parent_.get(), name_.c_str(), RENAME_NOREPLACE) != 0 &&
+      (errno != EINVAL || ::renameat(parent_.get(), displaced.c_str(), parent_.get(), name_.c_str()) != 0)) {
+    return;
+  }
+  findDestination();
+}
+
 void AtomicReplacement::clearLeftovers() {
-  const Descriptor listed(::openat(parent_.get(), ".", DirectoryFlags));
-  if (!listed) return;
-  const auto entries = DiskDirectory::root(Descriptor(::dup(listed.get())))->entries();
+  const auto entries =
+      DiskDirectory::root(Descriptor(::openat(parent_.get(), ".", DirectoryFlags)))->entries();
   if (!entries) return;
   for (const auto& entry : *entries) {
     if (!entry.name.starts_with(prefix_)) continue;
-    if (entry.name == prefix_ + std::string(DisplacedSuffix)) {
-      if (replaced_) removeTree(parent_.get(), entry.name);
-      continue;
-    }
-    // Whoever is still building holds a lock on it.
     struct stat status;
     if (::fstatat(parent_.get(), entry.name.c_str(), &status, AT_SYMLINK_NOFOLLOW) != 0) continue;
     if (!S_ISREG(status.st_mode) && !S_ISDIR(status.st_mode)) continue;
+    // Whoever is still building holds a lock on it.
     const Descriptor left(::openat(parent_.get(), entry.name.c_str(), ReadingFlags | O_NOFOLLOW));
     if (left && ::flock(left.get(), LOCK_EX | LOCK_NB) == 0) removeTree(parent_.get(), entry.name);
   }
@@ -106,28 +111,43 @@ Descriptor AtomicReplacement::openReplaced() const {
 }
 
 int AtomicReplacement::makeFile() {
-  const auto name = prefix_ + randomUUIDString();
   const mode_t mode = replacesFile() ? 0600 : 0666;
-  start(name, Descriptor(::openat(parent_.get(), name.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, mode)));
+  start([&] {
+    return Descriptor(::openat(parent_.get(), staging_.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, mode));
+  });
   if (replacesFile() && copyAttributes(openReplaced().get(), built_.get()) != 0) throwPosix(errno, path_);
   return built_.get();
 }
 
 std::shared_ptr<DiskDirectory> AtomicReplacement::makeDirectory(mode_t mode) {
-  const auto name = prefix_ + randomUUIDString();
-  if (::mkdirat(parent_.get(), name.c_str(), mode) != 0) throwPosix(errno, path_);
-  start(name, Descriptor(::openat(parent_.get(), name.c_str(), DirectoryFlags)));
+  start([&] {
+    if (::mkdirat(parent_.get(), staging_.c_str(), mode) != 0) return Descriptor();
+    return Descriptor(::openat(parent_.get(), staging_.c_str(), DirectoryFlags));
+  });
   Descriptor root(::fcntl(built_.get(), F_DUPFD_CLOEXEC, 0));
   if (!root) throwPosix(errno, path_);
   return DiskDirectory::root(std::move(root));
 }
 
-void AtomicReplacement::start(const std::string& name, Descriptor descriptor) {
-  if (!descriptor) throwPosix(errno, path_);
-  built_ = std::move(descriptor);
-  staging_ = name;
-  // Tells other writers that it isn't a leftover. Where there are no locks, they can't clear anything either.
-  ::flock(built_.get(), LOCK_EX | LOCK_NB);
+/// Makes the item under a new name and locks it. Another writer that comes in between takes it for a leftover
+/// and clears it away; then it is made again.
+template <class Make>
+void AtomicReplacement::start(Make make) {
+  for (int attempt = 0; attempt < MostAttempts; ++attempt) {
+    staging_ = prefix_ + randomUUIDString();
+    built_ = make();
+    if (!built_ && errno != ENOENT) break;
+    struct stat status;
+    // A file system without locks has none for the other writer, either, who then clears nothing.
+    if (built_ && (::flock(built_.get(), LOCK_EX | LOCK_NB) == 0 || errno != EWOULDBLOCK) &&
+        ::fstat(built_.get(), &status) == 0 && status.st_nlink > 0) {
+      return;
+    }
+  }
+  const int error = built_ ? EBUSY : errno;
+  removeTree(parent_.get(), staging_);
+  staging_.clear();
+  throwPosix(error, path_);
 }
 
 void AtomicReplacement::commit() {

@@ -22,6 +22,7 @@ class AtomicReplacement {
   AtomicReplacement(const AtomicReplacement&) = delete;
   AtomicReplacement& operator=(const AtomicReplacement&) = delete;
 
+  const std::string& path() const { return path_; }
   /// What the path named at the start.
   const std::optional<struct stat>& replaced() const { return replaced_; }
   bool replacesFile() const { return replaced_ && S_ISREG(replaced_->st_mode); }
@@ -37,14 +38,16 @@ class AtomicReplacement {
   /// Flushes what was started, puts it in place, flushes the directory, and removes the old item.
   void commit();
 
-  /// For an item that a replacement in two steps was cut off in between, where the old one lies now. Null
-  /// unless there is one.
+  /// Where the old item lies after a replacement in two steps that was cut off between them; nothing when
+  /// there was none.
   static std::optional<std::string> displacedPath(const std::string& path);
 
  private:
   void findDestination();
+  void undoHalfReplacement();
   void clearLeftovers();
-  void start(const std::string& name, Descriptor descriptor);
+  template <class Make>
+  void start(Make make);
   void putInPlace();
   void replaceInTwoSteps();
 

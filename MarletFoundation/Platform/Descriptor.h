@@ -3,6 +3,7 @@
 #include <fcntl.h>
 #include <sys/stat.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <optional>
 #include <string>
@@ -48,7 +49,7 @@ auto retrying(Call call) {
 /// Whether a directory can hold an entry of that name.
 inline bool isFileName(std::string_view name) {
   return !name.empty() && name != "." && name != ".." &&
-         name.find_first_of(std::string_view("/\0", 2)) == std::string_view::npos;
+         std::none_of(name.begin(), name.end(), [](char c) { return c == '/' || c == '\0'; });
 }
 
 /// How foreign files are opened: waiting for nobody, and never becoming anybody's terminal.

@@ -1,25 +1,16 @@
 #include "MarletFoundation/Platform/DispatchQueueCore.h"
 
-#include <utility>
-
 #include "MarletFoundation/Platform/Error.h"
 #include "MarletFoundation/Platform/FatalError.h"
 
 namespace MarletFoundation {
 namespace {
 
-thread_local DispatchQueueCore* currentQueue = nullptr;
-
 constexpr std::string_view uncaught = "an asynchronous block ended in an error: ";
 
 }  // namespace
 
-DispatchQueueCore* DispatchQueueCore::current() { return currentQueue; }
-
-DispatchQueueCore::Entered::Entered(DispatchQueueCore& queue)
-    : previous_(std::exchange(currentQueue, &queue)) {}
-
-DispatchQueueCore::Entered::~Entered() { currentQueue = previous_; }
+constinit thread_local DispatchQueueCore* DispatchQueueCore::current_ = nullptr;
 
 void DispatchQueueCore::runToEnd(std::function<void()>& block) {
   try {

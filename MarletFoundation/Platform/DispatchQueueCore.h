@@ -2,6 +2,7 @@
 
 #include <map>
 #include <mutex>
+#include <utility>
 
 #include "MarletFoundation/Platform/DispatchQueue.h"
 
@@ -25,7 +26,7 @@ class DispatchQueueCore {
   std::any value(const void* key) const;
 
   /// The queue of the block that this thread runs, or null.
-  static DispatchQueueCore* current();
+  static DispatchQueueCore* current() { return current_; }
 
   const std::string label;
   DispatchQueueCore* const target;
@@ -34,8 +35,8 @@ class DispatchQueueCore {
   /// Makes a queue the current one for as long as its block runs.
   class Entered {
    public:
-    explicit Entered(DispatchQueueCore& queue);
-    ~Entered();
+    explicit Entered(DispatchQueueCore& queue) : previous_(std::exchange(current_, &queue)) {}
+    ~Entered() { current_ = previous_; }
     Entered(const Entered&) = delete;
     Entered& operator=(const Entered&) = delete;
 
@@ -47,6 +48,9 @@ class DispatchQueueCore {
   static void runToEnd(std::function<void()>& block);
 
  private:
+  // A part of every synchronous submission: this model saves two calls of the dynamic linker.
+  [[gnu::tls_model("initial-exec")]] static constinit thread_local DispatchQueueCore* current_;
+
   mutable std::mutex valuesMutex_;
   std::map<const void*, std::any> values_;
 };

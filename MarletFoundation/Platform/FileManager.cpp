@@ -32,14 +32,12 @@ Relationship relationship(const URL& directory, const URL& item) {
   const std::unique_ptr<char, decltype(&std::free)> real(::realpath(itemPath.c_str(), nullptr), &std::free);
   if (!real) throwPosix(errno, itemPath);
   auto relationship = Relationship::same;
-  for (std::string path = real.get(); !path.empty(); path.resize(path == "/" ? 0 : path.rfind('/'))) {
+  for (std::string path = real.get();; relationship = Relationship::contains) {
     const auto status = statusOf(path);
     if (status.st_dev == wanted.st_dev && status.st_ino == wanted.st_ino) return relationship;
-    relationship = Relationship::contains;
+    if (path == "/") return Relationship::other;
+    path.resize(std::max<std::size_t>(path.rfind('/'), 1));
   }
-  const auto root = statusOf("/");
-  const bool isRoot = root.st_dev == wanted.st_dev && root.st_ino == wanted.st_ino;
-  return isRoot ? relationship : Relationship::other;
 }
 
 bool fileExists(const URL& url) {

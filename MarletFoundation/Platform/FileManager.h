@@ -21,16 +21,18 @@ MARLET_EXPORT Relationship relationship(const URL& directory, const URL& item);
 MARLET_EXPORT bool fileExists(const URL& url);
 /// Whether the URL names a directory, links followed; throws when it can't be told.
 MARLET_EXPORT bool isDirectory(const URL& url);
-/// Whether the resource can be reached; throws when it can't be told why not, or why not is an error.
+/// True when something can be reached at the URL, links followed; throws what stands against it otherwise.
 MARLET_EXPORT bool resourceIsReachable(const URL& url);
 
-/// The names in a directory, sorted, hidden ones (leading dot) left out if asked.
+/// The names in a directory, sorted by their bytes, hidden ones (leading dot) left out if asked.
 MARLET_EXPORT std::vector<std::string> contentsOfDirectory(const URL& url, bool skipHidden);
 
-/// Reads a whole regular file; pipes and devices are refused (EINVAL), never waited for.
+/// Reads a whole regular file, links followed; pipes and devices are refused (EINVAL) and never opened, and
+/// what has more than 1 GiB is, too (EFBIG).
 MARLET_EXPORT Data readFile(const URL& url);
 /// Replaces or makes the file as a whole: sibling temporary file, flush, rename, flush of the directory. Mode
-/// and extended attributes of a replaced file stay. Leaves nothing behind when it throws.
+/// and extended attributes of a replaced file stay; a symbolic link stays and what it points to is replaced.
+/// Only regular files are (EISDIR, EINVAL). Leaves nothing behind when it throws.
 MARLET_EXPORT void writeFileAtomically(const URL& url, const Data& contents);
 
 }  // namespace MarletFoundation::FileManager

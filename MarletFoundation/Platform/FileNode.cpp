@@ -4,6 +4,8 @@
 
 #include <vector>
 
+#include "MarletFoundation/Platform/AtomicReplacement.h"
+
 namespace MarletFoundation {
 namespace {
 
@@ -52,9 +54,14 @@ std::shared_ptr<FileNode> FileNode::onDisk(std::shared_ptr<DiskDirectory> parent
 std::shared_ptr<FileNode> FileNode::atPath(const std::string& path) {
   auto node = onDisk(nullptr, path);
   node->look();
-  if (node->kind_ == Kind::unreadable) throwPosix(node->error_, path);
+  if (node->kind_ == Kind::unreadable) {
+    const auto displaced = node->error_ == ENOENT ? AtomicReplacement::displacedPath(path) : std::nullopt;
+    if (!displaced) throwPosix(node->error_, path);
+    node = onDisk(nullptr, *displaced);
+    node->look();
+  }
   if (node->kind_ == Kind::directory) {
-    Descriptor root(retrying([&] { return ::open(path.c_str(), DirectoryFlags & ~O_NOFOLLOW); }));
+    Descriptor root(retrying([&] { return ::open(node->diskName_.c_str(), DirectoryFlags & ~O_NOFOLLOW); }));
     if (!root) throwPosix(errno, path);
     node->becomeDirectory(DiskDirectory::root(std::move(root)), true);
   } else if (node->kind_ == Kind::regularFile && !node->openUnchecked()) {

@@ -38,7 +38,7 @@ class TreeWriter {
  public:
   TreeWriter(const AtomicReplacement& replacement, std::shared_ptr<DiskDirectory> target)
       : replacement_(replacement), target_(std::move(target)) {
-    if (::fstat(target_->descriptor(), &targetStatus_) != 0) throwPosix(errno, "");
+    if (::fstat(target_->descriptor(), &targetStatus_) != 0) throwPosix(errno, replacement.path());
     if (replacement.replacesDirectory()) original_ = DiskDirectory::root(replacement.openReplaced());
   }
 
@@ -55,9 +55,14 @@ class TreeWriter {
       }
     }
     finishDirectories();
+    if (flushes_ > MostSingleFlushes && ::syncfs(target_->descriptor()) != 0) fail(errno, *target_);
   }
 
  private:
+  /// Each flush waits for the disk. From some number on one flush of the whole file system is sooner done.
+  static constexpr int MostSingleFlushes = 64;
+  int flush(int descriptor) { return ++flushes_ > MostSingleFlushes ? 0 : ::fsync(descriptor); }
+
   struct Job {
     std::shared_ptr<FileNode> node;
     std::shared_ptr<DiskDirectory> target;
@@ -69,8 +74,8 @@ class TreeWriter {
     std::shared_ptr<DiskDirectory> target, attributes;
   };
 
-  [[noreturn]] static void fail(int error, DiskDirectory& directory, const std::string& name = {}) {
-    throwPosix(error, directory.path() + name);
+  [[noreturn]] void fail(int error, const DiskDirectory& directory, const std::string& name = {}) const {
+    throwPosix(error, replacement_.path() + "/" + directory.path() + name);
   }
 
   void writeDirectory(const Job& job) {
@@ -162,7 +167,7 @@ class TreeWriter {
     if ((attributes >= 0 && copyAttributes(attributes, written.get()) != 0) ||
         (file.isLoaded() ? writeAll(written.get(), file.contents()->view())
                          : copyBytes(source.get(), written.get())) != 0 ||
-        ::fsync(written.get()) != 0) {
+        flush(written.get()) != 0) {
       fail(errno, target, name);
     }
   }
@@ -175,7 +180,7 @@ class TreeWriter {
     return job.original->openFile(name.c_str());
   }
 
-  static void copyLink(DiskDirectory& target, const std::string& name, FileNode& link) {
+  void copyLink(DiskDirectory& target, const std::string& name, FileNode& link) {
     std::string text(static_cast<std::size_t>(PATH_MAX), '\0');
     const auto length =
         ::readlinkat(link.parent()->descriptor(), link.diskName().c_str(), text.data(), text.size() - 1);
@@ -191,7 +196,7 @@ class TreeWriter {
       const auto& [target, attributes] = finishes_.back();
       const int number = target->descriptor();
       if (number < 0 || (attributes && copyAttributes(attributes->descriptor(), number) != 0) ||
-          ::fsync(number) != 0) {
+          flush(number) != 0) {
         fail(errno, *target);
       }
     }
@@ -205,15 +210,16 @@ class TreeWriter {
   std::set<const FileNode*> above_;
   std::vector<Finish> finishes_;
   std::map<const DiskDirectory*, bool> replacedRoots_;
+  int flushes_ = 0;
 };
 
 void writeRegularFile(AtomicReplacement& replacement, FileNode& file) {
   const Descriptor source = file.isOnDisk() ? file.openOnDisk() : Descriptor();
-  if (!source && !file.isLoaded()) throwPosix(errno, file.diskName());
+  if (!source && !file.isLoaded()) throwPosix(errno, replacement.path());
   const int target = replacement.makeFile();
   if ((source && !replacement.replacesFile() && copyAttributes(source.get(), target) != 0) ||
       (file.isLoaded() ? writeAll(target, file.contents()->view()) : copyBytes(source.get(), target)) != 0) {
-    throwPosix(errno, file.diskName());
+    throwPosix(errno, replacement.path());
   }
 }
 
@@ -238,7 +244,8 @@ void FileWrapper::write(const URL& url) const {
   struct stat status;
   if (source && replacement.replaced() && ::fstat(source->descriptor(), &status) == 0 &&
       sameItem(status, *replacement.replaced())) {
-    source->setRoot(Descriptor(::fcntl(target->descriptor(), F_DUPFD_CLOEXEC, 0)));
+    Descriptor root(::fcntl(target->descriptor(), F_DUPFD_CLOEXEC, 0));
+    if (root) source->setRoot(std::move(root));
   }
 }
 

@@ -19,7 +19,8 @@ class FileNode;
 /// whole directory is listed only when `fileWrappers` is asked for, and a file's bytes are read (never
 /// mapped) at first look. What was looked at once stays. Below the root no symbolic link is followed; links,
 /// pipes, sockets and devices are neither directory nor regular file, and nothing blocks on them. What can't
-/// be read shows as absent. One thread at a time may use a tree.
+/// be read shows as absent, a file of more than 1 GiB as without contents. One thread at a time may use a
+/// tree.
 class MARLET_EXPORT FileWrapper {
  public:
   using Children = std::map<std::string, FileWrapper, std::less<>>;
@@ -52,9 +53,12 @@ class MARLET_EXPORT FileWrapper {
   void removeFileWrapper(std::string_view name);
 
   /// Writes the tree to `url`, all of it or nothing: it is built in a sibling of `url`, flushed, and takes
-  /// the place of what was there. Throws an `ErrorObject` of the POSIX domain, also for a child whose name is
-  /// empty, ".", ".." or holds a slash or NUL (EINVAL), and for a node that couldn't be read or is of no
-  /// writable kind.
+  /// the place of what was there, or of what a symbolic link there points to. Unchanged files are shared with
+  /// the directory that is replaced, modes, extended attributes and symbolic links of a tree from disk stay,
+  /// and what is new takes the mode and attributes of what it replaces. Throws an `ErrorObject` of the POSIX
+  /// domain, also for a child whose name is empty, ".", ".." or holds a slash or NUL (EINVAL), for a
+  /// directory within itself (ELOOP, EINVAL), and for a node that couldn't be read or is of no writable kind
+  /// (EINVAL). A wrapper that was opened at `url` goes on in what was written.
   void write(const URL& url) const;
 
  private:

@@ -9,6 +9,7 @@
 #include <forward_list>
 #include <mutex>
 
+#include "MarletFoundation/Platform/Descriptor.h"
 #include "MarletFoundation/Platform/Error.h"
 #include "MarletFoundation/Platform/FileManager.h"
 #include "MarletFoundation/Platform/Text.h"
@@ -59,11 +60,6 @@ std::optional<URL> findResources() {
   if (auto installed = installedResources()) return installed;
   if (auto built = URL::file(MARLET_BUILD_RESOURCES, true); isDirectory(built)) return built;
   return std::nullopt;
-}
-
-bool isFileName(std::string_view name) {
-  return !name.empty() && name != "." && name != ".." &&
-         name.find_first_of(std::string_view("/\0", 2)) == std::string_view::npos;
 }
 
 std::optional<std::int64_t> userDefaultFromEnvironment(std::string_view key) {

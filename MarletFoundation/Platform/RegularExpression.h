@@ -19,9 +19,10 @@ class MARLET_EXPORT RegularExpression {
 
   /// The ranges of a match and of its capture groups; a group that took no part is at `NotFound`.
   using Match = std::vector<TextRange>;
-  /// The first match in `text`, ranges in UTF-16 units. Nothing also when the engine gives up (its stack is
-  /// bounded).
+  /// The first match in `text`, ranges in UTF-16 units. Nothing also when the engine gives up: its stack and
+  /// its steps are bounded, so that no text keeps it busy for more than about a second.
   std::optional<Match> firstMatch(std::u16string_view text) const;
+  /// All matches in their order; those found so far when the engine gives up.
   std::vector<Match> matches(std::u16string_view text) const;
 
  private:

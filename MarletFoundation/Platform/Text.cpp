@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <charconv>
+#include <cmath>
 #include <cstring>
 #include <limits>
 #include <memory>
@@ -228,13 +229,21 @@ std::optional<std::string> utf8FromUTF16(std::u16string_view text) { return utf8
 
 std::string utf8FromUTF16Lossy(std::u16string_view text) { return *utf8(text, Unpaired::replace); }
 
-bool isValidUTF8(std::string_view text) {
-  for (std::size_t i = asciiRunLength(text, 0); i < text.size(); i += asciiRunLength(text, i)) {
+bool isValidUTF8(std::string_view text) { return utf8PrefixLength(text) == text.size(); }
+
+std::size_t asciiPrefixLength(std::string_view text) { return asciiRunLength(text, 0); }
+
+std::size_t utf8PrefixLength(std::string_view text) {
+  for (std::size_t i = 0; i < text.size();) {
+    if (isASCII(text[i])) {
+      i += asciiRunLength(text, i);
+      continue;
+    }
     const auto scalar = decodeUTF8(text.substr(i));
-    if (!scalar.length) return false;
+    if (!scalar.length) return i;
     i += scalar.length;
   }
-  return true;
+  return text.size();
 }
 
 std::int64_t graphemeCount(std::string_view text) {
@@ -265,6 +274,14 @@ std::optional<std::int64_t> parseDecimalInteger(std::string_view text) {
   const auto result = std::from_chars(text.data(), text.data() + text.size(), value);
   if (result.ec != std::errc() || result.ptr != text.data() + text.size()) return std::nullopt;
   return value;
+}
+
+std::string shortestDecimal(double number) {
+  // The largest double has 309 digits in front of the point, the smallest 1074 places behind it.
+  char buffer[1100];
+  std::string text(buffer, std::to_chars(buffer, std::end(buffer), number, std::chars_format::fixed).ptr);
+  if (std::isfinite(number) && text.find('.') == std::string::npos) text += ".0";
+  return text;
 }
 
 std::vector<std::string_view> split(std::string_view text, char separator) {

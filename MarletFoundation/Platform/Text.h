@@ -15,6 +15,9 @@ namespace MarletFoundation {
 MARLET_EXPORT std::optional<std::u16string> utf16FromUTF8(std::string_view text);
 MARLET_EXPORT std::optional<std::string> utf8FromUTF16(std::u16string_view text);
 MARLET_EXPORT bool isValidUTF8(std::string_view text);
+/// Bytes in front of the first one that isn't ASCII, or that belongs to no well-formed UTF-8 character.
+MARLET_EXPORT std::size_t asciiPrefixLength(std::string_view text);
+MARLET_EXPORT std::size_t utf8PrefixLength(std::string_view text);
 
 /// Conversions for printing only: what is ill-formed becomes U+FFFD.
 MARLET_EXPORT std::string utf8FromUTF16Lossy(std::u16string_view text);
@@ -31,6 +34,10 @@ MARLET_EXPORT bool canonicallyEquivalent(std::string_view a, std::string_view b)
 
 /// A decimal integer: an optional sign, then ASCII digits and nothing else. Nothing when it doesn't fit.
 MARLET_EXPORT std::optional<std::int64_t> parseDecimalInteger(std::string_view text);
+
+/// The shortest decimal form that reads back as the same number, without an exponent and always with a point:
+/// `500000000.0`.
+MARLET_EXPORT std::string shortestDecimal(double number);
 
 /// The pieces between separators, as views into `text`; an empty text gives one empty piece.
 MARLET_EXPORT std::vector<std::string_view> split(std::string_view text, char separator);

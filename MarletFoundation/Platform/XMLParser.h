@@ -13,9 +13,14 @@ namespace MarletFoundation {
 /// The domain of what ends a parse.
 inline constexpr std::string_view XMLParserErrorDomain = "XMLParser";
 
-/// A streaming XML parser: calls its delegate as it goes. It opens no network connection and no file; a
-/// document that declares an entity, nests more than 256 elements, or declares an encoding other than UTF-8,
-/// UTF-16, ISO-8859-1, US-ASCII or windows-1252 fails to parse.
+/// A streaming XML parser: calls its delegate as it goes. It opens no network connection and no file. Names
+/// are taken as they stand, prefix included, and attribute values with their references replaced.
+///
+/// What is refused, besides ill-formed XML: a document that declares anything of a document type within
+/// itself (entities above all) or uses an entity that isn't XML's own, nests more than 256 elements, has more
+/// than 256 attributes on one, has different names of more than a megabyte together, or declares an encoding
+/// other than UTF-8, UTF-16, ISO-8859-1, US-ASCII or windows-1252. The delegate sees what stands in front of
+/// the refused place.
 class MARLET_EXPORT XMLParser {
  public:
   using Attributes = std::map<std::string, std::string, std::less<>>;
@@ -23,6 +28,9 @@ class MARLET_EXPORT XMLParser {
   class MARLET_EXPORT Delegate {
    public:
     virtual ~Delegate() = default;
+    virtual void didStartDocument(XMLParser&) {}
+    /// Only called when the whole document was read.
+    virtual void didEndDocument(XMLParser&) {}
     virtual void didStartElement(XMLParser&, const std::string& /*name*/, const Attributes&) {}
     virtual void didEndElement(XMLParser&, const std::string& /*name*/) {}
     virtual void foundCharacters(XMLParser&, std::string_view) {}
@@ -38,7 +46,8 @@ class MARLET_EXPORT XMLParser {
   bool parse();
   /// To be called from a delegate: no further callback comes, and `parse` answers false.
   void abortParsing() { aborted_ = true; }
-  /// What ended the last parse; nothing after a success. An abort has an error of its own.
+  /// What ended the last parse, with its line under `LineKey`; nothing after a success. An abort has an error
+  /// of its own.
   const std::optional<ErrorObject>& parserError() const { return error_; }
 
  private:

@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "DiffPack/Packs.h"
+#include "MarletFoundation/Platform/PropertyListError.h"
 
 namespace MarletFoundation::test {
 namespace {
@@ -8,14 +9,13 @@ namespace {
 const URL contentUrl = URL::file("/books/Loops.marletbook/Contents", true);
 const std::string notAPlist = "<plist><oops></plist>";
 
-/// What reading a tree comes to: the pack, or the error's words, behind its domain and code if they aren't a
-/// diff pack's own.
+/// What reading a tree comes to: the pack, or a diff pack error's words, or another error's domain.
 std::variant<DiffPackSnapshot, std::string> outcome(const FileWrapper& wrapper) {
   try {
     return DiffPackSnapshot(wrapper, contentUrl);
   } catch (const ErrorObject& error) {
     if (error.domain() == "Diff" && error.code() == 3) return error.localizedDescription();
-    return "other domain: " + std::string(error.domain());
+    return std::string(error.domain());
   }
 }
 
@@ -126,7 +126,7 @@ TEST(DiffPackReading, FailsInTheWordsOfEachCheck) {
       {good.without(delta), deltaWords("missing .delta file")},
       {good.without("Pages").with("Pages/image.png", std::string()), deltaWords("missing .delta file")},
       {withUpdates({{"Modified", A{entry("a", "Pages")}}}), deltaWords("missing .delta file", "Pages")},
-      {good.with(delta, notAPlist), "other domain: PropertyListErrorDomain"},
+      {good.with(delta, notAPlist), std::string(PropertyListErrorDomain)},
       {good.with(delta, PropertyListValue(A{})), deltaWords("invalid .delta file")},
       {good.withoutKey(delta, "Diff"), deltaWords("invalid .delta file")},
       {good.withKey(delta, "Diff", D{}), deltaWords("invalid .delta file")},
@@ -149,7 +149,7 @@ TEST(DiffPackReading, KeepsTheCauseOfABadManifest) {
     FAIL();
   } catch (const ErrorObject& error) {
     ASSERT_TRUE(error.underlyingError());
-    EXPECT_EQ(error.underlyingError()->domain(), "PropertyListErrorDomain");
+    EXPECT_EQ(error.underlyingError()->domain(), PropertyListErrorDomain);
   }
 }
 

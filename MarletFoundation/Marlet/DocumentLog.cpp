@@ -1,0 +1,10 @@
+#include "MarletFoundation/Marlet/DocumentLog.h"
+
+namespace MarletFoundation {
+
+const LogAspect& documentLogAspect() {
+  static const LogAspect aspect("MarletFoundation");
+  return aspect;
+}
+
+}  // namespace MarletFoundation
