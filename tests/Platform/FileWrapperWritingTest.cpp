@@ -21,6 +21,7 @@ namespace MarletFoundation::test {
 namespace {
 
 namespace fs = std::filesystem;
+using namespace std::string_literals;
 
 FileWrapper file(std::string_view name, std::string text) {
   auto wrapper = FileWrapper::regularFile(Data(std::move(text)));
@@ -54,7 +55,7 @@ ino_t number(const fs::path& path) {
 
 TEST(FileWrapperWriting, TakesThePlaceOfWhatWasThere) {
   const TemporaryDirectory directory;
-  const Tree tree{{"a/b", "1"}, {"empty/", ""}, {"c", ""}};
+  const Tree tree{{"a/b", "1"s}, {"empty/", ""s}, {"c", ""s}};
   const auto target = directory.path() / "book";
   fs::create_symlink("book", directory.path() / "link");
   for (const bool isThere : {false, true}) {
@@ -76,7 +77,7 @@ TEST(FileWrapperWriting, TakesThePlaceOfWhatWasThere) {
 
 TEST(FileWrapperWriting, KeepsWhatADocumentIsMadeOf) {
   const TemporaryDirectory directory;
-  Tree{{"book/same", "1"}, {"book/loaded", "2"}, {"book/new", "3"}, {"book/sub/x", "4"}}.writeTo(
+  Tree{{"book/same", "1"s}, {"book/loaded", "2"s}, {"book/new", "3"s}, {"book/sub/x", "4"s}}.writeTo(
       directory.path());
   const auto book = directory.path() / "book";
   fs::create_symlink("../nowhere", book / "link");
@@ -113,7 +114,7 @@ TEST(FileWrapperWriting, KeepsWhatADocumentIsMadeOf) {
 
 TEST(FileWrapperWriting, WritesWhatWasReadAndNotWhatCameAfter) {
   const TemporaryDirectory directory;
-  Tree{{"book/file", "1"}}.writeTo(directory.path());
+  Tree{{"book/file", "1"s}}.writeTo(directory.path());
   FileWrapper root(directory.url("book"));
   ASSERT_TRUE(root.child("file")->regularFileContents());
   std::ofstream(directory.path() / "book/file") << "2";
@@ -123,7 +124,7 @@ TEST(FileWrapperWriting, WritesWhatWasReadAndNotWhatCameAfter) {
 
 TEST(FileWrapperWriting, AFailureLeavesTheOldDocument) {
   const TemporaryDirectory directory;
-  Tree{{"book/a", "old"}, {"pipes/a", "new"}}.writeTo(directory.path());
+  Tree{{"book/a", "old"s}, {"pipes/a", "new"s}}.writeTo(directory.path());
   ASSERT_EQ(::mkfifo((directory.path() / "pipes/z").c_str(), 0600), 0);
   const auto failing = [](std::string_view badName) {
     auto sub = FileWrapper::directory();
@@ -222,7 +223,7 @@ TEST(FileWrapperWriting, SurvivesAWriterThatIsKilled) {
 
 TEST(FileWrapperWriting, RecoversFromAReplacementInTwoSteps) {
   const TemporaryDirectory directory;
-  Tree{{"book/file", "old"}}.writeTo(directory.path());
+  Tree{{"book/file", "old"s}}.writeTo(directory.path());
   MD5 digest;
   digest.update("book");
   std::string displaced = ".marlet-";
