@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 #include <rapidcheck/gtest.h>
 
+#include <cstdlib>
 #include <limits>
 
 #include "MarletFoundation/Platform/RegularExpression.h"
@@ -124,8 +125,8 @@ TEST(Text, printedForms) {
   EXPECT_EQ(optionalDescription(std::optional<std::string>("a\"\n")), "Optional(\"a\"\n\")");
   EXPECT_EQ(shortestDecimal(5e8), "500000000.0");
   EXPECT_EQ(shortestDecimal(-0.1), "-0.1");
-  EXPECT_EQ(std::stod(shortestDecimal(-5e-324)), -5e-324);
-  EXPECT_EQ(std::stod(shortestDecimal(1.7976931348623157e308)), 1.7976931348623157e308);
+  EXPECT_EQ(std::strtod(shortestDecimal(-5e-324).c_str(), nullptr), -5e-324);
+  EXPECT_EQ(std::strtod(shortestDecimal(1.7976931348623157e308).c_str(), nullptr), 1.7976931348623157e308);
   EXPECT_EQ(split("", '.'), std::vector<std::string_view>{""});
   EXPECT_EQ(split(".a.", '.'), (std::vector<std::string_view>{"", "a", ""}));
 }
