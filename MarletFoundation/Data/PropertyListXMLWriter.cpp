@@ -24,6 +24,8 @@ class XMLWriter {
   void writeArray(const PropertyListValue::Array& array);
   void writeDictionary(const PropertyListDictionary& dictionary);
   void writeText(std::string_view text);
+  static void checkText(std::string_view text);
+  void writeWithReferences(std::string_view text);
   void open();
   void close();
   void indent() { text_.append(depth_, '\t'); }
@@ -105,15 +107,29 @@ void XMLWriter::open() {
 void XMLWriter::close() { --depth_; }
 
 void XMLWriter::writeText(std::string_view text) {
+  // Most texts need neither a look at their characters nor references. One loop without branches tells.
+  std::uint8_t suspect = 0;
+  std::uint8_t special = 0;
+  for (const char c : text) {
+    const auto byte = static_cast<std::uint8_t>(c);
+    suspect |= static_cast<std::uint8_t>((byte < 0x20) | (byte > 0x7F));
+    special |= static_cast<std::uint8_t>((c == '&') | (c == '<') | (c == '>') | (c == '\r'));
+  }
+  if (suspect) checkText(text);
+  if (special) return writeWithReferences(text);
+  text_ += text;
+}
+
+void XMLWriter::checkText(std::string_view text) {
   if (PropertyListText::findInvalidUTF8(text) != PropertyListText::npos)
     throw propertyListError(unwritableText, "it is not valid UTF-8");
   if (PropertyListText::findInvalidXMLCharacter(text) != PropertyListText::npos)
     throw propertyListError(unwritableText, "XML has no form for a character in " + quoted(text));
-  while (true) {
-    const auto special = text.find_first_of("&<>\r");
-    text_ += text.substr(0, special);
-    if (special == std::string_view::npos) return;
-    switch (text[special]) {
+}
+
+void XMLWriter::writeWithReferences(std::string_view text) {
+  for (const char c : text) {
+    switch (c) {
       case '&':
         text_ += "&amp;";
         break;
@@ -123,10 +139,12 @@ void XMLWriter::writeText(std::string_view text) {
       case '>':
         text_ += "&gt;";
         break;
-      default:
+      case '\r':
         text_ += "&#13;";
+        break;
+      default:
+        text_ += c;
     }
-    text.remove_prefix(special + 1);
   }
 }
 

@@ -4,6 +4,8 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <bit>
+#include <climits>
 
 namespace MarletFoundation {
 
@@ -13,8 +15,10 @@ namespace MarletFoundation {
 class DiskTree {
  public:
   static constexpr std::size_t Capacity = 64;
-  /// How many ancestors of the directory in use stay open when the others are closed.
-  static constexpr int KeptAncestors = 12;
+  /// How many of the directory in use and its nearest ancestors stay open when the others are closed.
+  static constexpr int Nearest = 12;
+  /// How many of its other ancestors stay open, evenly spread, so that the way up from a great depth is short.
+  static constexpr int MostSpread = 24;
 
   DiskTree() { open_.reserve(Capacity); }
   ~DiskTree() { closeAllBut(nullptr); }
@@ -32,9 +36,15 @@ class DiskTree {
     if (found != open_.rend()) found->owner = nullptr;
   }
 
-  void closeAllBut(const DiskDirectory* inUse) {
+  void closeAllBut(const DiskDirectory* inUse, int nearest = Nearest, int spread = MostSpread) {
     std::vector<const DiskDirectory*> kept;
-    for (; inUse && kept.size() <= KeptAncestors; inUse = inUse->parent_.get()) kept.push_back(inUse);
+    const int stride =
+        inUse && spread > 0
+            ? static_cast<int>(std::bit_ceil(static_cast<unsigned>(inUse->depth_ / spread + 1)))
+            : INT_MAX;
+    for (; inUse && inUse->parent_; inUse = inUse->parent_.get()) {
+      if (nearest-- > 0 || inUse->depth_ % stride == 0) kept.push_back(inUse);
+    }
     const auto closing = std::partition(open_.begin(), open_.end(), [&](const Entry& entry) {
       return entry.owner && std::find(kept.begin(), kept.end(), entry.owner) != kept.end();
     });
@@ -58,7 +68,7 @@ class DiskTree {
     const auto attempt = [&] { return retrying([&] { return ::openat(directoryDescriptor, name, flags); }); };
     const int opened = attempt();
     if (opened >= 0 || (errno != EMFILE && errno != ENFILE)) return opened;
-    closeAllBut(directory);
+    closeAllBut(directory, 1, 0);
     return attempt();
   }
 
@@ -80,7 +90,10 @@ class DiskTree {
 };
 
 DiskDirectory::DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string name)
-    : parent_(std::move(parent)), name_(std::move(name)), tree_(parent_ ? parent_->tree_ : nullptr) {}
+    : parent_(std::move(parent)),
+      name_(std::move(name)),
+      tree_(parent_ ? parent_->tree_ : nullptr),
+      depth_(parent_ ? parent_->depth_ + 1 : 0) {}
 
 DiskDirectory::~DiskDirectory() {
   if (descriptor_ >= 0) tree_->disown(this);

@@ -133,6 +133,7 @@ TEST(Monoid, CombinesInOrderAndTheOtherWins) {
   EXPECT_EQ(mappend(Dictionary{{"a", 1}, {"b", 1}}, Dictionary{{"b", 2}, {"c", 2}}),
             (Dictionary{{"a", 1}, {"b", 2}, {"c", 2}}));
   EXPECT_EQ(mappend(std::unordered_map<int, int>{{1, 1}}, {{1, 2}}), (std::unordered_map<int, int>{{1, 2}}));
+  EXPECT_EQ(mappend(Longest{"a"}, Longest{"bb"}).text, "bb");
   EXPECT_EQ(take(Array{3, 1, 2}, 2), (Array{3, 1}));
   EXPECT_EQ(take(Array{3, 1}, 5), (Array{3, 1}));
   EXPECT_EQ(take(Array{3, 1}, -1), Array());

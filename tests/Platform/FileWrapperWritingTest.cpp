@@ -1,0 +1,246 @@
+#include <gtest/gtest.h>
+#include <pthread.h>
+#include <signal.h>
+#include <sys/stat.h>
+#include <sys/wait.h>
+#include <sys/xattr.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <filesystem>
+#include <fstream>
+#include <functional>
+
+#include "MarletFoundation/Platform/Digest.h"
+#include "MarletFoundation/Platform/ErrorObject.h"
+#include "MarletFoundation/Platform/FileManager.h"
+#include "MarletFoundation/Platform/FileWrapper.h"
+#include "support/Tree.h"
+
+namespace MarletFoundation::test {
+namespace {
+
+namespace fs = std::filesystem;
+
+FileWrapper file(std::string_view name, std::string text) {
+  auto wrapper = FileWrapper::regularFile(Data(std::move(text)));
+  wrapper.setPreferredFilename(std::string(name));
+  return wrapper;
+}
+
+std::string text(const fs::path& path) {
+  std::ifstream stream(path, std::ios::binary);
+  return {std::istreambuf_iterator<char>(stream), {}};
+}
+
+std::vector<std::string> names(const TemporaryDirectory& directory) {
+  return FileManager::contentsOfDirectory(directory.url(), false);
+}
+
+int errorOfWriting(const FileWrapper& wrapper, const URL& url) {
+  try {
+    wrapper.write(url);
+  } catch (const ErrorObject& error) {
+    return error.code();
+  }
+  return 0;
+}
+
+ino_t number(const fs::path& path) {
+  struct stat status {};
+  ::lstat(path.c_str(), &status);
+  return status.st_ino;
+}
+
+TEST(FileWrapperWriting, TakesThePlaceOfWhatWasThere) {
+  const TemporaryDirectory directory;
+  const Tree tree{{"a/b", "1"}, {"empty/", ""}, {"c", ""}};
+  const auto target = directory.path() / "book";
+  fs::create_symlink("book", directory.path() / "link");
+  for (const bool isThere : {false, true}) {
+    tree.wrapper().write(directory.url("link"));
+    EXPECT_EQ(text(target / "a/b"), "1");
+    EXPECT_TRUE(fs::is_directory(target / "empty") && fs::exists(target / "c") &&
+                !fs::exists(target / "old"));
+    EXPECT_TRUE(fs::is_symlink(directory.path() / "link")) << isThere;
+    std::ofstream(target / "old");
+  }
+  file("x", "file").write(directory.url("book"));
+  EXPECT_EQ(text(target), "file");
+  tree.wrapper().write(directory.url("book"));
+  EXPECT_EQ(text(target / "a/b"), "1");
+  FileWrapper(directory.url("book/a/b")).write(directory.url("copy"));
+  EXPECT_EQ(text(directory.path() / "copy"), "1");
+  EXPECT_EQ(names(directory), (std::vector<std::string>{"book", "copy", "link"}));
+}
+
+TEST(FileWrapperWriting, KeepsWhatADocumentIsMadeOf) {
+  const TemporaryDirectory directory;
+  Tree{{"book/same", "1"}, {"book/loaded", "2"}, {"book/new", "3"}, {"book/sub/x", "4"}}.writeTo(
+      directory.path());
+  const auto book = directory.path() / "book";
+  fs::create_symlink("../nowhere", book / "link");
+  fs::permissions(book / "new", fs::perms(0600));
+  fs::permissions(book / "sub", fs::perms(0510));
+  const bool hasAttributes = ::setxattr((book / "sub").c_str(), "user.kept", "yes", 3, 0) == 0 &&
+                             ::setxattr((book / "new").c_str(), "user.kept", "yes", 3, 0) == 0;
+  const auto same = number(book / "same"), loaded = number(book / "loaded"), replaced = number(book / "new");
+
+  FileWrapper root(directory.url("book"));
+  EXPECT_EQ(root.child("loaded")->regularFileContents()->view(), "2");
+  root.addFileWrapper(file("new", "changed"));
+  root.write(directory.url("book"));
+  EXPECT_EQ(number(book / "same"), same);
+  EXPECT_EQ(number(book / "loaded"), loaded);
+  EXPECT_NE(number(book / "new"), replaced);
+  EXPECT_EQ(text(book / "new"), "changed");
+  EXPECT_EQ(fs::status(book / "new").permissions(), fs::perms(0600));
+  EXPECT_EQ(fs::status(book / "sub").permissions(), fs::perms(0510));
+  EXPECT_EQ(fs::read_symlink(book / "link"), "../nowhere");
+  for (const char* name : {"sub", "new"}) {
+    char value[3] = {};
+    EXPECT_EQ(::getxattr((book / name).c_str(), "user.kept", value, 3), hasAttributes ? 3 : -1);
+  }
+  // The wrapper goes on in the new tree, and a copy elsewhere shares no file with it.
+  EXPECT_EQ(root.child("sub")->child("x")->regularFileContents()->view(), "4");
+  root.write(directory.url("elsewhere"));
+  EXPECT_NE(number(directory.path() / "elsewhere/same"), same);
+  EXPECT_EQ(fs::status(directory.path() / "elsewhere/sub").permissions(), fs::perms(0510));
+  root.write(directory.url("book"));
+  EXPECT_EQ(number(book / "same"), same);
+  EXPECT_EQ(names(directory), (std::vector<std::string>{"book", "elsewhere"}));
+}
+
+TEST(FileWrapperWriting, WritesWhatWasReadAndNotWhatCameAfter) {
+  const TemporaryDirectory directory;
+  Tree{{"book/file", "1"}}.writeTo(directory.path());
+  FileWrapper root(directory.url("book"));
+  ASSERT_TRUE(root.child("file")->regularFileContents());
+  std::ofstream(directory.path() / "book/file") << "2";
+  root.write(directory.url("book"));
+  EXPECT_EQ(text(directory.path() / "book/file"), "1");
+}
+
+TEST(FileWrapperWriting, AFailureLeavesTheOldDocument) {
+  const TemporaryDirectory directory;
+  Tree{{"book/a", "old"}, {"pipes/a", "new"}}.writeTo(directory.path());
+  ASSERT_EQ(::mkfifo((directory.path() / "pipes/z").c_str(), 0600), 0);
+  const auto failing = [](std::string_view badName) {
+    auto sub = FileWrapper::directory();
+    sub.setPreferredFilename("sub");
+    sub.addFileWrapper(file(badName, "new"));
+    auto root = FileWrapper::directory();
+    root.addFileWrapper(file("a", "new"));
+    root.addFileWrapper(sub);
+    return root;
+  };
+  for (const auto& name : {std::string(""), std::string("."), std::string(".."), std::string("../../out"),
+                           std::string("a\0b", 3), std::string("/etc")}) {
+    EXPECT_EQ(errorOfWriting(failing(name), directory.url("book")), EINVAL) << name;
+  }
+  EXPECT_EQ(errorOfWriting(failing(std::string(300, 'x')), directory.url("book")), ENAMETOOLONG);
+  EXPECT_EQ(errorOfWriting(FileWrapper(directory.url("pipes")), directory.url("book")), EINVAL);
+  EXPECT_EQ(errorOfWriting(FileWrapper(directory.url("pipes/z")), directory.url("book")), EINVAL);
+  EXPECT_EQ(errorOfWriting(failing("x"), directory.url("none/book")), ENOENT);
+  auto within = FileWrapper::directory();
+  within.setPreferredFilename("within");
+  within.addFileWrapper(within);
+  EXPECT_EQ(errorOfWriting(within, directory.url("book")), ELOOP);
+  within.removeFileWrapper("within");
+  EXPECT_EQ(errorOfWriting(FileWrapper(directory.url()), directory.url("inside")), EINVAL);
+
+  FileWrapper vanished(directory.url("pipes"));
+  vanished.fileWrappers();
+  fs::remove_all(directory.path() / "pipes");
+  EXPECT_NE(errorOfWriting(vanished, directory.url("book")), 0);
+  EXPECT_EQ(text(directory.path() / "book/a"), "old");
+  EXPECT_EQ(names(directory), (std::vector<std::string>{"book"}));
+}
+
+/// Runs a function on a thread of little stack.
+void onSmallStack(std::function<void()> function) {
+  pthread_attr_t attributes;
+  ::pthread_attr_init(&attributes);
+  ASSERT_EQ(::pthread_attr_setstacksize(&attributes, std::size_t{256} << 10), 0);
+  pthread_t thread;
+  const auto run = [](void* argument) -> void* {
+    (*static_cast<std::function<void()>*>(argument))();
+    return nullptr;
+  };
+  ASSERT_EQ(::pthread_create(&thread, &attributes, run, &function), 0);
+  ::pthread_join(thread, nullptr);
+}
+
+TEST(FileWrapperWriting, DeeperThanTheStack) {
+  constexpr int depth = 700;
+  const TemporaryDirectory directory;
+  onSmallStack([&] {
+    auto deep = file("leaf", "here");
+    for (int level = 0; level < depth; ++level) {
+      auto above = FileWrapper::directory();
+      above.setPreferredFilename("d");
+      above.addFileWrapper(std::move(deep));
+      deep = std::move(above);
+    }
+    deep.write(directory.url("deep"));
+    FileWrapper root(directory.url("deep"));
+    auto node = root;
+    for (int level = 1; level < depth; ++level) node = *node.child("d");
+    root.write(directory.url("deep"));
+    const auto leaf = node.child("leaf");
+    EXPECT_TRUE(leaf && leaf->regularFileContents()->view() == "here");
+    // Also takes the deep tree away again.
+    file("x", "").write(directory.url("deep"));
+  });
+  EXPECT_EQ(names(directory), (std::vector<std::string>{"deep"}));
+}
+
+TEST(FileWrapperWriting, SurvivesAWriterThatIsKilled) {
+  const TemporaryDirectory directory;
+  const auto book = directory.path() / "book";
+  const auto write = [&](const std::string& version) {
+    auto root = FileWrapper::directory();
+    for (int i = 0; i < 20; ++i) root.addFileWrapper(file("file" + std::to_string(i), version));
+    root.write(directory.url("book"));
+  };
+  write("0");
+  for (int round = 0; round < 25; ++round) {
+    const auto child = ::fork();
+    if (child == 0) {
+      for (int version = 0;; ++version) write(std::to_string(version));
+    }
+    ::usleep(static_cast<useconds_t>(1000 + 700 * round));
+    ::kill(child, SIGKILL);
+    ::waitpid(child, nullptr, 0);
+    const auto version = text(book / "file0");
+    EXPECT_FALSE(version.empty());
+    for (int i = 0; i < 20; ++i) ASSERT_EQ(text(book / ("file" + std::to_string(i))), version);
+  }
+  write("last");
+  EXPECT_EQ(names(directory), (std::vector<std::string>{"book"}));
+}
+
+TEST(FileWrapperWriting, RecoversFromAReplacementInTwoSteps) {
+  const TemporaryDirectory directory;
+  Tree{{"book/file", "old"}}.writeTo(directory.path());
+  MD5 digest;
+  digest.update("book");
+  std::string displaced = ".marlet-";
+  for (int i = 0; const auto byte : digest.final()) {
+    char digits[3];
+    std::snprintf(digits, sizeof digits, "%02x", byte);
+    if (i++ < 8) displaced += digits;
+  }
+  fs::rename(directory.path() / "book", directory.path() / (displaced + "-displaced"));
+
+  FileWrapper root(directory.url("book"));
+  EXPECT_EQ(root.preferredFilename(), "book");
+  EXPECT_EQ(root.child("file")->regularFileContents()->view(), "old");
+  root.addFileWrapper(file("more", "new"));
+  root.write(directory.url("book"));
+  EXPECT_EQ(text(directory.path() / "book/file") + text(directory.path() / "book/more"), "oldnew");
+  EXPECT_EQ(names(directory), (std::vector<std::string>{"book"}));
+}
+
+}  // namespace
+}  // namespace MarletFoundation::test
