@@ -171,8 +171,8 @@ TEST(PropertyListSerialization, RefusesWhatAFormCannotCarry) {
   for (const auto& [value, inXML, inBinary] : cases) {
     EXPECT_EQ(writingError(value, xml), inXML) << description(value).substr(0, 80);
     EXPECT_EQ(writingError(value, binary), inBinary) << description(value).substr(0, 80);
-    if (inXML == 0) EXPECT_TRUE(read(write(value, xml)) == value);
-    if (inBinary == 0) EXPECT_TRUE(read(write(value, binary)) == value);
+    EXPECT_TRUE(inXML != 0 || read(write(value, xml)) == value);
+    EXPECT_TRUE(inBinary != 0 || read(write(value, binary)) == value);
   }
 }
 
