@@ -11,13 +11,14 @@ namespace MarletFoundation {
 
 /// The open descriptors of a tree below its root: those of directories, which may be needed again, and those
 /// that wait to be closed. They are closed in runs of consecutive numbers, one system call a run, since a
-/// book of many pages would otherwise spend a third of its opening on closing.
+/// book of many pages would otherwise spend a third of its system calls on closing.
 class DiskTree {
  public:
   static constexpr std::size_t Capacity = 64;
   /// How many of the directory in use and its nearest ancestors stay open when the others are closed.
   static constexpr int Nearest = 12;
-  /// How many of its other ancestors stay open, evenly spread, so that the way up from a great depth is short.
+  /// How many of its other ancestors stay open, evenly spread, so that the way up from a great depth is
+  /// short.
   static constexpr int MostSpread = 24;
 
   DiskTree() { open_.reserve(Capacity); }

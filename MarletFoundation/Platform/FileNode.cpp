@@ -194,6 +194,8 @@ std::optional<Data> FileNode::contents() {
   return isLoaded() ? std::optional(contents_) : std::nullopt;
 }
 
+/// A name is looked at before it is opened, since opening a device may have effects. The open file needs no
+/// second look when it holds as many bytes as that look told; `readToEnd` sees to the rest.
 void FileNode::readContents() {
   contentsWereRead_ = true;
   // A file that was only seen in a listing is looked at first: whatever stands there now, only a regular
