@@ -28,7 +28,7 @@ struct Object {
   }
 };
 
-std::uint64_t hash(const Object& object) {
+std::uint32_t hash(const Object& object) {
   constexpr std::uint64_t multiplier = 0x9E3779B97F4A7C15;
   auto state = (object.bits + static_cast<std::uint64_t>(object.kind)) * multiplier;
   if (object.isText()) {
@@ -43,7 +43,7 @@ std::uint64_t hash(const Object& object) {
     if (place < object.bits) std::memcpy(&word, object.bytes + place, object.bits - place);
     mix(word);
   }
-  return state ^ state >> 32;
+  return static_cast<std::uint32_t>(state >> 32);
 }
 
 // The bytes that an unsigned number needs: 1, 2, 4 or 8.
@@ -52,6 +52,13 @@ unsigned widthOf(std::uint64_t number) {
   if (number <= 0xFFFF) return 2;
   return number <= 0xFFFFFFFF ? 4 : 8;
 }
+
+// A place of the hash table: an object and its hash, or an object's number 0 for an empty place. Object 0 is the
+// root, which nothing repeats.
+struct Slot {
+  std::uint32_t hash = 0;
+  std::uint32_t object = 0;
+};
 
 class BinaryWriter {
  public:
@@ -75,8 +82,8 @@ class BinaryWriter {
   // Of each container the number of its children, then their objects; of a dictionary all keys, then all
   // values.
   std::vector<std::uint32_t> references_;
-  // Scalars by hash: the number of an object plus 1, or 0. Its size is a power of two.
-  std::vector<std::uint32_t> table_ = std::vector<std::uint32_t>(64);
+  // Scalars by hash. Its size is a power of two.
+  std::vector<Slot> table_ = std::vector<Slot>(64);
   std::size_t scalarCount_ = 0;
   std::size_t depth_ = 0;
   std::size_t textWritten_ = 0;
@@ -162,19 +169,22 @@ std::uint32_t BinaryWriter::append(const Object& object) {
 // A scalar that equals one before is that one.
 std::uint32_t BinaryWriter::addScalar(const Object& scalar) {
   const auto mask = table_.size() - 1;
-  auto slot = hash(scalar) & mask;
-  for (; table_[slot] != 0; slot = (slot + 1) & mask) {
-    if (!(objects_[table_[slot] - 1] == scalar)) continue;
-    if (!scalar.isText()) return table_[slot] - 1;
+  const auto key = hash(scalar);
+  auto slot = key & mask;
+  for (; table_[slot].object != 0; slot = (slot + 1) & mask) {
+    const auto object = table_[slot].object;
+    if (table_[slot].hash != key || !(objects_[object] == scalar)) continue;
+    if (!scalar.isText()) return object;
     // A reader may only expand a file in proportion to its size. A long text that is repeated beyond that is
     // written again, so that whatever is written can be read.
     if (textShared_ + scalar.bits > 8 * textWritten_ + 32768) break;
     textShared_ += scalar.bits;
-    return table_[slot] - 1;
+    return object;
   }
   const auto object = append(scalar);
   if (scalar.isText()) textWritten_ += scalar.bits;
-  if (std::exchange(table_[slot], object + 1) == 0 && 2 * ++scalarCount_ > table_.size()) growTable();
+  if (std::exchange(table_[slot], {key, object}).object == 0 && 2 * ++scalarCount_ > table_.size())
+    growTable();
   return object;
 }
 
@@ -183,12 +193,12 @@ std::uint32_t BinaryWriter::addText(Kind kind, std::string_view text) {
 }
 
 void BinaryWriter::growTable() {
-  const std::vector<std::uint32_t> old(std::exchange(table_, std::vector<std::uint32_t>(2 * table_.size())));
+  const auto old = std::exchange(table_, std::vector<Slot>(4 * table_.size()));
   const auto mask = table_.size() - 1;
-  for (const auto entry : old) {
-    if (entry == 0) continue;
-    auto slot = hash(objects_[entry - 1]) & mask;
-    while (table_[slot] != 0) slot = (slot + 1) & mask;
+  for (const auto& entry : old) {
+    if (entry.object == 0) continue;
+    auto slot = entry.hash & mask;
+    while (table_[slot].object != 0) slot = (slot + 1) & mask;
     table_[slot] = entry;
   }
 }

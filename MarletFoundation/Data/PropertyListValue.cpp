@@ -123,6 +123,8 @@ PropertyListValue::PropertyListValue(const PropertyListValue& other) {
   }
 }
 
+PropertyListValue::PropertyListValue(PropertyListValue&& other) noexcept = default;
+
 PropertyListValue& PropertyListValue::operator=(const PropertyListValue& other) {
   return *this = PropertyListValue(other);
 }

@@ -78,7 +78,7 @@ struct MARLET_EXPORT PropertyListValue {
   PropertyListValue(bool value) : payload(value) {}
 
   PropertyListValue(const PropertyListValue& other);
-  PropertyListValue(PropertyListValue&&) noexcept = default;
+  PropertyListValue(PropertyListValue&& other) noexcept;
   PropertyListValue& operator=(const PropertyListValue& other);
   PropertyListValue& operator=(PropertyListValue&& other) noexcept;
   ~PropertyListValue() {

@@ -1,5 +1,6 @@
 #include "MarletFoundation/Data/PropertyListValueBuilder.h"
 
+#include <cstring>
 #include <iterator>
 
 namespace MarletFoundation {
@@ -14,15 +15,35 @@ std::vector<Element> taken(std::vector<Element>& stack, std::size_t start) {
   return elements;
 }
 
+// Keys are short and differ at their ends, so the first and last eight bytes will do.
+std::size_t hash(std::string_view text) {
+  std::uint64_t first = 0;
+  std::uint64_t last = 0;
+  if (text.size() >= 8) {
+    std::memcpy(&first, text.data(), 8);
+    std::memcpy(&last, text.data() + text.size() - 8, 8);
+  } else {
+    std::memcpy(&first, text.data(), text.size());
+  }
+  const auto mixed = (first ^ last * 0x9E3779B97F4A7C15 ^ text.size()) * 0xD6E8FEB86659FD93;
+  return static_cast<std::size_t>(mixed >> 32);
+}
+
 }  // namespace
+
+PropertyListValueBuilder::PropertyListValueBuilder() {
+  open_.reserve(16);
+  values_.reserve(32);
+  entries_.reserve(32);
+}
 
 void PropertyListValueBuilder::end() {
   const auto [isDictionary, start] = open_.back();
   open_.pop_back();
   if (isDictionary) {
-    add(PropertyListDictionary(taken(entries_, start)));
+    add<PropertyListDictionary>(taken(entries_, start));
   } else {
-    add(taken(values_, start));
+    add<PropertyListValue::Array>(taken(values_, start));
   }
 }
 
@@ -31,11 +52,9 @@ void PropertyListValueBuilder::key(std::string_view text) {
 }
 
 const PropertyListKey& PropertyListValueBuilder::sharedKey(std::string_view text) {
-  std::uint32_t hash = 2166136261;
-  for (const char c : text) hash = (hash ^ static_cast<unsigned char>(c)) * 16777619;
-  auto& recent = recentKeys_[(hash ^ hash >> 16) % recentKeys_.size()];
-  if (!recent || recent->view() != text) recent.emplace(text);
-  return *recent;
+  auto& recent = recentKeys_[hash(text) % recentKeys_.size()];
+  if (recent.view() != text) recent = PropertyListKey(text);
+  return recent;
 }
 
 }  // namespace MarletFoundation

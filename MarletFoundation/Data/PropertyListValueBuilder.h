@@ -1,7 +1,6 @@
 #pragma once
 
 #include <array>
-#include <optional>
 #include <vector>
 
 #include "MarletFoundation/Data/PropertyListValue.h"
@@ -13,16 +12,18 @@ namespace MarletFoundation {
 /// container takes its own, in one allocation of the right size, when it ends.
 class PropertyListValueBuilder final : public PropertyListEvents {
  public:
+  PropertyListValueBuilder();
+
   void beginArray() override { open_.push_back({false, values_.size()}); }
   void beginDictionary() override { open_.push_back({true, entries_.size()}); }
   void end() override;
   void key(std::string_view text) override;
-  void string(std::string_view text) override { add(text); }
-  void data(Data bytes) override { add(std::move(bytes)); }
-  void date(Date date) override { add(date); }
-  void integer(std::int64_t number) override { add(number); }
-  void real(double number) override { add(number); }
-  void boolean(bool flag) override { add(flag); }
+  void string(std::string_view text) override { add<std::string>(text); }
+  void data(Data bytes) override { add<Data>(std::move(bytes)); }
+  void date(Date date) override { add<Date>(date); }
+  void integer(std::int64_t number) override { add<std::int64_t>(number); }
+  void real(double number) override { add<double>(number); }
+  void boolean(bool flag) override { add<bool>(flag); }
 
   /// The value, once the reader is done.
   PropertyListValue take() { return std::move(values_.back()); }
@@ -34,13 +35,12 @@ class PropertyListValueBuilder final : public PropertyListEvents {
     std::size_t start;
   };
 
-  template <class Payload>
-  void add(Payload&& payload) {
-    if (!open_.empty() && open_.back().isDictionary) {
-      entries_.back().value = PropertyListValue(std::forward<Payload>(payload));
-    } else {
-      values_.emplace_back(std::forward<Payload>(payload));
-    }
+  template <class Payload, class Argument>
+  void add(Argument&& argument) {
+    // In a dictionary the entry was begun with its key.
+    const bool hasEntry = !open_.empty() && open_.back().isDictionary;
+    auto& value = hasEntry ? entries_.back().value : values_.emplace_back();
+    value.payload.emplace<Payload>(std::forward<Argument>(argument));
   }
   const PropertyListKey& sharedKey(std::string_view text);
 
@@ -48,7 +48,7 @@ class PropertyListValueBuilder final : public PropertyListEvents {
   std::vector<PropertyListValue> values_;
   std::vector<PropertyListDictionary::Entry> entries_;
   // The keys met last, each in the place that its text hashes to.
-  std::array<std::optional<PropertyListKey>, 256> recentKeys_;
+  std::array<PropertyListKey, 64> recentKeys_;
 };
 
 }  // namespace MarletFoundation

@@ -10,6 +10,14 @@ namespace {
 
 using enum PropertyListErrorCode;
 
+std::string_view referenceFor(char c) {
+  if (c == '&') return "&amp;";
+  if (c == '<') return "&lt;";
+  if (c == '>') return "&gt;";
+  // Readers take a carriage return as it stands for a line feed.
+  return c == '\r' ? "&#13;" : "";
+}
+
 class XMLWriter {
  public:
   std::string write(const PropertyListValue& value) {
@@ -24,6 +32,8 @@ class XMLWriter {
   void writeArray(const PropertyListValue::Array& array);
   void writeDictionary(const PropertyListDictionary& dictionary);
   void writeText(std::string_view text);
+  static void checkText(std::string_view text);
+  void writeWithReferences(std::string_view text);
   void open();
   void close();
   void indent() { text_.append(depth_, '\t'); }
@@ -105,29 +115,35 @@ void XMLWriter::open() {
 void XMLWriter::close() { --depth_; }
 
 void XMLWriter::writeText(std::string_view text) {
+  // Most texts need neither a look at their characters nor references. One loop without branches tells.
+  std::uint8_t suspect = 0;
+  std::uint8_t special = 0;
+  for (const char c : text) {
+    const auto byte = static_cast<std::uint8_t>(c);
+    suspect |= static_cast<std::uint8_t>((byte < 0x20) | (byte > 0x7F));
+    special |= static_cast<std::uint8_t>((c == '&') | (c == '<') | (c == '>') | (c == '\r'));
+  }
+  if (suspect) checkText(text);
+  if (special) return writeWithReferences(text);
+  text_ += text;
+}
+
+void XMLWriter::checkText(std::string_view text) {
   if (PropertyListText::findInvalidUTF8(text) != PropertyListText::npos)
     throw propertyListError(unwritableText, "it is not valid UTF-8");
   if (PropertyListText::findInvalidXMLCharacter(text) != PropertyListText::npos)
     throw propertyListError(unwritableText, "XML has no form for a character in " + quoted(text));
-  while (true) {
-    const auto special = text.find_first_of("&<>\r");
-    text_ += text.substr(0, special);
-    if (special == std::string_view::npos) return;
-    switch (text[special]) {
-      case '&':
-        text_ += "&amp;";
-        break;
-      case '<':
-        text_ += "&lt;";
-        break;
-      case '>':
-        text_ += "&gt;";
-        break;
-      default:
-        text_ += "&#13;";
-    }
-    text.remove_prefix(special + 1);
+}
+
+void XMLWriter::writeWithReferences(std::string_view text) {
+  std::size_t written = 0;
+  for (std::size_t place = 0; place < text.size(); ++place) {
+    const auto reference = referenceFor(text[place]);
+    if (reference.empty()) continue;
+    text_.append(text, written, place - written).append(reference);
+    written = place + 1;
   }
+  text_.append(text, written);
 }
 
 }  // namespace

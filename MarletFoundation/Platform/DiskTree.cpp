@@ -4,17 +4,21 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <bit>
+#include <climits>
 
 namespace MarletFoundation {
 
 /// The open descriptors of a tree below its root, each in its slot. When there are too many, they are closed
 /// in runs of consecutive numbers, one system call a run, since a book of many pages would otherwise spend a
-/// third of its opening on closing.
+/// third of its system calls on closing.
 class DiskTree {
  public:
   static constexpr std::size_t Capacity = 64;
-  /// How many ancestors of the directory in use stay open when everything else is closed.
-  static constexpr std::size_t KeptAncestors = 12;
+  /// How many of the directory in use and its nearest ancestors stay open when the others are closed.
+  static constexpr int Nearest = 12;
+  /// How many of its other ancestors stay open, evenly spread, so that the way up from a great depth is short.
+  static constexpr int MostSpread = 24;
 
   DiskTree() { open_.reserve(Capacity); }
   ~DiskTree() { closeAllBut(nullptr); }
@@ -32,10 +36,14 @@ class DiskTree {
     if (found != open_.rend()) found->slot = nullptr;
   }
 
-  void closeAllBut(const DiskDirectory* inUse) {
+  void closeAllBut(const DiskDirectory* inUse, int nearest = Nearest, int spread = MostSpread) {
     std::vector<const int*> kept;
-    for (; inUse && kept.size() <= KeptAncestors; inUse = inUse->parent_.get()) {
-      kept.push_back(&inUse->descriptor_);
+    const int stride =
+        inUse && spread > 0
+            ? static_cast<int>(std::bit_ceil(static_cast<unsigned>(inUse->depth_ / spread + 1)))
+            : INT_MAX;
+    for (; inUse && inUse->parent_; inUse = inUse->parent_.get()) {
+      if (nearest-- > 0 || inUse->depth_ % stride == 0) kept.push_back(&inUse->descriptor_);
     }
     const auto closing = std::partition(open_.begin(), open_.end(), [&](const Entry& entry) {
       return std::find(kept.begin(), kept.end(), entry.slot) != kept.end();
@@ -60,7 +68,7 @@ class DiskTree {
     const auto attempt = [&] { return retrying([&] { return ::openat(directoryDescriptor, name, flags); }); };
     const int opened = attempt();
     if (opened >= 0 || (errno != EMFILE && errno != ENFILE)) return opened;
-    closeAllBut(directory);
+    closeAllBut(directory, 1, 0);
     return attempt();
   }
 
@@ -82,7 +90,10 @@ class DiskTree {
 };
 
 DiskDirectory::DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string_view name)
-    : parent_(std::move(parent)), name_(name), tree_(parent_ ? parent_->tree_ : nullptr) {}
+    : parent_(std::move(parent)),
+      name_(name),
+      tree_(parent_ ? parent_->tree_ : nullptr),
+      depth_(parent_ ? parent_->depth_ + 1 : 0) {}
 
 DiskDirectory::~DiskDirectory() {
   if (descriptor_ >= 0) tree_->forget(descriptor_);

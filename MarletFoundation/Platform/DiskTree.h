@@ -64,6 +64,7 @@ class DiskDirectory {
   std::string name_;
   std::unique_ptr<DiskTree> ownTree_;  // the root's
   DiskTree* tree_;
+  int depth_;  // the root's is 0
   int descriptor_ = -1;
 };
 

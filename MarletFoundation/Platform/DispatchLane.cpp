@@ -111,6 +111,7 @@ std::size_t DispatchLane::handOn() {
     word_.fetch_add(next.exclusive ? exclusiveBit : sharedUnit, std::memory_order_acq_rel);
     if (next.waiter) {
       next.waiter->granted = true;
+      std::erase(helpers_, next.waiter);
       // Notified under the mutex: without it, the waiter could be gone before the call.
       next.waiter->wake.notify_one();
       waiting_.pop_front();
@@ -120,7 +121,7 @@ std::size_t DispatchLane::handOn() {
     }
   }
   if (waiting_.empty()) word_.fetch_and(~waitingBit, std::memory_order_acq_rel);
-  if (ready && !helpers_.empty()) helpers_.front()->wake.notify_one();
+  if (!ready_.empty() && !helpers_.empty()) helpers_.front()->wake.notify_one();
   return ready;
 }
 

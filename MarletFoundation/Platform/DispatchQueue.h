@@ -69,9 +69,10 @@ class MARLET_EXPORT DispatchQueue {
   /// Queues `block` when `seconds` have passed; at once when they aren't positive.
   void asyncAfter(double seconds, std::function<void()> block) const;
 
-  /// Sets the value under `key`, or removes it.
+  /// Sets this queue's value under `key`, or removes it.
   template <class Value>
-  void setSpecific(const DispatchSpecificKey<Value>& key, std::optional<Value> value) const {
+  void setSpecific(const DispatchSpecificKey<Value>& key,
+                   std::type_identity_t<std::optional<Value>> value) const {
     setValue(&key, value ? std::any(*std::move(value)) : std::any());
   }
   /// This queue's own value under `key`.

@@ -55,9 +55,14 @@ class TreeWriter {
       }
     }
     finishDirectories();
+    if (flushes_ > MostSingleFlushes && ::syncfs(target_->descriptor()) != 0) fail(errno, *target_);
   }
 
  private:
+  /// Each flush waits for the disk. From some number on one flush of the whole file system is sooner done.
+  static constexpr int MostSingleFlushes = 64;
+  int flush(int descriptor) { return ++flushes_ > MostSingleFlushes ? 0 : ::fsync(descriptor); }
+
   struct Job {
     std::shared_ptr<FileNode> node;
     std::shared_ptr<DiskDirectory> target;
@@ -161,7 +166,7 @@ class TreeWriter {
     if ((attributes >= 0 && copyAttributes(attributes, written.get()) != 0) ||
         (file.isLoaded() ? writeAll(written.get(), file.contents()->view())
                          : copyBytes(source.get(), written.get())) != 0 ||
-        ::fsync(written.get()) != 0) {
+        flush(written.get()) != 0) {
       fail(errno, target, name);
     }
   }
@@ -190,7 +195,7 @@ class TreeWriter {
       const auto& [target, attributes] = finishes_.back();
       const int number = target->descriptor();
       if (number < 0 || (attributes && copyAttributes(attributes->descriptor(), number) != 0) ||
-          ::fsync(number) != 0) {
+          flush(number) != 0) {
         fail(errno, *target);
       }
     }
@@ -204,6 +209,7 @@ class TreeWriter {
   std::set<const FileNode*> above_;
   std::vector<Finish> finishes_;
   std::map<const DiskDirectory*, bool> replacedRoots_;
+  int flushes_ = 0;
 };
 
 void writeRegularFile(AtomicReplacement& replacement, FileNode& file) {

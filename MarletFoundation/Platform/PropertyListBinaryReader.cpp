@@ -75,6 +75,7 @@ class BinaryReader {
 void BinaryReader::read() {
   readTrailer();
   isOpen_.resize(objectCount_);
+  open_.reserve(16);
   nodesLeft_ = 4 * bytes_.size() + 1024;
   textLeft_ = 16 * bytes_.size() + 65536;
   readValue(rootObject_, bytes_.size() - 16);
@@ -99,19 +100,20 @@ void BinaryReader::readTrailer() {
   if (rootObject_ >= objectCount_) fail(invalidTrailer, trailer + 16, "root object");
 }
 
-std::uint64_t BinaryReader::unsignedAt(std::size_t place, std::size_t width) const {
+inline std::uint64_t BinaryReader::unsignedAt(std::size_t place, std::size_t width) const {
+  if (width == 1) return static_cast<std::uint8_t>(bytes_[place]);
   std::uint64_t number = 0;
   for (std::size_t i = 0; i < width; ++i) number = number << 8 | static_cast<std::uint8_t>(bytes_[place + i]);
   return number;
 }
 
-std::uint64_t BinaryReader::referenceAt(std::size_t place) const {
+inline std::uint64_t BinaryReader::referenceAt(std::size_t place) const {
   const auto object = unsignedAt(place, referenceWidth_);
   if (object >= objectCount_) fail(invalidReference, place);
   return object;
 }
 
-std::size_t BinaryReader::offsetOf(std::uint64_t object) const {
+inline std::size_t BinaryReader::offsetOf(std::uint64_t object) const {
   const auto place = tableOffset_ + static_cast<std::size_t>(object) * offsetWidth_;
   const auto offset = unsignedAt(place, offsetWidth_);
   if (offset < headerSize || offset >= tableOffset_) fail(invalidOffset, place);
@@ -138,7 +140,7 @@ void BinaryReader::readValue(std::uint64_t object, std::size_t referencedAt) {
       const auto length = count(start);
       const auto data = body(place, start, length, 1);
       spend(0, data.size(), referencedAt);
-      return events_.data(Data(std::string(data)));
+      return events_.data(PropertyListText::copiedData(data));
     }
     case 0x5:
     case 0x6: {
@@ -258,7 +260,7 @@ std::string_view BinaryReader::body(std::size_t object, std::size_t place, std::
   return bytes_.substr(place, static_cast<std::size_t>(count) * unitSize);
 }
 
-void BinaryReader::spend(std::size_t nodes, std::size_t textBytes, std::size_t place) {
+inline void BinaryReader::spend(std::size_t nodes, std::size_t textBytes, std::size_t place) {
   if (nodes > nodesLeft_ || textBytes > textLeft_) fail(tooMuchSharing, place);
   nodesLeft_ -= nodes;
   textLeft_ -= textBytes;

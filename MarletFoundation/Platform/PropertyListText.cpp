@@ -1,5 +1,7 @@
 #include "MarletFoundation/Platform/PropertyListText.h"
 
+#include <algorithm>
+
 namespace MarletFoundation::PropertyListText {
 namespace {
 
@@ -33,11 +35,17 @@ std::size_t sequenceLength(std::string_view text, std::size_t place) {
 
 std::size_t findNonASCII(std::string_view text) {
   constexpr std::uint64_t highBits = 0x8080808080808080;
-  std::size_t place = 0;
-  for (; place + 8 <= text.size(); place += 8) {
+  const auto wordAt = [text](std::size_t at) {
     std::uint64_t word;
-    std::memcpy(&word, text.data() + place, 8);
-    if (word & highBits) break;
+    std::memcpy(&word, text.data() + at, 8);
+    return word;
+  };
+  std::size_t place = 0;
+  for (; place + 32 <= text.size(); place += 32) {
+    if ((wordAt(place) | wordAt(place + 8) | wordAt(place + 16) | wordAt(place + 24)) & highBits) break;
+  }
+  for (; place + 8 <= text.size(); place += 8) {
+    if (wordAt(place) & highBits) break;
   }
   for (; place < text.size(); ++place) {
     if (byteAt(text, place) > 0x7F) return place;
@@ -60,10 +68,28 @@ std::size_t findInvalidUTF8(std::string_view text) {
 }
 
 std::size_t findInvalidXMLCharacter(std::string_view text) {
-  for (std::size_t place = 0; place < text.size(); ++place) {
+  const auto isSuspect = [text](std::size_t place) {
     const auto byte = byteAt(text, place);
-    if (byte < 0x20 && byte != '\t' && byte != '\n' && byte != '\r') return place;
-    if (byte == 0xEF && byteAt(text, place + 1) == 0xBF && byteAt(text, place + 2) >= 0xBE) return place;
+    return ((byte < 0x20) & (byte != '\t') & (byte != '\n') & (byte != '\r')) | (byte == 0xEF);
+  };
+  constexpr std::size_t blockSize = 64;
+  std::size_t place = 0;
+  while (place < text.size()) {
+    // A whole block is tested without a branch, which compilers turn into a few wide instructions.
+    bool hasSuspect = text.size() - place < blockSize;
+    if (!hasSuspect) {
+      std::uint8_t any = 0;
+      for (std::size_t i = 0; i < blockSize; ++i) any |= static_cast<std::uint8_t>(isSuspect(place + i));
+      hasSuspect = any != 0;
+    }
+    const auto end = std::min(place + blockSize, text.size());
+    for (; hasSuspect && place < end; ++place) {
+      if (!isSuspect(place)) continue;
+      const bool isNonCharacter =
+          byteAt(text, place) == 0xEF && byteAt(text, place + 1) == 0xBF && byteAt(text, place + 2) >= 0xBE;
+      if (byteAt(text, place) < 0x20 || isNonCharacter) return place;
+    }
+    place = end;
   }
   return npos;
 }
@@ -100,6 +126,11 @@ std::size_t appendUTF8FromUTF16(std::string& text, std::string_view bytes, bool 
   std::size_t place = 0;
   while (place + 2 <= bytes.size()) {
     const auto unit = unitAt(place);
+    if (unit < 0x80) {
+      text.push_back(static_cast<char>(unit));
+      place += 2;
+      continue;
+    }
     if (unit < 0xD800 || unit > 0xDFFF) {
       appendUTF8(text, unit);
       place += 2;
@@ -112,6 +143,12 @@ std::size_t appendUTF8FromUTF16(std::string& text, std::string_view bytes, bool 
     place += 4;
   }
   return place;
+}
+
+Data copiedData(std::string_view bytes) {
+  const auto owner = std::make_shared<std::uint8_t[]>(bytes.size());
+  if (!bytes.empty()) std::memcpy(owner.get(), bytes.data(), bytes.size());
+  return {owner, {owner.get(), bytes.size()}};
 }
 
 char32_t nextCharacter(std::string_view text, std::size_t& place) {

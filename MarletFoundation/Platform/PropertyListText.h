@@ -5,6 +5,8 @@
 #include <string>
 #include <string_view>
 
+#include "MarletFoundation/Platform/Data.h"
+
 /// The scans of text that the property-list readers and writers share.
 namespace MarletFoundation::PropertyListText {
 
@@ -25,6 +27,9 @@ void appendUTF8(std::string& text, char32_t character);
 /// The UTF-8 form of 16-bit units, the bytes of each in the given order; nothing is appended from an unpaired
 /// surrogate on. Gives the number of bytes that were read: all of them when the text is valid.
 std::size_t appendUTF8FromUTF16(std::string& text, std::string_view bytes, bool bigEndian);
+
+/// The bytes, copied in one allocation.
+Data copiedData(std::string_view bytes);
 
 /// The character at `place` of valid UTF-8; moves `place` behind it.
 char32_t nextCharacter(std::string_view text, std::size_t& place);

@@ -1,4 +1,6 @@
 #include <algorithm>
+#include <cstring>
+#include <optional>
 #include <vector>
 
 #include "MarletFoundation/Platform/PropertyListEncoding.h"
@@ -17,9 +19,52 @@ enum class Element { plist, array, dict, key, string, data, date, integer, real,
 constexpr std::string_view elementNames[] = {"plist", "array",   "dict", "key",  "string", "data",
                                              "date",  "integer", "real", "true", "false"};
 
+// A short name as one number, so that it is found by one comparison. Longer names give 0.
+constexpr std::uint64_t packed(std::string_view name) {
+  if (name.size() > 8) return 0;
+  std::uint64_t number = 0;
+  for (const char c : name) number = number << 8 | static_cast<std::uint8_t>(c);
+  return number;
+}
+
+std::optional<Element> elementNamed(std::string_view name) {
+  switch (packed(name)) {
+    case packed("key"):
+      return Element::key;
+    case packed("string"):
+      return Element::string;
+    case packed("integer"):
+      return Element::integer;
+    case packed("dict"):
+      return Element::dict;
+    case packed("array"):
+      return Element::array;
+    case packed("true"):
+      return Element::trueElement;
+    case packed("false"):
+      return Element::falseElement;
+    case packed("real"):
+      return Element::real;
+    case packed("date"):
+      return Element::date;
+    case packed("data"):
+      return Element::data;
+    case packed("plist"):
+      return Element::plist;
+    default:
+      return std::nullopt;
+  }
+}
+
 bool isBlank(char c) { return c == ' ' || c == '\n' || c == '\t' || c == '\r'; }
 
-bool endsName(char c) { return isBlank(c) || c == '>' || c == '/' || c == '=' || c == '<'; }
+bool endsName(char c) { return c == '>' || isBlank(c) || c == '/' || c == '=' || c == '<'; }
+
+bool isNameCharacter(char c) {
+  const bool isLetter = (c | 0x20) >= 'a' && (c | 0x20) <= 'z';
+  return isLetter || (c >= '0' && c <= '9') || c == '_' || c == '-' || c == '.' || c == ':' ||
+         static_cast<std::uint8_t>(c) > 0x7F;
+}
 
 std::string_view trimmed(std::string_view text) {
   while (!text.empty() && isBlank(text.front())) text.remove_prefix(1);
@@ -46,6 +91,8 @@ class XMLReader {
 
  private:
   std::string_view rest() const { return {place_, static_cast<std::size_t>(end_ - place_)}; }
+  /// The next `character` from `from` on, or the end.
+  const char* find(char character, const char* from) const;
   bool accept(std::string_view text);
   void skipBlanks();
   /// Moves behind the next `text`.
@@ -64,7 +111,7 @@ class XMLReader {
   void readScalar(Element element, bool isEmpty, const char* tag);
 
   std::string_view readText(std::string_view name);
-  std::string_view readMixedText(std::string_view name, const char* start);
+  std::string_view readMixedText(std::string_view name);
   void appendText(const char* from, const char* to);
   void appendReference();
   bool acceptEndTag(std::string_view name);
@@ -81,6 +128,10 @@ class XMLReader {
   PropertyListEvents& events_;
   std::vector<OpenElement> open_;
   std::string scratch_;
+  // The first reference and carriage return at or behind a place that was passed, so that texts without them
+  // are not searched for them one by one.
+  const char* nextReference_ = begin_;
+  const char* nextReturn_ = begin_;
   bool hasRoot_ = false;
   bool hasDocumentType_ = false;
   bool hasPlist_ = false;
@@ -120,29 +171,28 @@ void XMLReader::readMarkup() {
 void XMLReader::readStartTag() {
   const char* const tag = place_++;
   const auto name = readName();
-  const auto found = std::find(std::begin(elementNames), std::end(elementNames), name);
-  if (found == std::end(elementNames)) fail(name.empty() ? malformedMarkup : unknownElement, tag, name);
-  const auto element = static_cast<Element>(found - std::begin(elementNames));
+  const auto element = elementNamed(name);
+  if (!element) fail(name.empty() ? malformedMarkup : unknownElement, tag, name);
   const bool isEmpty = skipAttributes(tag);
-  switch (element) {
+  switch (*element) {
     case Element::plist:
+      if (!open_.empty()) fail(misplacedElement, tag, name);
       if (hasRoot_) fail(secondRoot, tag);
-      if (!open_.empty() || hasPlist_) fail(misplacedElement, tag, name);
       if (isEmpty) fail(missingRoot, tag);
       hasPlist_ = true;
-      open_.push_back({element});
+      open_.push_back({Element::plist});
       break;
     case Element::array:
     case Element::dict:
       beginValue(tag);
-      push(element, tag);
+      push(*element, tag);
       if (isEmpty) {
         open_.pop_back();
         events_.end();
       }
       break;
     default:
-      readScalar(element, isEmpty, tag);
+      readScalar(*element, isEmpty, tag);
   }
 }
 
@@ -216,7 +266,7 @@ void XMLReader::readScalar(Element element, bool isEmpty, const char* tag) {
     case Element::data: {
       std::string bytes;
       if (!PropertyListScalars::appendFromBase64(bytes, text)) fail(invalidData, tag);
-      return events_.data(Data(std::move(bytes)));
+      return events_.data(PropertyListText::copiedData(bytes));
     }
     default:
       if (!trimmed(text).empty()) fail(misplacedText, tag);
@@ -232,6 +282,10 @@ std::string_view XMLReader::readName() {
 
 // Moves behind the tag; true for the tag of an empty element.
 bool XMLReader::skipAttributes(const char* tag) {
+  if (place_ < end_ && *place_ == '>') {
+    ++place_;
+    return false;
+  }
   while (true) {
     const char* const before = place_;
     skipBlanks();
@@ -253,10 +307,15 @@ bool XMLReader::skipAttributes(const char* tag) {
 // and is given as it stands.
 std::string_view XMLReader::readText(std::string_view name) {
   const char* const start = place_;
-  while (place_ < end_ && *place_ != '<' && *place_ != '&' && *place_ != '\r') ++place_;
-  const std::string_view text(start, static_cast<std::size_t>(place_ - start));
-  if (acceptEndTag(name)) return text;
-  return readMixedText(name, start);
+  const char* const tag = find('<', start);
+  if (nextReference_ < start) nextReference_ = find('&', start);
+  if (nextReturn_ < start) nextReturn_ = find('\r', start);
+  if (nextReference_ > tag && nextReturn_ > tag) {
+    place_ = tag;
+    if (acceptEndTag(name)) return {start, static_cast<std::size_t>(tag - start)};
+    place_ = start;
+  }
+  return readMixedText(name);
 }
 
 bool XMLReader::acceptEndTag(std::string_view name) {
@@ -275,8 +334,8 @@ bool XMLReader::acceptEndTag(std::string_view name) {
   return true;
 }
 
-std::string_view XMLReader::readMixedText(std::string_view name, const char* start) {
-  scratch_.assign(start, place_);
+std::string_view XMLReader::readMixedText(std::string_view name) {
+  scratch_.clear();
   while (place_ < end_) {
     if (*place_ == '&') {
       appendReference();
@@ -350,6 +409,12 @@ void XMLReader::appendReference() {
   }
 }
 
+const char* XMLReader::find(char character, const char* from) const {
+  if (from == end_) return end_;
+  const auto* const found = std::memchr(from, character, static_cast<std::size_t>(end_ - from));
+  return found ? static_cast<const char*>(found) : end_;
+}
+
 bool XMLReader::accept(std::string_view text) {
   if (!rest().starts_with(text)) return false;
   place_ += text.size();
@@ -376,11 +441,13 @@ void XMLReader::skipComment() {
 void XMLReader::skipInstruction() {
   const char* const start = place_;
   place_ += 2;
-  const auto target = rest().substr(0, 3);
-  const bool isReserved = target.size() == 3 && (target[0] | 0x20) == 'x' && (target[1] | 0x20) == 'm' &&
-                          (target[2] | 0x20) == 'l' &&
-                          (rest().size() == 3 || isBlank(rest()[3]) || rest()[3] == '?');
-  if (target.empty() || isBlank(target[0]) || target[0] == '?' || isReserved) fail(malformedMarkup, start);
+  const char* const target = place_;
+  while (place_ < end_ && isNameCharacter(*place_)) ++place_;
+  const auto length = place_ - target;
+  const bool isReserved =
+      length == 3 && (target[0] | 0x20) == 'x' && (target[1] | 0x20) == 'm' && (target[2] | 0x20) == 'l';
+  const bool isEnded = place_ < end_ && (isBlank(*place_) || *place_ == '?');
+  if (length == 0 || isReserved || !isEnded) fail(malformedMarkup, start);
   skipPast("?>", start);
 }
 

@@ -16,7 +16,7 @@ std::uint64_t uniqueMark() {
 }  // namespace
 
 RecursiveDispatchLock::RecursiveDispatchLock(std::string name) : queue_(std::move(name)) {
-  queue_.setSpecific(queueMark, std::optional(uniqueMark()));
+  queue_.setSpecific(queueMark, uniqueMark());
 }
 
 bool RecursiveDispatchLock::isHeldHere() const {

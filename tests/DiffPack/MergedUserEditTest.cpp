@@ -76,6 +76,9 @@ TEST_F(MergedUserEdit, FollowsTheFirstEntry) {
                          {FileDiff::Removed{"a"}},
                          {FileDiff::Replaced{"a", data}}}),
             "");
+  std::vector<FileDiff> many(100, {FileDiff::Removed{"a/plain"}});
+  many.front() = {FileDiff::Added{"a/plain", data}};
+  EXPECT_EQ(merged("a/plain", many), "carried");
   EXPECT_EQ(merged("text", {modified("text", {})}), "\xef\xbb\xbfone\r\n\U0001F600");
   EXPECT_EQ(
       merged("text",

@@ -24,34 +24,33 @@ std::string merged(std::u16string_view base, const Hunks& diff, const Hunks& oth
 }
 
 TEST(ContentMerge, RefusesHunksThatAreNotOfTheBase) {
-  const auto error = [](int code, const std::string& words) {
-    return "Error(domain: MarletDiff, code: " + std::to_string(code) + ", \"" + words + "\")";
-  };
-  const auto beyond = [&](const std::string& place) {
-    return error(1, "The change at " + place + " reaches beyond the text.");
-  };
-  const auto early = [&](const std::string& place) {
-    return error(2, "The change at " + place + " starts ahead of the end of the one before it.");
-  };
+  const std::string words[] = {"reaches beyond the text.", "starts ahead of the end of the one before it.",
+                               "divides a character.", "is of other text than stands there."};
   const std::u16string base = u"abc\U0001F600def";
-  const std::pair<Hunks, std::string> cases[] = {
-      {{{{-1, 1}, {}, u"", u""}}, beyond("{-1, 1}")},
-      {{{{1, -1}, {}, u"", u""}}, beyond("{1, -1}")},
-      {{{{7, 2}, {}, u"f", u""}}, beyond("{7, 2}")},
-      {{{{9, 0}, {}, u"", u""}}, beyond("{9, 0}")},
-      {{{{largest, largest}, {}, u"", u""}}, beyond("{9223372036854775807, 9223372036854775807}")},
-      {{{{1, largest}, {}, u"", u""}}, beyond("{1, 9223372036854775807}")},
-      {{hunk(5, u"d", u"x"), hunk(0, u"a", u"x")}, early("{0, 1}")},
-      {{hunk(0, u"abc", u"x"), hunk(2, u"c", u"y")}, early("{2, 1}")},
-      {{hunk(0, u"a", u"x"), hunk(0, u"", u"y")}, early("{0, 0}")},
-      {{hunk(4, u"", u"x")}, error(3, "The change at {4, 0} divides a character.")},
-      {{{{2, 2}, {}, {u'c', char16_t{0xD83D}}, u"x"}}, error(3, "The change at {2, 2} divides a character.")},
-      {{hunk(1, u"x", u"y")}, error(4, "The change at {1, 1} is of other text than stands there.")},
-      {{{{1, 1}, {}, u"bc", u"y"}}, error(4, "The change at {1, 1} is of other text than stands there.")},
+  struct {
+    Hunks hunks;
+    int code;
+    std::string place;
+  } cases[] = {
+      {{{{-1, 1}, {}, u"", u""}}, 1, "{-1, 1}"},
+      {{{{1, -1}, {}, u"", u""}}, 1, "{1, -1}"},
+      {{{{7, 2}, {}, u"f", u""}}, 1, "{7, 2}"},
+      {{{{9, 0}, {}, u"", u""}}, 1, "{9, 0}"},
+      {{{{1, largest}, {}, u"", u""}}, 1, "{1, 9223372036854775807}"},
+      {{{{largest, largest}, {}, u"", u""}}, 1, "{9223372036854775807, 9223372036854775807}"},
+      {{hunk(5, u"d", u"x"), hunk(0, u"a", u"x")}, 2, "{0, 1}"},
+      {{hunk(0, u"abc", u"x"), hunk(2, u"c", u"y")}, 2, "{2, 1}"},
+      {{hunk(0, u"a", u"x"), hunk(0, u"", u"y")}, 2, "{0, 0}"},
+      {{hunk(4, u"", u"x")}, 3, "{4, 0}"},
+      {{{{2, 2}, {}, {u'c', char16_t{0xD83D}}, u"x"}}, 3, "{2, 2}"},
+      {{hunk(1, u"x", u"y")}, 4, "{1, 1}"},
+      {{{{1, 1}, {}, u"bc", u"y"}}, 4, "{1, 1}"},
   };
-  for (const auto& [hunks, words] : cases) {
-    EXPECT_EQ(merged(base, hunks), words);
-    EXPECT_EQ(merged(base, {hunk(0, u"abc", u"")}, hunks), words);
+  for (const auto& [hunks, code, place] : cases) {
+    const auto failure = "Error(domain: MarletDiff, code: " + std::to_string(code) + ", \"The change at " +
+                         place + " " + words[code - 1] + "\")";
+    EXPECT_EQ(merged(base, hunks), failure);
+    EXPECT_EQ(merged(base, {hunk(0, u"abc", u"")}, hunks), failure);
   }
 }
 

@@ -143,11 +143,11 @@ TEST(DispatchQueue, ValuesFollowTheTargetOfTheInnermostQueue) {
   const DispatchQueue queue("values", Kind::serial, DispatchQuality::background), plain("plain");
   const auto current = [] { return DispatchQueue::currentSpecific(key); };
 
-  background.setSpecific(key, std::optional(1));
+  background.setSpecific(key, 1);
   EXPECT_EQ(current(), std::nullopt) << "outside of blocks";
   EXPECT_EQ(queue.getSpecific(key), std::nullopt) << "a queue's own value only";
   EXPECT_EQ(queue.sync(current), 1);
-  queue.setSpecific(key, std::optional(2));
+  queue.setSpecific(key, 2);
   EXPECT_EQ(queue.sync(current), 2);
   EXPECT_EQ(queue.sync([&] { return plain.sync(current); }), std::nullopt);
   EXPECT_EQ(queue.sync([&] {
@@ -162,9 +162,9 @@ TEST(DispatchQueue, ValuesFollowTheTargetOfTheInnermostQueue) {
     done.set();
   });
   EXPECT_TRUE(done.wait());
-  queue.setSpecific(key, std::optional<int>());
+  queue.setSpecific(key, std::nullopt);
   EXPECT_EQ(queue.sync(current), 1);
-  background.setSpecific(key, std::optional<int>());
+  background.setSpecific(key, std::nullopt);
 }
 
 TEST(DispatchQueue, PoolThreadsThatAllWaitForQueuesDontStarveTheirBlocks) {
@@ -179,6 +179,26 @@ TEST(DispatchQueue, PoolThreadsThatAllWaitForQueuesDontStarveTheirBlocks) {
       if (queue.sync([&] { return value; }) == 3 && ++right == jobs) done.set();
     });
   }
+  EXPECT_TRUE(done.wait());
+}
+
+TEST(DispatchQueue, AWholePoolAsleepBehindAQueueWakesForItsBlocks) {
+  constexpr int jobs = 100;
+  const DispatchQueue queue("busy");
+  std::atomic<int> started{0}, finished{0};
+  bool ran = false;
+  Event done;
+  queue.sync([&] {
+    queue.async([&] { ran = true; });
+    for (int i = 0; i < jobs; ++i) {
+      DispatchQueue::global().async([&] {
+        ++started;
+        queue.sync([&] { EXPECT_TRUE(ran); });
+        if (++finished == jobs) done.set();
+      });
+    }
+    for (int before = -1; before != started; std::this_thread::sleep_for(50ms)) before = started;
+  });
   EXPECT_TRUE(done.wait());
 }
 

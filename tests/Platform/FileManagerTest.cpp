@@ -15,6 +15,7 @@ namespace MarletFoundation::test {
 namespace {
 
 namespace fs = std::filesystem;
+using namespace std::string_literals;
 using FileManager::Relationship;
 
 /// The errno that an action throws; 0 if it throws none.
@@ -31,7 +32,7 @@ int errorOf(Action action) {
 
 TEST(FileManager, RelationshipGoesByTheItemsThemselves) {
   const TemporaryDirectory directory;
-  Tree{{"a/b/file", ""}, {"ab/", ""}}.writeTo(directory.path());
+  Tree{{"a/b/file", ""s}, {"ab/", ""s}}.writeTo(directory.path());
   fs::create_directory_symlink("../ab", directory.path() / "a/out");
   fs::create_directory_symlink("a", directory.path() / "alias");
   const auto a = directory.url("a");
@@ -55,7 +56,7 @@ TEST(FileManager, RelationshipGoesByTheItemsThemselves) {
 
 TEST(FileManager, ListsAndReads) {
   const TemporaryDirectory directory;
-  Tree{{"b", "bytes"}, {"a/", ""}, {".hidden", ""}, {"B", ""}}.writeTo(directory.path());
+  Tree{{"b", "bytes"s}, {"a/", ""s}, {".hidden", ""s}, {"B", ""s}}.writeTo(directory.path());
   ASSERT_EQ(::mkfifo((directory.path() / "pipe").c_str(), 0600), 0);
   EXPECT_EQ(FileManager::contentsOfDirectory(directory.url(), true),
             (std::vector<std::string>{"B", "a", "b", "pipe"}));
@@ -80,14 +81,14 @@ TEST(FileManager, ListsAndReads) {
 
 TEST(FileManager, RefusesToReadMoreThanAGigabyteIntoMemory) {
   const TemporaryDirectory directory;
-  Tree{{"huge", ""}}.writeTo(directory.path());
+  Tree{{"huge", ""s}}.writeTo(directory.path());
   fs::resize_file(directory.path() / "huge", (std::uintmax_t{1} << 40));
   EXPECT_EQ(errorOf([&] { FileManager::readFile(directory.url("huge")); }), EFBIG);
 }
 
 TEST(FileManager, WritingAFileKeepsWhatBelongsToIt) {
   const TemporaryDirectory directory;
-  Tree{{"docs/file", "old"}, {"docs/sub/", ""}}.writeTo(directory.path());
+  Tree{{"docs/file", "old"s}, {"docs/sub/", ""s}}.writeTo(directory.path());
   const auto file = directory.path() / "docs/file";
   fs::permissions(file, fs::perms(0640));
   const bool hasAttributes = ::setxattr(file.c_str(), "user.kept", "yes", 3, 0) == 0;

@@ -20,6 +20,7 @@ namespace MarletFoundation::test {
 namespace {
 
 namespace fs = std::filesystem;
+using namespace std::string_literals;
 
 std::optional<std::string> contents(const std::optional<FileWrapper>& file) {
   const auto data = file ? file->regularFileContents() : std::nullopt;
@@ -42,7 +43,7 @@ std::string listing(const FileWrapper& node, const std::string& indent = {}) {
 }
 
 TEST(FileWrapper, OneTreeFromMemoryAndFromDisk) {
-  const Tree tree{{"a/b/c", "1"}, {"a/.d", ""}, {"e", std::string("\0\xFF", 2)}, {"empty/", ""}};
+  const Tree tree{{"a/b/c", "1"s}, {"a/.d", ""s}, {"e", std::string("\0\xFF", 2)}, {"empty/", ""s}};
   const TemporaryDirectory directory;
   tree.writeTo(directory.path());
   const FileWrapper fromDisk(directory.url());
@@ -66,7 +67,7 @@ TEST(FileWrapper, OneTreeFromMemoryAndFromDisk) {
 
 TEST(FileWrapper, OnlyTheRootMayBeALink) {
   const TemporaryDirectory directory;
-  Tree{{"outside/secret", "no"}, {"book/real/file", "yes"}}.writeTo(directory.path());
+  Tree{{"outside/secret", "no"s}, {"book/real/file", "yes"s}}.writeTo(directory.path());
   const auto book = directory.path() / "book";
   fs::create_directory_symlink("book", directory.path() / "link");
   fs::create_directory_symlink("../outside", book / "escape");
@@ -118,7 +119,7 @@ TEST(FileWrapper, NothingBlocksAndNoDeviceIsRead) {
 
 TEST(FileWrapper, WhatWasLookedAtStays) {
   const TemporaryDirectory directory;
-  Tree{{"read", "old"}, {"gone", "old"}, {"sub/file", "old"}}.writeTo(directory.path());
+  Tree{{"read", "old"s}, {"gone", "old"s}, {"sub/file", "old"s}}.writeTo(directory.path());
   const FileWrapper root(directory.url());
   EXPECT_EQ(contents(root.child("read")), "old");
   EXPECT_FALSE(root.child("late"));
@@ -131,7 +132,7 @@ TEST(FileWrapper, WhatWasLookedAtStays) {
 
 TEST(FileWrapper, ReadsTheTreeThatItOpenedWhenThePathNamesAnother) {
   const TemporaryDirectory directory;
-  Tree{{"book/sub/file", "old"}, {"other/sub/file", "new"}}.writeTo(directory.path());
+  Tree{{"book/sub/file", "old"s}, {"other/sub/file", "new"s}}.writeTo(directory.path());
   const FileWrapper root(directory.url("book"));
   fs::rename(directory.path() / "book", directory.path() / "moved");
   fs::rename(directory.path() / "other", directory.path() / "book");
@@ -182,7 +183,7 @@ TEST(FileWrapper, FilesThatChangeBetweenLookAndRead) {
 
 TEST(FileWrapper, DirectoriesThatChangeAfterTheirLook) {
   const TemporaryDirectory directory;
-  Tree{{"outside/file", "no"}, {"book/sub/inner/file", "yes"}}.writeTo(directory.path());
+  Tree{{"outside/file", "no"s}, {"book/sub/inner/file", "yes"s}}.writeTo(directory.path());
   const FileWrapper root(directory.url("book"));
   root.fileWrappers();
   const auto sub = root.child("sub");
@@ -197,7 +198,7 @@ TEST(FileWrapper, DirectoriesThatChangeAfterTheirLook) {
 TEST(FileWrapper, WhatCannotBeReadShowsAsAbsent) {
   if (::geteuid() == 0) GTEST_SKIP() << "root reads everything";
   const TemporaryDirectory directory;
-  Tree{{"closed/file", "x"}, {"file", "x"}}.writeTo(directory.path());
+  Tree{{"closed/file", "x"s}, {"file", "x"s}}.writeTo(directory.path());
   fs::permissions(directory.path() / "closed", fs::perms::none);
   fs::permissions(directory.path() / "file", fs::perms::none);
   const FileWrapper root(directory.url());
@@ -210,7 +211,7 @@ TEST(FileWrapper, WhatCannotBeReadShowsAsAbsent) {
 
 TEST(FileWrapper, GetsByWithFewDescriptors) {
   const TemporaryDirectory directory;
-  for (int i = 0; i < 300; ++i) {
+  for (int i = 0; i < 100; ++i) {
     const auto sub = directory.path() / std::to_string(i);
     fs::create_directories(sub / "deep/deeper");
     fill(sub / "deep/deeper/file", std::to_string(i));
@@ -221,19 +222,19 @@ TEST(FileWrapper, GetsByWithFewDescriptors) {
   std::vector<FileWrapper> kept;
   const rlimit few{static_cast<rlim_t>(::dup(0) + 6), before.rlim_max};
   ::setrlimit(RLIMIT_NOFILE, &few);
-  for (int i = 0; i < 300; ++i) kept.push_back(*root.child(std::to_string(i))->child("deep"));
+  for (int i = 0; i < 100; ++i) kept.push_back(*root.child(std::to_string(i))->child("deep"));
   int found = 0;
-  for (int i = 0; i < 300; ++i)
+  for (int i = 0; i < 100; ++i)
     found += contents(kept[i].child("deeper")->child("file")) == std::to_string(i);
-  const bool isListed = root.fileWrappers()->size() == 300;
+  const bool isListed = root.fileWrappers()->size() == 100;
   ::setrlimit(RLIMIT_NOFILE, &before);
-  EXPECT_EQ(found, 300);
+  EXPECT_EQ(found, 100);
   EXPECT_TRUE(isListed);
 }
 
 TEST(FileWrapper, ChildrenAreAddedAndRemovedInAnyTree) {
   const TemporaryDirectory directory;
-  const Tree tree{{"a", "1"}, {"b/c", "2"}};
+  const Tree tree{{"a", "1"s}, {"b/c", "2"s}};
   tree.writeTo(directory.path());
   for (auto root : {tree.wrapper(), FileWrapper(directory.url())}) {
     auto replacement = FileWrapper::regularFile(Data(std::string("3")));

@@ -1,4 +1,5 @@
 #include <gtest/gtest.h>
+#include <pthread.h>
 #include <signal.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
@@ -8,6 +9,7 @@
 #include <cerrno>
 #include <filesystem>
 #include <fstream>
+#include <functional>
 
 #include "MarletFoundation/Platform/Digest.h"
 #include "MarletFoundation/Platform/ErrorObject.h"
@@ -19,6 +21,7 @@ namespace MarletFoundation::test {
 namespace {
 
 namespace fs = std::filesystem;
+using namespace std::string_literals;
 
 FileWrapper file(std::string_view name, std::string text) {
   auto wrapper = FileWrapper::regularFile(Data(std::move(text)));
@@ -52,7 +55,7 @@ ino_t number(const fs::path& path) {
 
 TEST(FileWrapperWriting, TakesThePlaceOfWhatWasThere) {
   const TemporaryDirectory directory;
-  const Tree tree{{"a/b", "1"}, {"empty/", ""}, {"c", ""}};
+  const Tree tree{{"a/b", "1"s}, {"empty/", ""s}, {"c", ""s}};
   const auto target = directory.path() / "book";
   fs::create_symlink("book", directory.path() / "link");
   for (const bool isThere : {false, true}) {
@@ -74,7 +77,7 @@ TEST(FileWrapperWriting, TakesThePlaceOfWhatWasThere) {
 
 TEST(FileWrapperWriting, KeepsWhatADocumentIsMadeOf) {
   const TemporaryDirectory directory;
-  Tree{{"book/same", "1"}, {"book/loaded", "2"}, {"book/new", "3"}, {"book/sub/x", "4"}}.writeTo(
+  Tree{{"book/same", "1"s}, {"book/loaded", "2"s}, {"book/new", "3"s}, {"book/sub/x", "4"s}}.writeTo(
       directory.path());
   const auto book = directory.path() / "book";
   fs::create_symlink("../nowhere", book / "link");
@@ -111,7 +114,7 @@ TEST(FileWrapperWriting, KeepsWhatADocumentIsMadeOf) {
 
 TEST(FileWrapperWriting, WritesWhatWasReadAndNotWhatCameAfter) {
   const TemporaryDirectory directory;
-  Tree{{"book/file", "1"}}.writeTo(directory.path());
+  Tree{{"book/file", "1"s}}.writeTo(directory.path());
   FileWrapper root(directory.url("book"));
   ASSERT_TRUE(root.child("file")->regularFileContents());
   std::ofstream(directory.path() / "book/file") << "2";
@@ -121,7 +124,7 @@ TEST(FileWrapperWriting, WritesWhatWasReadAndNotWhatCameAfter) {
 
 TEST(FileWrapperWriting, AFailureLeavesTheOldDocument) {
   const TemporaryDirectory directory;
-  Tree{{"book/a", "old"}, {"pipes/a", "new"}}.writeTo(directory.path());
+  Tree{{"book/a", "old"s}, {"pipes/a", "new"s}}.writeTo(directory.path());
   ASSERT_EQ(::mkfifo((directory.path() / "pipes/z").c_str(), 0600), 0);
   const auto failing = [](std::string_view badName) {
     auto sub = FileWrapper::directory();
@@ -155,10 +158,24 @@ TEST(FileWrapperWriting, AFailureLeavesTheOldDocument) {
   EXPECT_EQ(names(directory), (std::vector<std::string>{"book"}));
 }
 
-TEST(FileWrapperWriting, DeeperThanAnyStack) {
-  constexpr int depth = 5000;
+/// Runs a function on a thread of little stack.
+void onSmallStack(std::function<void()> function) {
+  pthread_attr_t attributes;
+  ::pthread_attr_init(&attributes);
+  ASSERT_EQ(::pthread_attr_setstacksize(&attributes, std::size_t{256} << 10), 0);
+  pthread_t thread;
+  const auto run = [](void* argument) -> void* {
+    (*static_cast<std::function<void()>*>(argument))();
+    return nullptr;
+  };
+  ASSERT_EQ(::pthread_create(&thread, &attributes, run, &function), 0);
+  ::pthread_join(thread, nullptr);
+}
+
+TEST(FileWrapperWriting, DeeperThanTheStack) {
+  constexpr int depth = 700;
   const TemporaryDirectory directory;
-  {
+  onSmallStack([&] {
     auto deep = file("leaf", "here");
     for (int level = 0; level < depth; ++level) {
       auto above = FileWrapper::directory();
@@ -167,15 +184,15 @@ TEST(FileWrapperWriting, DeeperThanAnyStack) {
       deep = std::move(above);
     }
     deep.write(directory.url("deep"));
-  }
-  FileWrapper root(directory.url("deep"));
-  auto node = root;
-  for (int level = 1; level < depth; ++level) node = *node.child("d");
-  EXPECT_EQ(node.child("leaf")->regularFileContents()->view(), "here");
-  root.write(directory.url("deep"));
-  EXPECT_EQ(node.child("leaf")->regularFileContents()->view(), "here");
-  // Also takes the deep tree away again.
-  file("x", "").write(directory.url("deep"));
+    FileWrapper root(directory.url("deep"));
+    auto node = root;
+    for (int level = 1; level < depth; ++level) node = *node.child("d");
+    root.write(directory.url("deep"));
+    const auto leaf = node.child("leaf");
+    EXPECT_TRUE(leaf && leaf->regularFileContents()->view() == "here");
+    // Also takes the deep tree away again.
+    file("x", "").write(directory.url("deep"));
+  });
   EXPECT_EQ(names(directory), (std::vector<std::string>{"deep"}));
 }
 
@@ -206,7 +223,7 @@ TEST(FileWrapperWriting, SurvivesAWriterThatIsKilled) {
 
 TEST(FileWrapperWriting, RecoversFromAReplacementInTwoSteps) {
   const TemporaryDirectory directory;
-  Tree{{"book/file", "old"}}.writeTo(directory.path());
+  Tree{{"book/file", "old"s}}.writeTo(directory.path());
   MD5 digest;
   digest.update("book");
   std::string displaced = ".marlet-";

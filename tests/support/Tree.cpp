@@ -10,9 +10,9 @@ namespace MarletFoundation::test {
 namespace {
 
 std::string bytes(const Tree::Content& content) {
-  if (const auto* text = std::get_if<std::string>(&content)) return *text;
+  if (const auto* text = std::get_if<std::string>(&content.value)) return *text;
   const auto data =
-      PropertyListSerialization::write(std::get<PropertyListValue>(content), PropertyListFormat::xml);
+      PropertyListSerialization::write(std::get<PropertyListValue>(content.value), PropertyListFormat::xml);
   return std::string(data.view());
 }
 
@@ -51,14 +51,15 @@ Tree Tree::without(const std::string& path) const {
 
 Tree Tree::withKey(const std::string& path, std::string_view key, PropertyListValue value) const {
   Tree copy = *this;
-  std::get<PropertyListDictionary>(std::get<PropertyListValue>(copy.files_.at(path)).payload)[key] =
+  std::get<PropertyListDictionary>(std::get<PropertyListValue>(copy.files_.at(path).value).payload)[key] =
       std::move(value);
   return copy;
 }
 
 Tree Tree::withoutKey(const std::string& path, std::string_view key) const {
   Tree copy = *this;
-  std::get<PropertyListDictionary>(std::get<PropertyListValue>(copy.files_.at(path)).payload).erase(key);
+  std::get<PropertyListDictionary>(std::get<PropertyListValue>(copy.files_.at(path).value).payload)
+      .erase(key);
   return copy;
 }
 
@@ -82,8 +83,8 @@ void Tree::writeTo(const std::filesystem::path& directory) const {
 
 std::ostream& operator<<(std::ostream& out, const Tree& tree) {
   for (const auto& [path, content] : tree.files_) {
-    const auto* value = std::get_if<PropertyListValue>(&content);
-    out << path << ": " << (value ? description(*value) : std::get<std::string>(content)) << "\n";
+    const auto* value = std::get_if<PropertyListValue>(&content.value);
+    out << path << ": " << (value ? description(*value) : std::get<std::string>(content.value)) << "\n";
   }
   return out;
 }

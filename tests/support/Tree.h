@@ -7,6 +7,7 @@
 #include <variant>
 
 #include "MarletFoundation/Data/PropertyListValue.h"
+#include "MarletFoundation/Platform/Error.h"
 #include "MarletFoundation/Platform/FileWrapper.h"
 
 namespace MarletFoundation::test {
@@ -15,7 +16,15 @@ namespace MarletFoundation::test {
 /// property-list value is written in XML form.
 class Tree {
  public:
-  using Content = std::variant<std::string, PropertyListValue>;
+  struct Content {
+    std::variant<std::string, PropertyListValue> value;
+
+    Content() = default;
+    Content(const char* text) : value(std::string(text)) {}
+    Content(std::string text) : value(std::move(text)) {}
+    Content(PropertyListValue list) : value(std::move(list)) {}
+    Content(PropertyListDictionary list) : value(PropertyListValue(std::move(list))) {}
+  };
 
   Tree() = default;
   Tree(std::initializer_list<std::pair<const std::string, Content>> files) : files_(files) {}

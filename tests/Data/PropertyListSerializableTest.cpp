@@ -1,0 +1,206 @@
+#include "MarletFoundation/Data/PropertyListSerializable.h"
+
+#include <gtest/gtest.h>
+#include <rapidcheck.h>
+
+#include <cmath>
+#include <filesystem>
+#include <limits>
+
+#include "support/Tree.h"
+
+namespace MarletFoundation::test {
+namespace {
+
+using Array = PropertyListValue::Array;
+using enum PropertyListFormat;
+using PropertyListSerialization::read;
+using PropertyListSerialization::write;
+using namespace std::string_literals;
+
+rc::Gen<std::string> anyText() {
+  const auto piece =
+      rc::gen::element<std::string>("a", "B", "<", "&", ">", "\r", "\r\n", "\n", "\t", " ", "\"", "\xC3\xA9",
+                                    "\xE2\x80\xA8", "\xF0\x9F\x98\x80", "]]>");
+  return rc::gen::map(rc::gen::container<std::vector<std::string>>(piece), [](const auto& pieces) {
+    std::string text;
+    for (const auto& part : pieces) text += part;
+    return text;
+  });
+}
+
+rc::Gen<PropertyListValue> anyValue(int depth = 0) {
+  const auto children = depth < 3 ? 8 : 6;
+  return rc::gen::mapcat(rc::gen::inRange(0, children), [depth](int kind) -> rc::Gen<PropertyListValue> {
+    switch (kind) {
+      case 0:
+        return rc::gen::map(anyText(), [](std::string text) { return PropertyListValue(std::move(text)); });
+      case 1:
+        return rc::gen::map(rc::gen::arbitrary<std::int64_t>(),
+                            [](std::int64_t n) { return PropertyListValue(n); });
+      case 2:
+        return rc::gen::map(rc::gen::arbitrary<double>(), [](double n) { return PropertyListValue(n); });
+      case 3:
+        return rc::gen::map(rc::gen::arbitrary<bool>(), [](bool b) { return PropertyListValue(b); });
+      case 4:
+        return rc::gen::map(rc::gen::arbitrary<std::int32_t>(),
+                            [](std::int32_t n) { return PropertyListValue(Date{1.0 * n}); });
+      case 5:
+        return rc::gen::map(rc::gen::arbitrary<std::string>(),
+                            [](std::string s) { return PropertyListValue(Data(std::move(s))); });
+      case 6:
+        return rc::gen::map(rc::gen::container<Array>(anyValue(depth + 1)),
+                            [](Array a) { return PropertyListValue(std::move(a)); });
+      default:
+        return rc::gen::map(rc::gen::container<std::vector<std::pair<std::string, PropertyListValue>>>(
+                                rc::gen::pair(anyText(), anyValue(depth + 1))),
+                            [](const auto& pairs) {
+                              PropertyListDictionary dictionary;
+                              for (const auto& [key, value] : pairs) dictionary[key] = value;
+                              return PropertyListValue(std::move(dictionary));
+                            });
+    }
+  });
+}
+
+TEST(PropertyListSerialization, ReadsWhatItWrites) {
+  EXPECT_TRUE(rc::check([] {
+    const auto value = *anyValue();
+    for (const auto format : {xml, binary}) {
+      const auto written = write(value, format);
+      RC_ASSERT(read(written) == value);
+      RC_ASSERT(write(read(written), format) == written);
+      RC_ASSERT(propertyListValue(readPropertyListObject(written)) == value);
+    }
+    RC_ASSERT(propertyListValue(propertyListObject(value)) == value);
+  }));
+}
+
+TEST(PropertyListSerialization, WritesNumbersExactly) {
+  const double reals[] = {0.0,
+                          -0.0,
+                          0.1,
+                          1e-310,
+                          std::numeric_limits<double>::max(),
+                          std::numeric_limits<double>::infinity(),
+                          -std::numeric_limits<double>::infinity(),
+                          std::nan("")};
+  for (const auto format : {xml, binary}) {
+    for (const double real : reals) {
+      const auto result = *read(write(real, format)).floatingPoint();
+      EXPECT_TRUE((std::isnan(result) && std::isnan(real)) ||
+                  (result == real && std::signbit(result) == std::signbit(real)));
+    }
+    for (const std::int64_t integer : {INT64_MIN, std::int64_t{-1}, std::int64_t{255}, std::int64_t{256},
+                                       std::int64_t{65536}, std::int64_t{1} << 32, INT64_MAX})
+      EXPECT_EQ(read(write(integer, format)), PropertyListValue(integer));
+  }
+  EXPECT_EQ(read(write(Date{-0.25}, xml)), PropertyListValue(Date{-1}));
+  EXPECT_EQ(read(write(Date{-0.25}, binary)), PropertyListValue(Date{-0.25}));
+}
+
+TEST(PropertyListSerialization, WritesReadableXML) {
+  const PropertyListValue value(
+      PropertyListDictionary{{"b", "1 < 2\r"}, {"a", Array{true, Data("hi"s)}}, {"c", Array{}}});
+  EXPECT_EQ(
+      write(value, xml).view(),
+      "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<plist version=\"1.0\">\n<dict>\n\t<key>a</key>\n\t<array>\n"
+      "\t\t<true/>\n\t\t<data>aGk=</data>\n\t</array>\n\t<key>b</key>\n\t<string>1 &lt; 2&#13;</string>\n"
+      "\t<key>c</key>\n\t<array/>\n</dict>\n</plist>\n");
+}
+
+TEST(PropertyListSerialization, StoresEqualScalarsOnceInBinary) {
+  const auto objects = [](const PropertyListValue& value) {
+    const auto bytes = write(value, binary).bytes();
+    return bytes[bytes.size() - 17] + 256 * bytes[bytes.size() - 18];
+  };
+  EXPECT_EQ(objects(Array{"a", "a", PropertyListDictionary{{"a", "a"}}}), 3);
+  EXPECT_EQ(objects(Array{1, 1.0, true, Date{1}, "1", Data("1"s), 1, 1.0, true, Date{1}, "1", Data("1"s)}),
+            7);
+  EXPECT_EQ(objects(Array{0.0, -0.0, 0, false}), 5);
+  // A long text is stored again before a reader would take its repetition for an attack.
+  const Array repeated(5000, PropertyListValue(std::string(10000, 'x')));
+  const auto written = write(repeated, binary);
+  EXPECT_LT(written.size(), 50000000U / 4);
+  EXPECT_TRUE(read(written) == PropertyListValue(repeated));
+}
+
+int writingError(const PropertyListValue& value, PropertyListFormat format) {
+  try {
+    write(value, format);
+    return 0;
+  } catch (const ErrorObject& error) {
+    EXPECT_EQ(error.domain(), PropertyListErrorDomain);
+    return error.code();
+  }
+}
+
+TEST(PropertyListSerialization, RefusesWhatAFormCannotCarry) {
+  const auto text = static_cast<int>(PropertyListErrorCode::unwritableText);
+  const auto date = static_cast<int>(PropertyListErrorCode::unwritableDate);
+  const auto depth = static_cast<int>(PropertyListErrorCode::tooDeep);
+  const auto nested = [](int levels) {
+    PropertyListValue value(Array{});
+    for (; levels > 1; --levels) {
+      Array array;
+      array.push_back(std::move(value));
+      value = PropertyListValue(std::move(array));
+    }
+    return value;
+  };
+  const struct {
+    PropertyListValue value;
+    int inXML;
+    int inBinary;
+  } cases[] = {
+      {"\x01", text, 0},
+      {"a\0"s, text, 0},
+      {"\xEF\xBF\xBF", text, 0},
+      {"\x7F\xC2\x80", 0, 0},
+      {"\xFF", text, text},
+      {"\xED\xA0\x80", text, text},
+      {PropertyListDictionary{{"\xC0\x80", 1}}, text, text},
+      {PropertyListDictionary{{"\x02", 1}}, text, 0},
+      {Date{std::nan("")}, date, date},
+      {Date{std::numeric_limits<double>::infinity()}, date, date},
+      {Date{1e15}, date, 0},
+      {nested(512), 0, 0},
+      {nested(513), depth, depth},
+      {nested(100000), depth, depth},
+  };
+  for (const auto& [value, inXML, inBinary] : cases) {
+    EXPECT_EQ(writingError(value, xml), inXML) << description(value).substr(0, 80);
+    EXPECT_EQ(writingError(value, binary), inBinary) << description(value).substr(0, 80);
+    EXPECT_TRUE(inXML != 0 || read(write(value, xml)) == value);
+    EXPECT_TRUE(inBinary != 0 || read(write(value, binary)) == value);
+  }
+}
+
+struct Fatal {};
+
+TEST(PropertyListSerializable, StopsForProgrammingErrors) {
+  const auto before =
+      setFatalErrorHandler([](std::string_view, const std::source_location&) { throw Fatal(); });
+  EXPECT_THROW(propertyListData(PropertyListValue("\x01"), xml), Fatal);
+  const auto dictionary = std::make_shared<PlainDictionary>(PropertyListObjects{NumberObject::integer(1)},
+                                                            PropertyListObjects{NumberObject::integer(1)});
+  EXPECT_THROW(fromPropertyListObject<PropertyListValue>(dictionary), Fatal);
+  setFatalErrorHandler(before);
+  EXPECT_EQ(fromPropertyListObject<PropertyListValue>(NumberObject::integer(1)), PropertyListValue(1));
+}
+
+TEST(PropertyListSerializable, ReadsAndWritesFiles) {
+  const TemporaryDirectory directory;
+  const PropertyListValue value(PropertyListDictionary{{"a", 1}});
+  for (const auto format : {xml, binary}) {
+    writePropertyList(value, directory.url("file.plist"), format);
+    EXPECT_EQ(fromContentsOfPropertyListAtURL<PropertyListValue>(directory.url("file.plist")), value);
+  }
+  EXPECT_THROW(writePropertyList(value, directory.url("none/file.plist"), binary), ErrorObject);
+  EXPECT_FALSE(std::filesystem::exists(directory.path() / "none"));
+  EXPECT_THROW(fromContentsOfPropertyListAtURL<PropertyListValue>(directory.url("absent.plist")),
+               ErrorObject);
+}
+
+}  // namespace
+}  // namespace MarletFoundation::test

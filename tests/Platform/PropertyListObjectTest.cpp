@@ -1,0 +1,99 @@
+#include "MarletFoundation/Platform/PropertyListObject.h"
+
+#include <gtest/gtest.h>
+
+#include "MarletFoundation/Data/PropertyListSerializable.h"
+
+namespace MarletFoundation::test {
+namespace {
+
+PropertyListObjectPointer text(std::string value) { return std::make_shared<StringObject>(std::move(value)); }
+
+std::string texts(const PropertyListObjects& objects) {
+  std::string all;
+  for (const auto& object : objects) all += dynamic_cast<const StringObject&>(*object).value;
+  return all;
+}
+
+PropertyListObjectPointer array(PropertyListObjects objects) {
+  return std::make_shared<ArrayObject>(std::move(objects));
+}
+
+struct HostObject : PropertyListObject {
+  bool isEqual(const PropertyListObject& other) const override { return this == &other; }
+  std::size_t hash() const override { return 0; }
+};
+
+TEST(PropertyListObject, SortsOnlyTheKeys) {
+  const PlainDictionary plain({text("1"), text("2"), text("3"), text("4")},
+                              {text("b"), text("a"), text("c"), text("a")});
+  const MLFSortedDictionary sorted(plain);
+  EXPECT_EQ(sorted.count(), 3U);
+  EXPECT_EQ(texts(sorted.allKeys()), "abc");
+  EXPECT_EQ(texts(sorted.allValues()), "143");
+  EXPECT_EQ(texts({sorted.objectForKey(*text("a"))}), "4");
+  EXPECT_EQ(sorted.objectForKey(*text("d")), nullptr);
+  std::string walked;
+  for (auto keys = sorted.keyEnumerator(); const auto key = keys.nextObject();) walked += texts({key});
+  for (auto values = sorted.objectEnumerator(); const auto value = values.nextObject();)
+    walked += texts({value});
+  EXPECT_EQ(walked, "abc143");
+  EXPECT_TRUE(sorted.isEqualToDictionary(plain) && plain.isEqual(sorted));
+  EXPECT_FALSE(sorted.isEqual(MLFSortedDictionary({text("1")}, {text("a")})));
+}
+
+TEST(PropertyListObject, ConvertsNumbersByTypeCode) {
+  const auto converted = [](std::string code, NumberObject::Value number) {
+    const auto value = propertyListValue(std::make_shared<NumberObject>(std::move(code), number));
+    return value ? description(*value) : "nothing";
+  };
+  for (const auto* code : {"c", "C", "B"})
+    EXPECT_EQ(converted(code, std::int64_t{7}), "boolean(true)") << code;
+  for (const auto* code : {"i", "s", "l", "q", "I", "S", "L", "Q"})
+    EXPECT_EQ(converted(code, std::int64_t{-7}), "integer(-7)") << code;
+  for (const auto* code : {"f", "d"}) EXPECT_EQ(converted(code, std::int64_t{7}), "floatingPoint(7)") << code;
+  for (const auto* code : {"", "b", "cc", "qd", "D", "@"})
+    EXPECT_EQ(converted(code, std::int64_t{7}), "nothing") << code;
+  EXPECT_EQ(converted("Q", ~std::uint64_t{0}), "integer(-1)");
+  EXPECT_EQ(converted("q", 1e300), "integer(9223372036854775807)");
+}
+
+TEST(PropertyListObject, GivesNothingForWhatNoCaseFits) {
+  const auto host = std::make_shared<HostObject>();
+  EXPECT_FALSE(propertyListValue(nullptr));
+  EXPECT_FALSE(propertyListValue(host));
+  EXPECT_FALSE(propertyListValue(array({text("a"), array({text("b"), host})})));
+  EXPECT_FALSE(propertyListValue(std::make_shared<PlainDictionary>(
+      PropertyListObjects{text("a")}, PropertyListObjects{NumberObject::integer(1)})));
+  EXPECT_EQ(propertyListValue(array({})), PropertyListValue(PropertyListValue::Array{}));
+  EXPECT_EQ(
+      propertyListValue(std::make_shared<PlainDictionary>(PropertyListObjects{}, PropertyListObjects{})),
+      PropertyListValue(PropertyListDictionary{}));
+}
+
+TEST(PropertyListObject, IsReadWithTypeCodes) {
+  const auto object =
+      readPropertyListObject(Data(std::string("<array><true/><integer>1</integer><real>1</real></array>")));
+  std::string codes;
+  for (const auto& child : dynamic_cast<const ArrayObject&>(*object).objects())
+    codes += dynamic_cast<const NumberObject&>(*child).typeCode();
+  EXPECT_EQ(codes, "cqd");
+}
+
+TEST(PropertyListObject, ComesOfDeepValuesWithSortedDictionaries) {
+  PropertyListValue deep(true);
+  for (int i = 0; i < 200000; ++i) {
+    PropertyListValue::Array one;
+    one.push_back(std::move(deep));
+    deep = PropertyListValue(std::move(one));
+  }
+  const auto object = propertyListObject(deep);
+  EXPECT_TRUE(propertyListValue(object) == deep);
+  const auto sorted =
+      propertyListObject(PropertyListDictionary{{"b", PropertyListDictionary{{"z", 1}, {"y", 2}}}});
+  const auto inner = dynamic_cast<const MLFSortedDictionary&>(*sorted).objectForKey(*text("b"));
+  EXPECT_EQ(texts(dynamic_cast<const MLFSortedDictionary&>(*inner).allKeys()), "yz");
+}
+
+}  // namespace
+}  // namespace MarletFoundation::test
