@@ -9,45 +9,44 @@
 
 namespace MarletFoundation {
 
-/// The open descriptors of a tree below its root: those of directories, which may be needed again, and those
-/// that wait to be closed. They are closed in runs of consecutive numbers, one system call a run, since a
-/// book of many pages would otherwise spend a third of its system calls on closing.
+/// The open descriptors of a tree below its root, each in its slot. When there are too many, they are closed
+/// in runs of consecutive numbers, one system call a run, since a book of many pages would otherwise spend a
+/// third of its system calls on closing.
 class DiskTree {
  public:
   static constexpr std::size_t Capacity = 64;
   /// How many of the directory in use and its nearest ancestors stay open when the others are closed.
   static constexpr int Nearest = 12;
-  /// How many of its other ancestors stay open, evenly spread, so that the way up from a great depth is
-  /// short.
+  /// How many of its other ancestors stay open, evenly spread, so that the way up from a great depth is short.
   static constexpr int MostSpread = 24;
 
   DiskTree() { open_.reserve(Capacity); }
   ~DiskTree() { closeAllBut(nullptr); }
 
-  /// Takes over an open descriptor; `owner` is its directory or null. The descriptors of `inUse` and of its
-  /// nearest ancestors stay open.
-  void adopt(int descriptor, DiskDirectory* owner, const DiskDirectory* inUse) {
+  /// Keeps an open descriptor in the slot. Those of `inUse` and of its nearest ancestors stay open.
+  void keep(int descriptor, int& slot, const DiskDirectory* inUse) {
     if (open_.size() == Capacity) closeAllBut(inUse);
-    open_.push_back({descriptor, owner});
+    open_.push_back({descriptor, &slot});
+    slot = descriptor;
   }
 
-  void disown(const DiskDirectory* owner) {
+  void forget(const int& slot) {
     const auto found =
-        std::find_if(open_.rbegin(), open_.rend(), [&](const Entry& entry) { return entry.owner == owner; });
-    if (found != open_.rend()) found->owner = nullptr;
+        std::find_if(open_.rbegin(), open_.rend(), [&](const Entry& entry) { return entry.slot == &slot; });
+    if (found != open_.rend()) found->slot = nullptr;
   }
 
   void closeAllBut(const DiskDirectory* inUse, int nearest = Nearest, int spread = MostSpread) {
-    std::vector<const DiskDirectory*> kept;
+    std::vector<const int*> kept;
     const int stride =
         inUse && spread > 0
             ? static_cast<int>(std::bit_ceil(static_cast<unsigned>(inUse->depth_ / spread + 1)))
             : INT_MAX;
     for (; inUse && inUse->parent_; inUse = inUse->parent_.get()) {
-      if (nearest-- > 0 || inUse->depth_ % stride == 0) kept.push_back(inUse);
+      if (nearest-- > 0 || inUse->depth_ % stride == 0) kept.push_back(&inUse->descriptor_);
     }
     const auto closing = std::partition(open_.begin(), open_.end(), [&](const Entry& entry) {
-      return entry.owner && std::find(kept.begin(), kept.end(), entry.owner) != kept.end();
+      return std::find(kept.begin(), kept.end(), entry.slot) != kept.end();
     });
     std::sort(closing, open_.end(),
               [](const Entry& a, const Entry& b) { return a.descriptor < b.descriptor; });
@@ -55,7 +54,7 @@ class DiskTree {
       auto end = run;
       int next = run->descriptor;
       for (; end != open_.end() && end->descriptor == next; ++end, ++next) {
-        if (end->owner) end->owner->descriptor_ = -1;
+        if (end->slot) *end->slot = -1;
       }
       closeRun(run->descriptor, next - 1);
       run = end;
@@ -78,7 +77,7 @@ class DiskTree {
  private:
   struct Entry {
     int descriptor;
-    DiskDirectory* owner;
+    int* slot;  // null once it went away
   };
 
   static void closeRun(int first, int last) {
@@ -90,40 +89,31 @@ class DiskTree {
   std::vector<Entry> open_;
 };
 
-DiskDirectory::DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string name)
+DiskDirectory::DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string_view name)
     : parent_(std::move(parent)),
-      name_(std::move(name)),
+      name_(name),
       tree_(parent_ ? parent_->tree_ : nullptr),
       depth_(parent_ ? parent_->depth_ + 1 : 0) {}
 
 DiskDirectory::~DiskDirectory() {
-  if (descriptor_ >= 0) tree_->disown(this);
+  if (descriptor_ >= 0) tree_->forget(descriptor_);
   // A long chain of ancestors that nothing else holds goes link by link, not in a recursion.
   auto ancestor = std::move(parent_);
   while (ancestor && ancestor.use_count() == 1) ancestor = std::shared_ptr(std::move(ancestor->parent_));
 }
 
 std::shared_ptr<DiskDirectory> DiskDirectory::root(Descriptor descriptor) {
-  auto directory = std::make_shared<DiskDirectory>(Key(), nullptr, std::string());
+  auto directory = std::make_shared<DiskDirectory>(Key(), nullptr, std::string_view());
   directory->ownTree_ = std::make_unique<DiskTree>();
   directory->tree_ = directory->ownTree_.get();
   directory->tree_->root = std::move(descriptor);
   return directory;
 }
 
-std::shared_ptr<DiskDirectory> DiskDirectory::child(std::shared_ptr<DiskDirectory> parent, std::string name) {
-  return std::make_shared<DiskDirectory>(Key(), std::move(parent), std::move(name));
-}
-
-std::shared_ptr<DiskDirectory> DiskDirectory::openChild(const std::shared_ptr<DiskDirectory>& parent,
-                                                        std::string name) {
-  const int parentDescriptor = parent->descriptor();
-  if (parentDescriptor < 0) return nullptr;
-  const int opened = parent->tree_->openAt(parent.get(), parentDescriptor, name.c_str(), DirectoryFlags);
-  if (opened < 0) return nullptr;
-  auto directory = child(parent, std::move(name));
-  directory->tree_->adopt(opened, directory.get(), parent.get());
-  directory->descriptor_ = opened;
+std::shared_ptr<DiskDirectory> DiskDirectory::child(std::shared_ptr<DiskDirectory> parent,
+                                                    std::string_view name, Descriptor opened) {
+  auto directory = std::make_shared<DiskDirectory>(Key(), std::move(parent), name);
+  if (opened) directory->parent_->keep(std::move(opened), directory->descriptor_);
   return directory;
 }
 
@@ -137,8 +127,7 @@ int DiskDirectory::descriptor() {
   for (auto next = closed.rbegin(); next != closed.rend(); ++next) {
     number = tree_->openAt(open, number, (*next)->name_.c_str(), DirectoryFlags);
     if (number < 0) return -1;
-    tree_->adopt(number, *next, open);
-    (*next)->descriptor_ = number;
+    tree_->keep(number, (*next)->descriptor_, open);
     open = *next;
   }
   return number;
@@ -149,13 +138,14 @@ int DiskDirectory::status(const char* name, struct stat& status) {
   return number < 0 ? -1 : retrying([&] { return ::fstatat(number, name, &status, AT_SYMLINK_NOFOLLOW); });
 }
 
-Descriptor DiskDirectory::openFile(const char* name) {
+Descriptor DiskDirectory::open(const char* name, int flags) {
   const int number = descriptor();
-  if (number < 0) return Descriptor();
-  return Descriptor(tree_->openAt(this, number, name, ReadingFlags | O_NOFOLLOW));
+  return number < 0 ? Descriptor() : Descriptor(tree_->openAt(this, number, name, flags));
 }
 
-void DiskDirectory::closeLater(Descriptor descriptor) { tree_->adopt(descriptor.release(), nullptr, this); }
+void DiskDirectory::keep(Descriptor descriptor, int& slot) { tree_->keep(descriptor.release(), slot, this); }
+
+void DiskDirectory::forget(const int& slot) { tree_->forget(slot); }
 
 std::optional<std::vector<DiskDirectory::Entry>> DiskDirectory::entries() {
   const int number = descriptor();

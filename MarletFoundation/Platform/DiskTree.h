@@ -13,17 +13,19 @@ class DiskTree;
 /// A directory of a tree on disk, reached from the tree's root by names alone, with no link followed. Its
 /// descriptor is opened when needed and may be closed in between, so that a tree of any size and depth gets
 /// by with a few. One thread at a time may use a tree.
+///
+/// A descriptor that may be wanted again is kept in a slot, an `int` of whoever wants it. The tree empties
+/// the slot (-1) when it closes the descriptor to make room.
 class DiskDirectory {
  public:
   /// The root of a tree; its descriptor stays open.
   static std::shared_ptr<DiskDirectory> root(Descriptor descriptor);
-  /// A directory by name. It isn't looked at before it is used.
-  static std::shared_ptr<DiskDirectory> child(std::shared_ptr<DiskDirectory> parent, std::string name);
-  /// The directory of that name, opened; null and errno when there is none.
-  static std::shared_ptr<DiskDirectory> openChild(const std::shared_ptr<DiskDirectory>& parent,
-                                                  std::string name);
+  /// A directory by name, with its descriptor when it is open already. Otherwise it isn't looked at before it
+  /// is used.
+  static std::shared_ptr<DiskDirectory> child(std::shared_ptr<DiskDirectory> parent, std::string_view name,
+                                              Descriptor opened = {});
   struct Key {};  // only the functions above make directories
-  DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string name);
+  DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string_view name);
   ~DiskDirectory();
   DiskDirectory(const DiskDirectory&) = delete;
   DiskDirectory& operator=(const DiskDirectory&) = delete;
@@ -33,10 +35,12 @@ class DiskDirectory {
   int descriptor();
   /// Looks at the entry of that name itself, not at what it may link to.
   int status(const char* name, struct stat& status);
-  /// Opens an entry for reading. Nothing is waited for, but the caller rules out that it is a device.
-  Descriptor openFile(const char* name);
-  /// Takes over a descriptor, to be closed together with others.
-  void closeLater(Descriptor descriptor);
+  /// Opens an entry itself for reading, waiting for nothing.
+  Descriptor open(const char* name, int flags = ReadingFlags | O_NOFOLLOW);
+  /// Keeps a descriptor in a slot.
+  void keep(Descriptor descriptor, int& slot);
+  /// Must be told before a slot goes away that isn't empty.
+  void forget(const int& slot);
   /// The names and kinds (DT_REG and so on) of all entries; nothing and errno when they can't be listed.
   struct Entry {
     std::string name;

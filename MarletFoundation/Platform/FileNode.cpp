@@ -53,24 +53,25 @@ std::shared_ptr<FileNode> FileNode::onDisk(std::shared_ptr<DiskDirectory> parent
 
 std::shared_ptr<FileNode> FileNode::atPath(const std::string& path) {
   auto node = onDisk(nullptr, path);
-  node->look();
+  node->lookByName();
   if (node->kind_ == Kind::unreadable) {
     const auto displaced = node->error_ == ENOENT ? AtomicReplacement::displacedPath(path) : std::nullopt;
     if (!displaced) throwPosix(node->error_, path);
     node = onDisk(nullptr, *displaced);
-    node->look();
+    node->lookByName();
   }
   if (node->kind_ == Kind::directory) {
     Descriptor root(retrying([&] { return ::open(node->diskName_.c_str(), DirectoryFlags & ~O_NOFOLLOW); }));
     if (!root) throwPosix(errno, path);
     node->becomeDirectory(DiskDirectory::root(std::move(root)), true);
-  } else if (node->kind_ == Kind::regularFile && !node->openUnchecked()) {
+  } else if (node->kind_ == Kind::regularFile && !node->openOnDisk()) {
     throwPosix(errno, path);
   }
   return node;
 }
 
 FileNode::~FileNode() {
+  if (descriptor_ >= 0) parent_->forget(descriptor_);
   if (!directory_) return;
   // Level by level: a tree may be deeper than the stack.
   std::vector<std::unique_ptr<Directory>> pending;
@@ -100,11 +101,29 @@ int FileNode::lookAgain(struct stat& status) {
   return retrying([&] { return ::stat(diskName_.c_str(), &status); });
 }
 
+/// Looks at an item by opening it, since a look at what is open costs half as much as one by name, and most
+/// files are read next. A device is opened by this too, but never read.
 void FileNode::look() {
+  auto opened = parent_->open(diskName_.c_str());
+  struct stat status;
+  if (!opened || ::fstat(opened.get(), &status) != 0) {
+    if (!isAbsence(errno)) return lookByName();
+    error_ = errno;
+    return;
+  }
+  kind_ = kindOf(status.st_mode);
+  if (kind_ == Kind::regularFile) {
+    stamp_ = Stamp(status);
+    parent_->keep(std::move(opened), descriptor_);
+  } else if (kind_ == Kind::directory) {
+    becomeDirectory(DiskDirectory::child(parent_, diskName_, std::move(opened)), true);
+  }
+}
+
+void FileNode::lookByName() {
   struct stat status;
   if (lookAgain(status) == 0) {
     kind_ = kindOf(status.st_mode);
-    stamp_ = Stamp(status);
   } else {
     kind_ = Kind::unreadable;
     error_ = errno;
@@ -119,7 +138,6 @@ void FileNode::becomeDirectory(std::shared_ptr<DiskDirectory> onDisk, std::optio
 }
 
 FileNode::Kind FileNode::kind() {
-  if (kind_ == Kind::unknown) look();
   if (kind_ == Kind::directory && !directory_) {
     becomeDirectory(DiskDirectory::child(parent_, diskName_), std::nullopt);
   }
@@ -147,9 +165,9 @@ std::shared_ptr<FileNode> FileNode::child(std::string_view name) {
 
 std::shared_ptr<FileNode> FileNode::lookUp(std::string_view name) {
   if (directory_->expectsDirectories) {
-    if (auto opened = DiskDirectory::openChild(directory_->onDisk, std::string(name))) {
+    if (auto opened = directory_->onDisk->open(std::string(name).c_str(), DirectoryFlags)) {
       auto node = std::make_shared<FileNode>(Key());
-      node->becomeDirectory(std::move(opened), true);
+      node->becomeDirectory(DiskDirectory::child(directory_->onDisk, name, std::move(opened)), true);
       return node;
     }
     if (isAbsence(errno)) return nullptr;
@@ -174,7 +192,11 @@ const FileNode::Children* FileNode::allChildren() {
     const auto [place, isNew] = children.try_emplace(name);
     if (!isNew) continue;
     place->second = onDisk(onDiskDirectory, name);
-    if (type != DT_UNKNOWN) place->second->kind_ = kindOf(DTTOIF(type));
+    if (type == DT_UNKNOWN) {
+      place->second->lookByName();
+    } else {
+      place->second->kind_ = kindOf(DTTOIF(type));
+    }
   }
   isListed = true;
   return &children;
@@ -198,35 +220,33 @@ std::optional<Data> FileNode::contents() {
 /// second look when it holds as many bytes as that look told; `readToEnd` sees to the rest.
 void FileNode::readContents() {
   contentsWereRead_ = true;
-  // A file that was only seen in a listing is looked at first: whatever stands there now, only a regular
-  // file is opened.
-  const bool wasLookedAt = stamp_.number != 0;
-  auto file = wasLookedAt ? openUnchecked() : openOnDisk();
-  if (!file) {
-    error_ = errno;
-    return;
+  Descriptor opened;
+  if (descriptor_ < 0) {
+    struct stat status;
+    opened = openRegularFile(status);
+    if (!opened) {
+      error_ = errno;
+      return;
+    }
+    stamp_ = Stamp(status);
   }
-  struct stat status;
-  if (!wasLookedAt && ::fstat(file.get(), &status) == 0) stamp_ = Stamp(status);
-  auto read = readToEnd(file.get(), stamp_.size);
+  auto read = readToEnd(opened ? opened.get() : descriptor_, stamp_.size);
   contents_ = std::move(read.data);
   error_ = read.error;
-  if (parent_) parent_->closeLater(std::move(file));
 }
 
-Descriptor FileNode::openUnchecked() {
-  if (parent_) return parent_->openFile(diskName_.c_str());
-  return Descriptor(retrying([&] { return ::open(diskName_.c_str(), ReadingFlags); }));
+Descriptor FileNode::openRegularFile(struct stat& status) {
+  Descriptor file = parent_ ? parent_->open(diskName_.c_str())
+                            : Descriptor(retrying([&] { return ::open(diskName_.c_str(), ReadingFlags); }));
+  if (!file || ::fstat(file.get(), &status) != 0) return Descriptor();
+  if (S_ISREG(status.st_mode)) return file;
+  errno = EINVAL;
+  return Descriptor();
 }
 
 Descriptor FileNode::openOnDisk() {
   struct stat status;
-  if (lookAgain(status) != 0) return Descriptor();
-  Descriptor file = S_ISREG(status.st_mode) ? openUnchecked() : Descriptor();
-  if (file && ::fstat(file.get(), &status) != 0) return Descriptor();
-  if (S_ISREG(status.st_mode)) return file;
-  errno = EINVAL;
-  return Descriptor();
+  return openRegularFile(status);
 }
 
 }  // namespace MarletFoundation

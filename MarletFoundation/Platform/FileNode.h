@@ -15,11 +15,11 @@ namespace MarletFoundation {
 /// of the disk are asked for once, when they are first needed.
 class FileNode {
  public:
-  enum class Kind : unsigned char { unknown, directory, regularFile, symbolicLink, other, unreadable };
+  enum class Kind : unsigned char { directory, regularFile, symbolicLink, other, unreadable };
   /// Children by name, as far as they were looked at; null stands for one that isn't there.
   using Children = std::map<std::string, std::shared_ptr<FileNode>, std::less<>>;
 
-  /// What a look at a file's name found, enough to tell whether it has changed since.
+  /// What a look at an open file found, enough to tell whether it has changed since.
   struct Stamp {
     ino_t number = 0;
     off_t size = 0;
@@ -43,7 +43,6 @@ class FileNode {
   std::optional<std::string> preferredName() const;
   void setPreferredName(std::string name);
 
-  /// The kind, looked up if need be; never `unknown`.
   Kind kind();
   /// The errno of an unreadable node.
   int error() const { return error_; }
@@ -69,7 +68,7 @@ class FileNode {
   const std::shared_ptr<DiskDirectory>& diskDirectory() const;
   /// Looks at the item on disk as it is now; what the node knows stays.
   int lookAgain(struct stat& status);
-  /// Opens the file on disk for reading, after a look that it is a regular one; none and errno otherwise.
+  /// Opens the file on disk for reading; none and errno when that fails, or it is no regular one.
   Descriptor openOnDisk();
 
  private:
@@ -87,13 +86,15 @@ class FileNode {
 
   static std::shared_ptr<FileNode> onDisk(std::shared_ptr<DiskDirectory> parent, std::string_view name);
   void look();
+  void lookByName();
   void becomeDirectory(std::shared_ptr<DiskDirectory> onDisk, std::optional<bool> wasOpened);
   std::shared_ptr<FileNode> lookUp(std::string_view name);
   void readContents();
-  Descriptor openUnchecked();
+  Descriptor openRegularFile(struct stat& status);
 
-  Kind kind_ = Kind::unknown;
+  Kind kind_ = Kind::unreadable;
   bool contentsWereRead_ = false;
+  int descriptor_ = -1;  // of a regular file in a directory, from the look on: a slot of its tree
   int error_ = 0;
   std::unique_ptr<std::string> preferredName_;
   std::shared_ptr<DiskDirectory> parent_;

@@ -111,7 +111,6 @@ class TreeWriter {
       case FileNode::Kind::unreadable:
         fail(child->error(), *job.target, name);
       case FileNode::Kind::other:
-      case FileNode::Kind::unknown:
         fail(EINVAL, *job.target, name);
     }
   }
@@ -177,7 +176,7 @@ class TreeWriter {
     if (!job.original || job.original->status(name.c_str(), status) != 0 || !S_ISREG(status.st_mode)) {
       return Descriptor();
     }
-    return job.original->openFile(name.c_str());
+    return job.original->open(name.c_str());
   }
 
   void copyLink(DiskDirectory& target, const std::string& name, FileNode& link) {
