@@ -24,14 +24,19 @@ class MARLET_EXPORT PropertyListDictionary {
   struct Entry;
   using Entries = std::vector<Entry>;
 
-  PropertyListDictionary() = default;
+  PropertyListDictionary() noexcept;
+  PropertyListDictionary(const PropertyListDictionary& other);
+  PropertyListDictionary(PropertyListDictionary&& other) noexcept;
+  PropertyListDictionary& operator=(const PropertyListDictionary& other);
+  PropertyListDictionary& operator=(PropertyListDictionary&& other) noexcept;
+  ~PropertyListDictionary();
   /// Of equal keys the last wins.
   PropertyListDictionary(std::initializer_list<std::pair<std::string_view, PropertyListValue>> entries);
   /// Takes entries in any order; of equal keys the last wins.
   explicit PropertyListDictionary(Entries entries);
 
-  std::size_t size() const { return entries_.size(); }
-  bool empty() const { return entries_.empty(); }
+  std::size_t size() const;
+  bool empty() const;
   /// The value under `key`, or null. The pointer holds until the dictionary changes.
   const PropertyListValue* find(std::string_view key) const;
   PropertyListValue* find(std::string_view key);
@@ -41,8 +46,8 @@ class MARLET_EXPORT PropertyListDictionary {
   /// True when there was one.
   bool erase(std::string_view key);
 
-  Entries::const_iterator begin() const { return entries_.begin(); }
-  Entries::const_iterator end() const { return entries_.end(); }
+  Entries::const_iterator begin() const;
+  Entries::const_iterator end() const;
   bool operator==(const PropertyListDictionary& other) const;
 
  private:
@@ -108,6 +113,22 @@ struct PropertyListDictionary::Entry {
   PropertyListKey key;
   PropertyListValue value;
 };
+
+// These need the whole entry, and so stand behind it.
+inline PropertyListDictionary::PropertyListDictionary() noexcept = default;
+inline PropertyListDictionary::PropertyListDictionary(const PropertyListDictionary&) = default;
+inline PropertyListDictionary::PropertyListDictionary(PropertyListDictionary&&) noexcept = default;
+inline PropertyListDictionary& PropertyListDictionary::operator=(const PropertyListDictionary&) = default;
+inline PropertyListDictionary& PropertyListDictionary::operator=(PropertyListDictionary&&) noexcept = default;
+inline PropertyListDictionary::~PropertyListDictionary() = default;
+inline std::size_t PropertyListDictionary::size() const { return entries_.size(); }
+inline bool PropertyListDictionary::empty() const { return entries_.empty(); }
+inline PropertyListDictionary::Entries::const_iterator PropertyListDictionary::begin() const {
+  return entries_.begin();
+}
+inline PropertyListDictionary::Entries::const_iterator PropertyListDictionary::end() const {
+  return entries_.end();
+}
 
 /// The printed form: `integer(7)`, `string("X")`, `array([…])`, `dictionary(["k": …])`.
 MARLET_EXPORT std::string description(const PropertyListValue& value);

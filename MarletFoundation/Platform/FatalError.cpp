@@ -22,7 +22,7 @@ FatalErrorHandler setFatalErrorHandler(FatalErrorHandler handler) {
   return std::exchange(installedHandler(), std::move(handler));
 }
 
-void fatalError(std::string_view message, const std::source_location& where) {
+void fatalError(std::string_view message, const SourceLocation& where) {
   FatalErrorHandler handler;
   {
     const std::lock_guard lock(handlerMutex);
@@ -30,7 +30,7 @@ void fatalError(std::string_view message, const std::source_location& where) {
   }
   if (handler) handler(message, where);
   std::fprintf(stderr, "fatal error: %.*s (%s:%u)\n", static_cast<int>(message.size()), message.data(),
-               where.file_name(), static_cast<unsigned>(where.line()));
+               where.file, where.line);
   std::abort();
 }
 

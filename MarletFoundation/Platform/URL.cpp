@@ -255,8 +255,7 @@ URL URL::appendingPathComponent(std::string_view component, bool isDirectory) co
   if (isFile_) return {joined(text_, component), true, isDirectory, base_};
   const Parts parts(text_);
   auto path = joined(parts.path, percentEncoded(component));
-  if (parts.path.empty() && parts.head.ends_with("//") == false && !parts.head.empty())
-    path.insert(0, 1, '/');
+  if (parts.path.empty() && !parts.head.empty()) path.insert(0, 1, '/');
   if (isDirectory && !path.ends_with('/')) path += '/';
   return {parts.with(path), false, isDirectory, base_};
 }

@@ -60,7 +60,7 @@ TEST(PathUniquifier, OutlivesAMoveOfTheDocumentsDirectory) {
 
 TEST(PathUniquifier, NeedsAPath) {
   const auto before = setFatalErrorHandler(
-      [](std::string_view message, const std::source_location&) { throw std::string(message); });
+      [](std::string_view message, const SourceLocation&) { throw std::string(message); });
   try {
     pathUniquifier(*URL::parse("http://host"));
     ADD_FAILURE() << "went on";

@@ -248,7 +248,7 @@ TEST(FileWrapper, ChildrenAreAddedAndRemovedInAnyTree) {
     root.addFileWrapper(copy);
     EXPECT_EQ(listing(root), "a=3\nd/\n c=2\n");
   }
-  const auto before = setFatalErrorHandler([](std::string_view, const std::source_location&) { throw 1; });
+  const auto before = setFatalErrorHandler([](std::string_view, const SourceLocation&) { throw 1; });
   auto file = FileWrapper::regularFile({});
   EXPECT_THROW(FileWrapper::directory().addFileWrapper(file), int);
   EXPECT_THROW(file.addFileWrapper(FileWrapper(directory.url())), int);

@@ -41,7 +41,7 @@ TEST(Version, OrderingPadsWhileEqualityIsExact) {
 }
 
 TEST(Version, WithoutComponentsIsFatal) {
-  auto before = setFatalErrorHandler([](std::string_view message, const std::source_location&) {
+  auto before = setFatalErrorHandler([](std::string_view message, const SourceLocation&) {
     throw std::runtime_error(std::string(message));
   });
   try {
