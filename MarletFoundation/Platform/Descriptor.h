@@ -65,8 +65,8 @@ struct FileContents {
   int error = 0;
 };
 
-/// Reads an open file to its end, wherever that lies by then. `expectedSize` is its size as of a look at the
-/// name that found a regular file. When as many bytes come, that was it, at the price of this one read.
+/// Reads an open file to its end, wherever that lies by then. `expectedSize` is its size as of a look
+/// that found a regular file. When as many bytes come, that was it, at the price of this one read.
 /// Otherwise, and with no expected size, the descriptor is looked at first: nothing but a regular file is
 /// read (EINVAL).
 FileContents readToEnd(int descriptor, std::optional<off_t> expectedSize);

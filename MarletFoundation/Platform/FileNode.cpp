@@ -216,8 +216,6 @@ std::optional<Data> FileNode::contents() {
   return isLoaded() ? std::optional(contents_) : std::nullopt;
 }
 
-/// A name is looked at before it is opened, since opening a device may have effects. The open file needs no
-/// second look when it holds as many bytes as that look told; `readToEnd` sees to the rest.
 void FileNode::readContents() {
   contentsWereRead_ = true;
   Descriptor opened;
