@@ -1,6 +1,6 @@
 # `make` builds build/release/bin/marlet; `make demo` and `make test` install what is missing first.
 .DEFAULT_GOAL := marlet
-.PHONY: marlet demo test asan tsan clang bench fuzz format check-format embed
+.PHONY: marlet demo test asan tsan bench fuzz format check-format embed
 
 EXAMPLE := examples/LearnLoops.marletbook
 FUZZ_SECONDS ?= 600
@@ -23,7 +23,7 @@ test:
 	cmake --build --preset debug
 	ctest --test-dir build/debug --output-on-failure -j2
 
-asan tsan clang:
+asan tsan:
 	scripts/install-dependencies --develop
 	$(call configure,$@)
 	cmake --build --preset $@

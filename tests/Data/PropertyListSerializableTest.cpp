@@ -180,8 +180,7 @@ TEST(PropertyListSerialization, RefusesWhatAFormCannotCarry) {
 struct Fatal {};
 
 TEST(PropertyListSerializable, StopsForProgrammingErrors) {
-  const auto before =
-      setFatalErrorHandler([](std::string_view, const SourceLocation&) { throw Fatal(); });
+  const auto before = setFatalErrorHandler([](std::string_view, const SourceLocation&) { throw Fatal(); });
   EXPECT_THROW(propertyListData(PropertyListValue("\x01"), xml), Fatal);
   const auto dictionary = std::make_shared<PlainDictionary>(PropertyListObjects{NumberObject::integer(1)},
                                                             PropertyListObjects{NumberObject::integer(1)});

@@ -23,9 +23,8 @@ void setUpLibrary(const Terminal& terminal) {
   environment.systemLog =
       environment.diagnostics = [&terminal](std::string_view line) { terminal.note(printable(line)); };
   HostEnvironment::setCurrent(std::move(environment));
-  setFatalErrorHandler([](std::string_view message, const SourceLocation&) {
-    throw FatalProblem{std::string(message)};
-  });
+  setFatalErrorHandler(
+      [](std::string_view message, const SourceLocation&) { throw FatalProblem{std::string(message)}; });
 }
 
 int run(int argc, char** argv) {
