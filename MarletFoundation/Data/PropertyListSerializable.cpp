@@ -2,6 +2,7 @@
 
 #include "MarletFoundation/Data/PropertyListValueBuilder.h"
 #include "MarletFoundation/Data/PropertyListWriters.h"
+#include "MarletFoundation/Platform/FatalError.h"
 
 namespace MarletFoundation {
 

@@ -4,7 +4,6 @@
 #include <optional>
 
 #include "MarletFoundation/Data/PropertyListValue.h"
-#include "MarletFoundation/Platform/FatalError.h"
 #include "MarletFoundation/Platform/FileManager.h"
 #include "MarletFoundation/Platform/PropertyListError.h"
 #include "MarletFoundation/Platform/PropertyListObject.h"

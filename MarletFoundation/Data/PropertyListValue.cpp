@@ -37,6 +37,9 @@ bool equalScalars(const PropertyListValue& a, const PropertyListValue& b) {
 
 }  // namespace
 
+PropertyListDictionary::PropertyListDictionary(const PropertyListDictionary&) = default;
+PropertyListDictionary& PropertyListDictionary::operator=(const PropertyListDictionary&) = default;
+
 PropertyListDictionary::PropertyListDictionary(
     std::initializer_list<std::pair<std::string_view, PropertyListValue>> entries) {
   entries_.reserve(entries.size());

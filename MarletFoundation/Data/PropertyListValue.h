@@ -114,11 +114,9 @@ struct PropertyListDictionary::Entry {
   PropertyListValue value;
 };
 
-// These need the whole entry, and so stand behind it.
+// Entries hold values, so what handles them has to wait until here.
 inline PropertyListDictionary::PropertyListDictionary() noexcept = default;
-inline PropertyListDictionary::PropertyListDictionary(const PropertyListDictionary&) = default;
 inline PropertyListDictionary::PropertyListDictionary(PropertyListDictionary&&) noexcept = default;
-inline PropertyListDictionary& PropertyListDictionary::operator=(const PropertyListDictionary&) = default;
 inline PropertyListDictionary& PropertyListDictionary::operator=(PropertyListDictionary&&) noexcept = default;
 inline PropertyListDictionary::~PropertyListDictionary() = default;
 inline std::size_t PropertyListDictionary::size() const { return entries_.size(); }

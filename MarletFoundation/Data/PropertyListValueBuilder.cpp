@@ -22,7 +22,7 @@ std::size_t hash(std::string_view text) {
   if (text.size() >= 8) {
     std::memcpy(&first, text.data(), 8);
     std::memcpy(&last, text.data() + text.size() - 8, 8);
-  } else {
+  } else if (!text.empty()) {
     std::memcpy(&first, text.data(), text.size());
   }
   const auto mixed = (first ^ last * 0x9E3779B97F4A7C15 ^ text.size()) * 0xD6E8FEB86659FD93;

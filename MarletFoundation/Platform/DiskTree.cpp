@@ -17,8 +17,7 @@ class DiskTree {
   static constexpr std::size_t Capacity = 64;
   /// How many of the directory in use and its nearest ancestors stay open when the others are closed.
   static constexpr int Nearest = 12;
-  /// How many of its other ancestors stay open, evenly spread, so that the way up from a great depth is
-  /// short.
+  /// How many of its other ancestors stay open, evenly spread, so that the way up from a great depth is short.
   static constexpr int MostSpread = 24;
 
   DiskTree() { open_.reserve(Capacity); }

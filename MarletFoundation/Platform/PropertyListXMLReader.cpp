@@ -482,8 +482,14 @@ void XMLReader::skipQuoted() {
 void XMLReader::fail(PropertyListErrorCode code, const char* where, std::string_view detail) const {
   const auto line = 1 + static_cast<std::size_t>(std::count(begin_, where, '\n'));
   constexpr std::size_t longest = 40;
-  std::string shown(detail.substr(0, longest));
-  if (detail.size() > longest) shown += "...";
+  std::string shown(detail);
+  if (shown.size() > longest) {
+    // Not within a character.
+    auto end = longest;
+    while ((shown[end] & 0xC0) == 0x80) --end;
+    shown.resize(end);
+    shown += "...";
+  }
   throw propertyListError(code, shown, document_.documentOffset(static_cast<std::size_t>(where - begin_)),
                           line);
 }

@@ -1,4 +1,5 @@
 #include "MarletFoundation/Data/PropertyListSerializable.h"
+#include "MarletFoundation/Platform/FatalError.h"
 
 #include <gtest/gtest.h>
 #include <rapidcheck.h>
