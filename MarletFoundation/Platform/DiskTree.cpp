@@ -89,9 +89,9 @@ class DiskTree {
   std::vector<Entry> open_;
 };
 
-DiskDirectory::DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string_view name)
+DiskDirectory::DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string name)
     : parent_(std::move(parent)),
-      name_(name),
+      name_(std::move(name)),
       tree_(parent_ ? parent_->tree_ : nullptr),
       depth_(parent_ ? parent_->depth_ + 1 : 0) {}
 
@@ -103,16 +103,16 @@ DiskDirectory::~DiskDirectory() {
 }
 
 std::shared_ptr<DiskDirectory> DiskDirectory::root(Descriptor descriptor) {
-  auto directory = std::make_shared<DiskDirectory>(Key(), nullptr, std::string_view());
+  auto directory = std::make_shared<DiskDirectory>(Key(), nullptr, std::string());
   directory->ownTree_ = std::make_unique<DiskTree>();
   directory->tree_ = directory->ownTree_.get();
   directory->tree_->root = std::move(descriptor);
   return directory;
 }
 
-std::shared_ptr<DiskDirectory> DiskDirectory::child(std::shared_ptr<DiskDirectory> parent,
-                                                    std::string_view name, Descriptor opened) {
-  auto directory = std::make_shared<DiskDirectory>(Key(), std::move(parent), name);
+std::shared_ptr<DiskDirectory> DiskDirectory::child(std::shared_ptr<DiskDirectory> parent, std::string name,
+                                                    Descriptor opened) {
+  auto directory = std::make_shared<DiskDirectory>(Key(), std::move(parent), std::move(name));
   if (opened) directory->parent_->keep(std::move(opened), directory->descriptor_);
   return directory;
 }

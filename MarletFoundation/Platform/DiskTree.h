@@ -22,10 +22,10 @@ class DiskDirectory {
   static std::shared_ptr<DiskDirectory> root(Descriptor descriptor);
   /// A directory by name, with its descriptor when it is open already. Otherwise it isn't looked at before it
   /// is used.
-  static std::shared_ptr<DiskDirectory> child(std::shared_ptr<DiskDirectory> parent, std::string_view name,
+  static std::shared_ptr<DiskDirectory> child(std::shared_ptr<DiskDirectory> parent, std::string name,
                                               Descriptor opened = {});
   struct Key {};  // only the functions above make directories
-  DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string_view name);
+  DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string name);
   ~DiskDirectory();
   DiskDirectory(const DiskDirectory&) = delete;
   DiskDirectory& operator=(const DiskDirectory&) = delete;

@@ -165,9 +165,11 @@ std::shared_ptr<FileNode> FileNode::child(std::string_view name) {
 
 std::shared_ptr<FileNode> FileNode::lookUp(std::string_view name) {
   if (directory_->expectsDirectories) {
-    if (auto opened = directory_->onDisk->open(std::string(name).c_str(), DirectoryFlags)) {
+    std::string text(name);
+    if (auto opened = directory_->onDisk->open(text.c_str(), DirectoryFlags)) {
       auto node = std::make_shared<FileNode>(Key());
-      node->becomeDirectory(DiskDirectory::child(directory_->onDisk, name, std::move(opened)), true);
+      node->becomeDirectory(DiskDirectory::child(directory_->onDisk, std::move(text), std::move(opened)),
+                            true);
       return node;
     }
     if (isAbsence(errno)) return nullptr;
