@@ -1,6 +1,8 @@
 #include "MarletFoundation/Platform/DiskTree.h"
 
 #include <dirent.h>
+#include <linux/openat2.h>
+#include <sys/syscall.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -8,6 +10,12 @@
 #include <climits>
 
 namespace MarletFoundation {
+namespace {
+
+/// So many entries of a directory are opened before it is worth a descriptor of its own.
+constexpr int FewEntries = 3;
+
+}  // namespace
 
 /// The open descriptors of a tree below its root, each in its slot. When there are too many, they are closed
 /// in runs of consecutive numbers, one system call a run, since a book of many pages would otherwise spend a
@@ -65,11 +73,18 @@ class DiskTree {
   /// Opens beneath `directory`'s descriptor. Short of descriptors, this tree gives up its own and tries
   /// again.
   int openAt(const DiskDirectory* directory, int directoryDescriptor, const char* name, int flags) {
-    const auto attempt = [&] { return retrying([&] { return ::openat(directoryDescriptor, name, flags); }); };
-    const int opened = attempt();
-    if (opened >= 0 || (errno != EMFILE && errno != ENFILE)) return opened;
-    closeAllBut(directory, 1, 0);
-    return attempt();
+    return trying(directory, [&] { return ::openat(directoryDescriptor, name, flags); });
+  }
+
+  /// The same for a path, following no link on the way. ENOSYS or EPERM where the system has no such call or a
+  /// sandbox forbids it.
+  int openPathAt(const DiskDirectory* directory, int directoryDescriptor, const char* path, int flags) {
+    open_how how{};
+    how.flags = static_cast<unsigned>(flags);
+    how.resolve = RESOLVE_NO_SYMLINKS;
+    return trying(directory, [&] {
+      return static_cast<int>(::syscall(SYS_openat2, directoryDescriptor, path, &how, sizeof how));
+    });
   }
 
   Descriptor root;
@@ -79,6 +94,14 @@ class DiskTree {
     int descriptor;
     int* slot;  // null once it went away
   };
+
+  template <class Call>
+  int trying(const DiskDirectory* directory, Call call) {
+    const int opened = retrying(call);
+    if (opened >= 0 || (errno != EMFILE && errno != ENFILE)) return opened;
+    closeAllBut(directory, 1, 0);
+    return retrying(call);
+  }
 
   static void closeRun(int first, int last) {
     if (first != last && ::close_range(static_cast<unsigned>(first), static_cast<unsigned>(last), 0) == 0)
@@ -138,7 +161,19 @@ int DiskDirectory::status(const char* name, struct stat& status) {
   return number < 0 ? -1 : retrying([&] { return ::fstatat(number, name, &status, AT_SYMLINK_NOFOLLOW); });
 }
 
+Descriptor DiskDirectory::openThroughParent(const char* name, int flags) {
+  const int number = parent_->descriptor();
+  if (number < 0) return Descriptor();
+  const auto path = name_ + "/" + name;
+  return Descriptor(tree_->openPathAt(parent_.get(), number, path.c_str(), flags));
+}
+
 Descriptor DiskDirectory::open(const char* name, int flags) {
+  if (descriptor_ < 0 && parent_ && openedThroughParent_ < FewEntries) {
+    ++openedThroughParent_;
+    auto opened = openThroughParent(name, flags);
+    if (opened || (errno != ENOSYS && errno != EPERM)) return opened;
+  }
   const int number = descriptor();
   return number < 0 ? Descriptor() : Descriptor(tree_->openAt(this, number, name, flags));
 }

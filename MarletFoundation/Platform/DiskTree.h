@@ -35,7 +35,8 @@ class DiskDirectory {
   int descriptor();
   /// Looks at the entry of that name itself, not at what it may link to.
   int status(const char* name, struct stat& status);
-  /// Opens an entry itself for reading, waiting for nothing.
+  /// Opens an entry itself for reading, waiting for nothing. For the first few entries the directory isn't opened:
+  /// they are reached from its parent, in one call of the system that follows no link.
   Descriptor open(const char* name, int flags = ReadingFlags | O_NOFOLLOW);
   /// Keeps a descriptor in a slot.
   void keep(Descriptor descriptor, int& slot);
@@ -57,8 +58,13 @@ class DiskDirectory {
   /// The path from the tree's root, for messages.
   std::string path() const;
 
+  /// The name that was asked for first in the last of its directories; brothers tend to hold the same names.
+  std::string nameInDirectories;
+
  private:
   friend class DiskTree;
+
+  Descriptor openThroughParent(const char* name, int flags);
 
   std::shared_ptr<DiskDirectory> parent_;
   std::string name_;
@@ -66,6 +72,7 @@ class DiskDirectory {
   DiskTree* tree_;
   int depth_;  // the root's is 0
   int descriptor_ = -1;
+  int openedThroughParent_ = 0;
 };
 
 }  // namespace MarletFoundation

@@ -163,18 +163,37 @@ std::shared_ptr<FileNode> FileNode::child(std::string_view name) {
   return directory_->children.emplace_hint(found, name, lookUp(name))->second;
 }
 
+/// Finds a directory by opening in it what its brother was first asked for: the file proves the directory, and is
+/// likely to be asked for next. Null when that isn't there, which tells nothing.
+std::shared_ptr<FileNode> FileNode::lookUpByContent(std::string_view name) {
+  const auto& expected = directory_->onDisk->nameInDirectories;
+  if (expected.empty()) return nullptr;
+  auto directory = DiskDirectory::child(directory_->onDisk, std::string(name));
+  auto content = onDisk(directory, expected);
+  content->look();
+  if (content->kind_ == Kind::unreadable) return nullptr;
+  auto node = std::make_shared<FileNode>(Key());
+  node->becomeDirectory(std::move(directory), true);
+  node->directory_->children.emplace(expected, std::move(content));
+  return node;
+}
+
 std::shared_ptr<FileNode> FileNode::lookUp(std::string_view name) {
+  const auto& onDiskDirectory = directory_->onDisk;
+  if (directory_->children.empty() && onDiskDirectory->parent()) {
+    onDiskDirectory->parent()->nameInDirectories = name;
+  }
   if (directory_->expectsDirectories) {
+    if (auto node = lookUpByContent(name)) return node;
     std::string text(name);
-    if (auto opened = directory_->onDisk->open(text.c_str(), DirectoryFlags)) {
+    if (auto opened = onDiskDirectory->open(text.c_str(), DirectoryFlags)) {
       auto node = std::make_shared<FileNode>(Key());
-      node->becomeDirectory(DiskDirectory::child(directory_->onDisk, std::move(text), std::move(opened)),
-                            true);
+      node->becomeDirectory(DiskDirectory::child(onDiskDirectory, std::move(text), std::move(opened)), true);
       return node;
     }
     if (isAbsence(errno)) return nullptr;
   }
-  auto node = onDisk(directory_->onDisk, name);
+  auto node = onDisk(onDiskDirectory, name);
   node->look();
   if (node->kind_ == Kind::unreadable && isAbsence(node->error_)) return nullptr;
   directory_->expectsDirectories = node->kind_ == Kind::directory;

@@ -89,6 +89,7 @@ class FileNode {
   void lookByName();
   void becomeDirectory(std::shared_ptr<DiskDirectory> onDisk, std::optional<bool> wasOpened);
   std::shared_ptr<FileNode> lookUp(std::string_view name);
+  std::shared_ptr<FileNode> lookUpByContent(std::string_view name);
   void readContents();
   Descriptor openRegularFile(struct stat& status);
 
