@@ -61,6 +61,7 @@ class MARLET_EXPORT PropertyListDictionary {
 /// payloads: an integer never equals a floating point or a boolean. Copying, comparing and destroying need no
 /// stack, however deep the value is.
 struct MARLET_EXPORT PropertyListValue {
+  /// Compilers differ on what `Array{array}` means: an array of one array is made as `Array(1, array)`.
   using Array = std::vector<PropertyListValue>;
   using Dictionary = PropertyListDictionary;
   /// The cases: array, dictionary, string, data, date, integer, floatingPoint, boolean.

@@ -112,7 +112,8 @@ TEST(PropertyListSerialization, WritesReadableXML) {
 
 TEST(PropertyListSerialization, StoresEqualScalarsOnceInBinary) {
   const auto objects = [](const PropertyListValue& value) {
-    const auto bytes = write(value, binary).bytes();
+    const auto data = write(value, binary);
+    const auto bytes = data.bytes();
     return bytes[bytes.size() - 17] + 256 * bytes[bytes.size() - 18];
   };
   EXPECT_EQ(objects(Array{"a", "a", PropertyListDictionary{{"a", "a"}}}), 3);

@@ -46,7 +46,7 @@ TEST(PropertyListValue, IsCopiedIndependently) {
   *std::get<PropertyListDictionary>(value.payload).find("list") = 3;
   EXPECT_EQ(copy, PropertyListValue(PropertyListDictionary{{"list", Array{1, 2}}}));
   // A part of a value takes the place of the whole.
-  PropertyListValue nested(Array{Array{Array{"inner"}}});
+  PropertyListValue nested(Array(1, Array(1, Array{"inner"})));
   nested = std::move(std::get<Array>(std::get<Array>(nested.payload)[0].payload)[0]);
   EXPECT_EQ(nested, PropertyListValue(Array{"inner"}));
   nested = std::get<Array>(nested.payload)[0];
