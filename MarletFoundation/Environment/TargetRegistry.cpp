@@ -38,7 +38,7 @@ Registry& registry() {
   return registry;
 }
 
-void log(const std::string& message) {
+void report(const std::string& message) {
   Log([&] { return message; }, LogAspect("Targets"), LogLevel::Critical);
 }
 
@@ -52,7 +52,7 @@ bool loadBundledTargets() {
   try {
     names = FileManager::contentsOfDirectory(directory, true);
   } catch (const Error& error) {
-    log("Failed to load contents of '" + directory.path() + "': " + error.description());
+    report("Failed to load contents of '" + directory.path() + "': " + error.description());
     return false;
   }
   for (const auto& name : names) {
@@ -60,7 +60,7 @@ bool loadBundledTargets() {
     if (url.pathExtension() != "target" || registry().targetForURL(url)) continue;
     const auto target = Target::loadFrom(url, false);
     if (!target) {
-      log("Failed to load target at path: '" + url.path() + "': nil");
+      report("Failed to load target at path: '" + url.path() + "': nil");
       return false;
     }
     registry().add(target, url);
@@ -77,14 +77,14 @@ bool didInitialLoad() {
 
 std::vector<TargetPointer> Target::allTargets() {
   if (!didInitialLoad())
-    log("Warning: Looking up all targets may fail as we were not able to load bundled targets.");
+    report("Warning: Looking up all targets may fail as we were not able to load bundled targets.");
   return registry().targetRegistryLock.read([] { return registry().allTargets; });
 }
 
 TargetPointer Target::targetWithIdentifier(std::string_view identifier) {
   if (!didInitialLoad()) {
-    log("Warning: Looking up target with identifier '" + std::string(identifier) +
-        "' may fail as we were not able to load bundled targets.");
+    report("Warning: Looking up target with identifier '" + std::string(identifier) +
+           "' may fail as we were not able to load bundled targets.");
   }
   return registry().targetRegistryLock.read([&] {
     const auto found = registry().identifierToTargetMap.find(identifier);

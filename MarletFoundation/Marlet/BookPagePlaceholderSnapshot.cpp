@@ -2,6 +2,7 @@
 
 #include "MarletFoundation/DiffPack/MergedUserEdit.h"
 #include "MarletFoundation/Logging/Log.h"
+#include "MarletFoundation/Marlet/DocumentLog.h"
 #include "MarletFoundation/Marlet/LoadChecks.h"
 #include "MarletFoundation/PathUtilities/DocumentPath.h"
 

@@ -1,6 +1,7 @@
 #include "MarletFoundation/Marlet/MarletResultInfoSnapshot.h"
 
 #include "MarletFoundation/Logging/Log.h"
+#include "MarletFoundation/Marlet/DocumentLog.h"
 #include "MarletFoundation/Marlet/LegacyTimelineFormat.h"
 #include "MarletFoundation/Marlet/LoadChecks.h"
 #include "MarletFoundation/Platform/HostEnvironment.h"

@@ -1,6 +1,5 @@
 #pragma once
 
-#include "MarletFoundation/Marlet/DocumentLog.h"
 #include "MarletFoundation/Marlet/MarletResultInfoType.h"
 #include "MarletFoundation/Platform/Data.h"
 
