@@ -17,5 +17,7 @@ install(FILES ${CMAKE_CURRENT_BINARY_DIR}/MarletFoundationConfig.cmake
               ${CMAKE_CURRENT_BINARY_DIR}/MarletFoundationConfigVersion.cmake
         DESTINATION ${MARLET_CMAKE_INSTALL_DIR})
 
+# From where the file lies, so that the installed tree can be moved.
+file(RELATIVE_PATH MARLET_PC_PREFIX /${CMAKE_INSTALL_LIBDIR}/pkgconfig /)
 configure_file(cmake/MarletFoundation.pc.in MarletFoundation.pc @ONLY)
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/MarletFoundation.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
