@@ -7,7 +7,11 @@
 namespace MarletFoundation {
 
 PropertyListValue PropertyListSerialization::read(const Data& data) {
-  PropertyListValueBuilder builder;
+  // One for all reads of a thread: the many small lists of a document repeat their keys.
+  thread_local PropertyListValueBuilder builder;
+  struct Clearing {
+    ~Clearing() { builder.clear(); }
+  } clearing;
   readPropertyList(data, builder);
   return builder.take();
 }

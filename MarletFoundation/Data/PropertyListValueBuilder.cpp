@@ -29,12 +29,22 @@ std::size_t hash(std::string_view text) {
   return static_cast<std::size_t>(mixed >> 32);
 }
 
+template <class Element>
+void clearStack(std::vector<Element>& stack) {
+  constexpr std::size_t mostKept = 1024;
+  stack.clear();
+  if (stack.capacity() > mostKept) stack.shrink_to_fit();
+}
+
+// A longer key isn't worth keeping for others that might equal it.
+constexpr std::size_t longestSharedKey = 64;
+
 }  // namespace
 
-PropertyListValueBuilder::PropertyListValueBuilder() {
-  open_.reserve(16);
-  values_.reserve(32);
-  entries_.reserve(32);
+void PropertyListValueBuilder::clear() {
+  clearStack(open_);
+  clearStack(values_);
+  clearStack(entries_);
 }
 
 void PropertyListValueBuilder::end() {
@@ -48,7 +58,8 @@ void PropertyListValueBuilder::end() {
 }
 
 void PropertyListValueBuilder::key(std::string_view text) {
-  entries_.push_back({sharedKey(text), PropertyListValue()});
+  entries_.push_back(
+      {text.size() > longestSharedKey ? PropertyListKey(text) : sharedKey(text), PropertyListValue()});
 }
 
 const PropertyListKey& PropertyListValueBuilder::sharedKey(std::string_view text) {

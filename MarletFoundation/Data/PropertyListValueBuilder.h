@@ -12,8 +12,6 @@ namespace MarletFoundation {
 /// container takes its own, in one allocation of the right size, when it ends.
 class PropertyListValueBuilder final : public PropertyListEvents {
  public:
-  PropertyListValueBuilder();
-
   void beginArray() override { open_.push_back({false, values_.size()}); }
   void beginDictionary() override { open_.push_back({true, entries_.size()}); }
   void end() override;
@@ -27,6 +25,9 @@ class PropertyListValueBuilder final : public PropertyListEvents {
 
   /// The value, once the reader is done.
   PropertyListValue take() { return std::move(values_.back()); }
+  /// Forgets all values, so that another list can be read; keeps the keys, which lists of a kind have in common,
+  /// and what memory isn't large.
+  void clear();
 
  private:
   struct OpenContainer {
