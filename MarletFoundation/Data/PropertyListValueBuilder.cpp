@@ -58,13 +58,13 @@ void PropertyListValueBuilder::end() {
 }
 
 void PropertyListValueBuilder::key(std::string_view text) {
-  entries_.push_back(
-      {text.size() > longestSharedKey ? PropertyListKey(text) : sharedKey(text), PropertyListValue()});
+  auto& entry = entries_.emplace_back();
+  entry.key = text.size() > longestSharedKey ? SharedString(text) : sharedKey(text);
 }
 
-const PropertyListKey& PropertyListValueBuilder::sharedKey(std::string_view text) {
+const SharedString& PropertyListValueBuilder::sharedKey(std::string_view text) {
   auto& recent = recentKeys_[hash(text) % recentKeys_.size()];
-  if (recent.view() != text) recent = PropertyListKey(text);
+  if (recent.view() != text) recent = SharedString(text);
   return recent;
 }
 

@@ -43,13 +43,13 @@ class PropertyListValueBuilder final : public PropertyListEvents {
     auto& value = hasEntry ? entries_.back().value : values_.emplace_back();
     value.payload.emplace<Payload>(std::forward<Argument>(argument));
   }
-  const PropertyListKey& sharedKey(std::string_view text);
+  const SharedString& sharedKey(std::string_view text);
 
   std::vector<OpenContainer> open_;
   std::vector<PropertyListValue> values_;
   std::vector<PropertyListDictionary::Entry> entries_;
   // The keys met last, each in the place that its text hashes to.
-  std::array<PropertyListKey, 64> recentKeys_;
+  std::array<SharedString, 64> recentKeys_;
 };
 
 }  // namespace MarletFoundation

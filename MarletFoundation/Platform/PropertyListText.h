@@ -12,6 +12,9 @@ namespace MarletFoundation::PropertyListText {
 
 inline constexpr std::size_t npos = std::string_view::npos;
 
+/// Offset of the first byte that is neither printable ASCII, delete included, nor tab, line feed or carriage
+/// return, or `npos`.
+std::size_t findUnusual(std::string_view text);
 /// Offset of the first byte over 0x7F, or `npos`.
 std::size_t findNonASCII(std::string_view text);
 /// Offset of the first ill-formed sequence, or `npos`.
