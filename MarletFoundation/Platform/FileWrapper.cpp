@@ -41,7 +41,8 @@ std::optional<FileWrapper::Children> FileWrapper::fileWrappers() const {
   if (!children) return std::nullopt;
   Children wrappers;
   for (const auto& [name, child] : *children) {
-    if (child && child->kind() != FileNode::Kind::unreadable) wrappers.emplace(name.view(), FileWrapper(child));
+    if (child && child->kind() != FileNode::Kind::unreadable)
+      wrappers.emplace(name.view(), FileWrapper(child));
   }
   return wrappers;
 }
