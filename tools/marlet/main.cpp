@@ -7,6 +7,7 @@
 #include "MarletFoundation/MarletFoundation.h"
 #include "PropertyListCommand.h"
 #include "Show.h"
+#include "TagsCommand.h"
 
 using namespace MarletFoundation;
 
@@ -58,6 +59,12 @@ int run(int argc, char** argv) {
   showCommand->add_option("PATH", path, "The book")->required();
   showCommand->add_flag("--json", asJSON, "Show as JSON");
   showCommand->callback([&] { status = show(path, asJSON, terminal); });
+
+  auto* tagsCommand = app.add_subcommand(
+      "tags", "Show what the tags of a page's source make of each line, and their mistakes");
+  tagsCommand->add_option("FILE", paths, "Sources of pages")->required();
+  tagsCommand->add_flag("--json", asJSON, "Show tags, errors, editable ranges and placeholders as JSON");
+  tagsCommand->callback([&] { status = showTags(paths, asJSON, terminal); });
 
   auto form = PropertyListOutput::xml;
   std::string output = "-";
