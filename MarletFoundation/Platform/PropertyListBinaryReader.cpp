@@ -203,9 +203,8 @@ std::string_view BinaryReader::text(std::size_t place) {
   const auto length = count(start);
   const auto units = body(place, start, length, isASCII ? 1 : 2);
   if (isASCII) {
-    const auto high = PropertyListText::findNonASCII(units);
-    if (high != PropertyListText::npos) fail(invalidString, start + high, "ASCII");
-    return units;
+    if (PropertyListText::isASCII(units)) return units;
+    fail(invalidString, start + PropertyListText::findNonASCII(units), "ASCII");
   }
   scratch_.clear();
   const auto read = PropertyListText::appendUTF8FromUTF16(scratch_, units, true);
