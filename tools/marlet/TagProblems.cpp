@@ -3,6 +3,7 @@
 #include <algorithm>
 
 #include "MarletFoundation/MarletFoundation.h"
+#include "MarletFoundation/Platform/Text.h"
 #include "SourceLines.h"
 #include "TagKeywords.h"
 

@@ -6,6 +6,7 @@
 
 #include "JSON.h"
 #include "MarletFoundation/MarletFoundation.h"
+#include "MarletFoundation/Platform/Text.h"
 #include "SourceLines.h"
 #include "TagProblems.h"
 #include "TagsJSON.h"

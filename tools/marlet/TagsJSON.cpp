@@ -8,6 +8,10 @@ using nlohmann::ordered_json;
 
 namespace {
 
+ordered_json json(const SourceTag::Located& located);
+ordered_json json(const SourceTag::ParseError& error);
+ordered_json json(const EditorPlaceholder& placeholder);
+
 ordered_json json(const TextRange& range) { return {{"location", range.location}, {"length", range.length}}; }
 
 ordered_json json(const LexiportDirective& directive) {
