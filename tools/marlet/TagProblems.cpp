@@ -16,11 +16,15 @@ using TagError = SourceTag::ParseError;
 
 /// Words much longer than a keyword are no misspelt one.
 constexpr std::size_t longestWord = 40;
+/// Letters that a misspelt word may differ in where it may as well mean something else.
+constexpr std::size_t farthestMeant = 2;
 
 std::string code(std::string_view text) {
   constexpr std::size_t longestQuote = 80;
   if (text.size() <= longestQuote) return "`" + std::string(text) + "`";
-  return "`" + std::string(text.substr(0, graphemeRunEnd(text, 0, longestQuote))) + "…`";
+  auto end = longestQuote;
+  while ((static_cast<unsigned char>(text[end]) & 0xC0) == 0x80) --end;
+  return "`" + std::string(text.substr(0, end)) + "…`";
 }
 
 /// The case of the tag that goes with a start or end tag.
@@ -68,6 +72,19 @@ std::string_view keywordIn(std::string_view text) {
   return text.substr(0, std::min(static_cast<std::size_t>(end - text.begin()), longestWord));
 }
 
+std::string mendedInlineTag(std::string_view word) {
+  const auto [keyword, distance] = nearestKeyword(word);
+  if (keyword.ends_with("hidden-code") || keyword == "code-completion") {
+    if (distance <= farthestMeant)
+      return "`//#-" + std::string(keyword) + "` has no inline form and fills a line of its own.";
+  } else if (word == keyword) {
+    return "remove what stands behind `" + std::string(keyword) + "`.";
+  } else if (distance <= farthestMeant) {
+    return "did you mean `/*#-" + std::string(keyword) + "*/`?";
+  }
+  return "inline tags are editable-code, copy-source, copy-destination, and each of these behind `end-`.";
+}
+
 std::string sentence(const TagError& error) {
   const auto* tag = std::get_if<SourceTag>(&error.payload);
   const std::string written = tag ? code(writtenForm(tag->kind())) : "";
@@ -88,11 +105,8 @@ std::string sentence(const TagError& error) {
              (isInline ? " on the same line" : "") + ", and close what is inside it first.";
     case TagError::Case::improperlyNestedTag:
       return written + " must not stand here: " + std::string(legalPlace(tag->kind())) + ".";
-    case TagError::Case::unknownInlineTag: {
-      const auto word = keywordIn(text.substr(4));
-      return code(text) + " is no tag. Did you mean `/*#-" + std::string(nearestKeyword(word).keyword) +
-             "*/`?";
-    }
+    case TagError::Case::unknownInlineTag:
+      return code(text) + " is no tag: " + mendedInlineTag(keywordIn(text.substr(4)));
     case TagError::Case::copySourceMalformed:
       return code(text) + " names no copy source: write " + (isInline ? "`/*" : "`//") +
              "#-copy-source(IDENTIFIER)" + end + ".";
@@ -118,9 +132,8 @@ std::optional<std::string> reasonNotToBeTag(std::u16string_view line) {
   const auto text = utf8FromUTF16Lossy(rest.substr(0, marker.size() + longestWord)).substr(marker.size());
   const auto word = keywordIn(text);
   const auto [keyword, distance] = nearestKeyword(word);
-  if (distance > 0 || !isExact) {
-    // Whoever leaves a blank in front of "#-" may mean something else.
-    if (!isExact && distance > 2) return std::nullopt;
+  if (!isExact && distance > farthestMeant) return std::nullopt;
+  if (!isExact || word != keyword) {
     return "This line looks like a tag, but is none. Did you mean `//#-" + std::string(keyword) + "`?";
   }
   if (keyword == "code-completion")
@@ -130,14 +143,11 @@ std::optional<std::string> reasonNotToBeTag(std::u16string_view line) {
          "`: remove that.";
 }
 
-bool isMalformed(const TagError& error) {
-  return error.kind == TagError::Case::copySourceMalformed ||
-         error.kind == TagError::Case::copyDestinationMalformed;
-}
-
 /// Whether an error's location counts from the start of its line.
 bool isRelative(const TagError& error) {
-  return isMalformed(error) && std::get<TagText>(error.payload).view().starts_with("//");
+  const bool isMalformed = error.kind == TagError::Case::copySourceMalformed ||
+                           error.kind == TagError::Case::copyDestinationMalformed;
+  return isMalformed && std::get<TagText>(error.payload).view().starts_with("//");
 }
 
 bool isLineTag(const SourceTag::Located& located) { return located.tag.isLineTag(); }
@@ -173,7 +183,6 @@ Problem warning(std::string rule, std::string description, const TextRange& rang
 /// that are meant to be tags.
 void addProblemsOfLine(std::size_t index, const SourceLines& lines, std::vector<Problem>& problems) {
   const auto text = lines.text(index);
-  const auto doubt = reasonNotToBeTag(text);
   const auto first = static_cast<std::int64_t>(text.size() - withoutBlanks(text).size());
   const auto start = lines.range(index).location;
   const auto scanned = SourceTag::parseStringForTags(text);
@@ -186,9 +195,10 @@ void addProblemsOfLine(std::size_t index, const SourceLines& lines, std::vector<
                      std::any_of(scanned.errors.begin(), scanned.errors.end(), [](const TagError& error) {
                        return error.kind == TagError::Case::lexiportParseError;
                      });
-  if (isTag || !doubt) return;
+  if (isTag) return;
   const TextRange range{start + first, static_cast<std::int64_t>(text.size()) - first};
-  problems.push_back(warning("tag.notATag", *doubt, range, lines));
+  if (const auto reason = reasonNotToBeTag(text))
+    problems.push_back(warning("tag.notATag", *reason, range, lines));
 }
 
 }  // namespace

@@ -53,17 +53,25 @@ std::string shown(std::u16string_view text) {
   return printable(line);
 }
 
+/// Units of a line to which marks under it reach; further right, the column's number stands for them.
+constexpr std::size_t longestMark = 200;
+
 std::size_t width(std::u16string_view text) { return static_cast<std::size_t>(graphemeCount(shown(text))); }
 
 void printProblem(const Problem& problem, std::u16string_view line, const Terminal& terminal) {
   using Style = Terminal::Style;
   const auto style = problem.severity == "error" ? Style::red : Style::yellow;
   const auto start = static_cast<std::size_t>(*problem.column) - 1;
-  const auto length = static_cast<std::size_t>(*problem.length);
-  const auto blanks = std::string(name(Mark::none)) + " | " + std::string(width(line.substr(0, start)), ' ');
-  const auto tildes = width(line.substr(start, length));
-  std::cout << blanks << terminal.styled(style, "^" + std::string(tildes > 0 ? tildes - 1 : 0, '~')) << "\n"
-            << blanks << terminal.styled(style, problem.severity + ":") << " "
+  const auto length = std::min(static_cast<std::size_t>(*problem.length), longestMark);
+  auto place = std::string(name(Mark::none)) + " | ";
+  if (start <= longestMark) {
+    place.append(width(line.substr(0, start)), ' ');
+    const auto tildes = width(line.substr(start, length));
+    std::cout << place << terminal.styled(style, "^" + std::string(tildes > 0 ? tildes - 1 : 0, '~')) << "\n";
+  } else {
+    place += "column " + std::to_string(*problem.column) + ": ";
+  }
+  std::cout << place << terminal.styled(style, problem.severity + ":") << " "
             << printable(problem.description) << " " << terminal.styled(Style::dim, "[" + problem.rule + "]")
             << "\n";
 }
