@@ -103,6 +103,7 @@ SourceTag::ParseResult walk(std::vector<SourceTag::Located> tags, const IsLegal&
   using TagError = SourceTag::ParseError;
   SourceTag::ParseResult result;
   const auto nodes = DocumentNode::nodes(tags);
+  auto end = tags.begin();
   for (std::size_t i = 0; i < nodes.size();) {
     const auto kind = tags[i].tag.kind();
     const auto fail = [&](TagError::Case error) {
@@ -115,10 +116,13 @@ SourceTag::ParseResult walk(std::vector<SourceTag::Located> tags, const IsLegal&
       fail(role(kind).closes == Type::leaf ? TagError::Case::improperlyNestedTag
                                            : TagError::Case::missingStartTag);
     } else {
-      result.tags.push_back(std::move(tags[i]));
+      if (const auto tag = tags.begin() + static_cast<std::ptrdiff_t>(i); tag != end) *end = std::move(*tag);
+      ++end;
       ++i;
     }
   }
+  tags.erase(end, tags.end());
+  result.tags = std::move(tags);
   return result;
 }
 
