@@ -17,5 +17,8 @@ target_compile_features(MarletFoundation PUBLIC cxx_std_20)
 target_compile_definitions(
   MarletFoundation PRIVATE MARLET_VERSION_STRING="${PROJECT_VERSION}"
                            MARLET_BUILD_RESOURCES="${CMAKE_SOURCE_DIR}/Resources")
+# The library's own calls of what it exports go straight there.
+target_compile_options(MarletFoundation PRIVATE -fno-semantic-interposition)
+target_link_options(MarletFoundation PRIVATE -Wl,-Bsymbolic-functions)
 target_link_libraries(MarletFoundation PRIVATE $<BUILD_INTERFACE:marlet_options> $<BUILD_INTERFACE:MarletDiff> ICU::i18n ICU::uc
                                                LibXml2::LibXml2 OpenSSL::Crypto uriparser::uriparser Threads::Threads)

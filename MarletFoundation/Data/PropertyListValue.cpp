@@ -18,6 +18,12 @@ thread_local std::vector<PropertyListValue>* waiting = nullptr;
 
 bool isContainer(const PropertyListValue& value) { return value.payload.index() < 2; }
 
+// The first bytes mostly tell.
+bool isBefore(std::string_view a, std::string_view b) {
+  if (a.empty() || b.empty() || a[0] == b[0]) return a < b;
+  return static_cast<unsigned char>(a[0]) < static_cast<unsigned char>(b[0]);
+}
+
 bool equalScalars(const PropertyListValue& a, const PropertyListValue& b) {
   switch (a.payload.index()) {
     case 2:
@@ -43,7 +49,7 @@ PropertyListDictionary& PropertyListDictionary::operator=(const PropertyListDict
 PropertyListDictionary::PropertyListDictionary(
     std::initializer_list<std::pair<std::string_view, PropertyListValue>> entries) {
   entries_.reserve(entries.size());
-  for (const auto& [key, value] : entries) entries_.push_back({PropertyListKey(key), value});
+  for (const auto& [key, value] : entries) entries_.push_back({SharedString(key), value});
   sortEntries();
 }
 
@@ -52,7 +58,7 @@ PropertyListDictionary::PropertyListDictionary(Entries entries) : entries_(std::
 }
 
 void PropertyListDictionary::sortEntries() {
-  const auto notAscending = [](const Entry& a, const Entry& b) { return a.key.view() >= b.key.view(); };
+  const auto notAscending = [](const Entry& a, const Entry& b) { return !isBefore(a.key, b.key); };
   if (std::adjacent_find(entries_.begin(), entries_.end(), notAscending) == entries_.end()) return;
   std::stable_sort(entries_.begin(), entries_.end(),
                    [](const Entry& a, const Entry& b) { return a.key.view() < b.key.view(); });
@@ -63,6 +69,14 @@ void PropertyListDictionary::sortEntries() {
 }
 
 const PropertyListValue* PropertyListDictionary::find(std::string_view key) const {
+  // In a few keys, the right one is found sooner by its length than by order.
+  constexpr std::size_t few = 12;
+  if (entries_.size() <= few) {
+    for (const auto& entry : entries_) {
+      if (entry.key.view() == key) return &entry.value;
+    }
+    return nullptr;
+  }
   const auto found = std::lower_bound(entries_.begin(), entries_.end(), key,
                                       [](const Entry& e, std::string_view k) { return e.key.view() < k; });
   return found != entries_.end() && found->key.view() == key ? &found->value : nullptr;
@@ -76,7 +90,7 @@ PropertyListValue& PropertyListDictionary::operator[](std::string_view key) {
   const auto place = std::lower_bound(entries_.begin(), entries_.end(), key,
                                       [](const Entry& e, std::string_view k) { return e.key.view() < k; });
   if (place != entries_.end() && place->key.view() == key) return place->value;
-  return entries_.insert(place, {PropertyListKey(key), PropertyListValue()})->value;
+  return entries_.insert(place, {SharedString(key), PropertyListValue()})->value;
 }
 
 bool PropertyListDictionary::erase(std::string_view key) {
@@ -126,8 +140,6 @@ PropertyListValue::PropertyListValue(const PropertyListValue& other) {
   }
 }
 
-PropertyListValue::PropertyListValue(PropertyListValue&& other) noexcept = default;
-
 PropertyListValue& PropertyListValue::operator=(const PropertyListValue& other) {
   return *this = PropertyListValue(other);
 }
@@ -142,7 +154,12 @@ PropertyListValue& PropertyListValue::operator=(PropertyListValue&& other) noexc
 void PropertyListValue::clearContainer() noexcept {
   auto* const array = std::get_if<Array>(&payload);
   auto* const dictionary = std::get_if<Dictionary>(&payload);
-  if (array ? array->empty() : dictionary->empty()) return;
+  // Mostly nothing lies deeper, and depth needn't be looked at.
+  const auto holdsContainer = [](const PropertyListValue& value) { return isContainer(value); };
+  const bool isDeeper = array ? std::any_of(array->begin(), array->end(), holdsContainer)
+                              : std::any_of(dictionary->begin(), dictionary->end(),
+                                            [](const Entry& entry) { return isContainer(entry.value); });
+  if (!isDeeper) return;
   if (clearDepth == clearDepthLimit) {
     waiting->push_back(std::move(*this));
     return;

@@ -9,9 +9,9 @@
 #include <variant>
 #include <vector>
 
-#include "MarletFoundation/Data/PropertyListKey.h"
 #include "MarletFoundation/Platform/Data.h"
 #include "MarletFoundation/Platform/Date.h"
+#include "MarletFoundation/Platform/SharedString.h"
 
 namespace MarletFoundation {
 
@@ -82,9 +82,13 @@ struct MARLET_EXPORT PropertyListValue {
       : payload(static_cast<std::int64_t>(value)) {}
   PropertyListValue(double value) : payload(value) {}
   PropertyListValue(bool value) : payload(value) {}
+  /// The named case, made in place.
+  template <class Case, class... Arguments>
+  explicit PropertyListValue(std::in_place_type_t<Case> named, Arguments&&... arguments)
+      : payload(named, std::forward<Arguments>(arguments)...) {}
 
   PropertyListValue(const PropertyListValue& other);
-  PropertyListValue(PropertyListValue&& other) noexcept;
+  PropertyListValue(PropertyListValue&& other) noexcept : payload(moved(other.payload)) {}
   PropertyListValue& operator=(const PropertyListValue& other);
   PropertyListValue& operator=(PropertyListValue&& other) noexcept;
   ~PropertyListValue() {
@@ -107,12 +111,22 @@ struct MARLET_EXPORT PropertyListValue {
   const PropertyListValue& propertyListValue() const { return *this; }
 
  private:
+  /// What the variant's own move does, in code that compilers inline: readers move every value once.
+  static Payload moved(Payload& payload) noexcept;
   void clearContainer() noexcept;
 };
 
 struct PropertyListDictionary::Entry {
-  PropertyListKey key;
+  SharedString key;
   PropertyListValue value;
+
+  Entry() = default;
+  Entry(SharedString itsKey, PropertyListValue itsValue)
+      : key(std::move(itsKey)), value(std::move(itsValue)) {}
+  /// The value is made in place.
+  template <class Case, class... Arguments>
+  Entry(SharedString&& itsKey, std::in_place_type_t<Case> named, Arguments&&... arguments)
+      : key(std::move(itsKey)), value(named, std::forward<Arguments>(arguments)...) {}
 };
 
 // Entries hold values, so what handles them has to wait until here.
@@ -122,6 +136,26 @@ inline PropertyListDictionary& PropertyListDictionary::operator=(PropertyListDic
 inline PropertyListDictionary::~PropertyListDictionary() = default;
 inline std::size_t PropertyListDictionary::size() const { return entries_.size(); }
 inline bool PropertyListDictionary::empty() const { return entries_.empty(); }
+inline PropertyListValue::Payload PropertyListValue::moved(Payload& payload) noexcept {
+  switch (payload.index()) {
+    case 0:
+      return Payload(std::in_place_index<0>, std::move(*std::get_if<0>(&payload)));
+    case 1:
+      return Payload(std::in_place_index<1>, std::move(*std::get_if<1>(&payload)));
+    case 2:
+      return Payload(std::in_place_index<2>, std::move(*std::get_if<2>(&payload)));
+    case 3:
+      return Payload(std::in_place_index<3>, std::move(*std::get_if<3>(&payload)));
+    case 4:
+      return Payload(std::in_place_index<4>, *std::get_if<4>(&payload));
+    case 5:
+      return Payload(std::in_place_index<5>, *std::get_if<5>(&payload));
+    case 6:
+      return Payload(std::in_place_index<6>, *std::get_if<6>(&payload));
+    default:
+      return Payload(std::in_place_index<7>, *std::get_if<7>(&payload));
+  }
+}
 inline PropertyListDictionary::Entries::const_iterator PropertyListDictionary::begin() const {
   return entries_.begin();
 }

@@ -89,6 +89,7 @@ MarletChapterSnapshot::MarletChapterSnapshot(const FileWrapper& fileWrapper, con
   const auto pagesWrapper =
       requiredDirectory<E>(fileWrapper, "Pages", Case::missingPagesDirectory, Case::pagesNotADirectory);
   const auto pagesURL = baseURL.appendingPathComponent("Pages", true);
+  pages.reserve(filenames.size());
   for (const auto& element : filenames)
     pages.push_back(loadPage(pagesWrapper, pagesURL, element, userEditsDiffPack));
 }

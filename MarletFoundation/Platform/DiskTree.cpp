@@ -88,6 +88,8 @@ class DiskTree {
   }
 
   Descriptor root;
+  std::string scratchPath;
+  const TreeMemory memory = std::make_shared<std::pmr::monotonic_buffer_resource>();
 
  private:
   struct Entry {
@@ -112,7 +114,7 @@ class DiskTree {
   std::vector<Entry> open_;
 };
 
-DiskDirectory::DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string name)
+DiskDirectory::DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, SharedString name)
     : parent_(std::move(parent)),
       name_(std::move(name)),
       tree_(parent_ ? parent_->tree_ : nullptr),
@@ -126,19 +128,22 @@ DiskDirectory::~DiskDirectory() {
 }
 
 std::shared_ptr<DiskDirectory> DiskDirectory::root(Descriptor descriptor) {
-  auto directory = std::make_shared<DiskDirectory>(Key(), nullptr, std::string());
+  auto directory = std::make_shared<DiskDirectory>(Key(), nullptr, SharedString());
   directory->ownTree_ = std::make_unique<DiskTree>();
   directory->tree_ = directory->ownTree_.get();
   directory->tree_->root = std::move(descriptor);
   return directory;
 }
 
-std::shared_ptr<DiskDirectory> DiskDirectory::child(std::shared_ptr<DiskDirectory> parent, std::string name,
+std::shared_ptr<DiskDirectory> DiskDirectory::child(std::shared_ptr<DiskDirectory> parent, SharedString name,
                                                     Descriptor opened) {
-  auto directory = std::make_shared<DiskDirectory>(Key(), std::move(parent), std::move(name));
+  const TreeAllocator<DiskDirectory> memory(parent->memory());
+  auto directory = std::allocate_shared<DiskDirectory>(memory, Key(), std::move(parent), std::move(name));
   if (opened) directory->parent_->keep(std::move(opened), directory->descriptor_);
   return directory;
 }
+
+const TreeMemory& DiskDirectory::memory() const { return tree_->memory; }
 
 int DiskDirectory::descriptor() {
   if (!parent_) return tree_->root.get();
@@ -164,7 +169,8 @@ int DiskDirectory::status(const char* name, struct stat& status) {
 Descriptor DiskDirectory::openThroughParent(const char* name, int flags) {
   const int number = parent_->descriptor();
   if (number < 0) return Descriptor();
-  const auto path = name_ + "/" + name;
+  auto& path = tree_->scratchPath;
+  path.assign(name_.view()).append("/").append(name);
   return Descriptor(tree_->openPathAt(parent_.get(), number, path.c_str(), flags));
 }
 
@@ -204,6 +210,15 @@ std::optional<std::vector<DiskDirectory::Entry>> DiskDirectory::entries() {
   return result;
 }
 
+SharedString DiskDirectory::sharedName(std::string_view name) {
+  if (!parent_) return SharedString(name);
+  for (auto& known : parent_->namesInDirectories_) {
+    if (known.view() == name) return known;
+    if (known.empty()) return known = SharedString(name);
+  }
+  return SharedString(name);
+}
+
 void DiskDirectory::setRoot(Descriptor descriptor) {
   tree_->closeAllBut(nullptr);
   tree_->root = std::move(descriptor);
@@ -221,7 +236,8 @@ std::string DiskDirectory::path() const {
     chain.push_back(directory);
   }
   std::string path;
-  for (auto next = chain.rbegin(); next != chain.rend(); ++next) path.append((*next)->name_).append(1, '/');
+  for (auto next = chain.rbegin(); next != chain.rend(); ++next)
+    path.append((*next)->name_.view()).append(1, '/');
   return path;
 }
 

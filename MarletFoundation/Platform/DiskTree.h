@@ -1,10 +1,13 @@
 #pragma once
 
+#include <array>
 #include <memory>
 #include <string>
 #include <vector>
 
 #include "MarletFoundation/Platform/Descriptor.h"
+#include "MarletFoundation/Platform/SharedString.h"
+#include "MarletFoundation/Platform/TreeAllocator.h"
 
 namespace MarletFoundation {
 
@@ -22,10 +25,10 @@ class DiskDirectory {
   static std::shared_ptr<DiskDirectory> root(Descriptor descriptor);
   /// A directory by name, with its descriptor when it is open already. Otherwise it isn't looked at before it
   /// is used.
-  static std::shared_ptr<DiskDirectory> child(std::shared_ptr<DiskDirectory> parent, std::string name,
+  static std::shared_ptr<DiskDirectory> child(std::shared_ptr<DiskDirectory> parent, SharedString name,
                                               Descriptor opened = {});
   struct Key {};  // only the functions above make directories
-  DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, std::string name);
+  DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, SharedString name);
   ~DiskDirectory();
   DiskDirectory(const DiskDirectory&) = delete;
   DiskDirectory& operator=(const DiskDirectory&) = delete;
@@ -53,13 +56,17 @@ class DiskDirectory {
   void setRoot(Descriptor descriptor);
   /// The root of this directory's tree.
   DiskDirectory& rootDirectory();
+  /// Where the nodes of this directory's tree are kept.
+  const TreeMemory& memory() const;
   const std::shared_ptr<DiskDirectory>& parent() const { return parent_; }
-  const std::string& name() const { return name_; }
+  const SharedString& name() const { return name_; }
   /// The path from the tree's root, for messages.
   std::string path() const;
 
-  /// The name that was asked for first in the last of its directories; brothers tend to hold the same names.
-  std::string nameInDirectories;
+  /// A name that is asked for in this directory, shared with its brothers, which tend to hold the same ones.
+  SharedString sharedName(std::string_view name);
+  /// The name that was asked for first in the first of its directories; empty when there was none yet.
+  const SharedString& expectedName() const { return namesInDirectories_[0]; }
 
  private:
   friend class DiskTree;
@@ -67,12 +74,14 @@ class DiskDirectory {
   Descriptor openThroughParent(const char* name, int flags);
 
   std::shared_ptr<DiskDirectory> parent_;
-  std::string name_;
+  SharedString name_;
   std::unique_ptr<DiskTree> ownTree_;  // the root's
   DiskTree* tree_;
   int depth_;  // the root's is 0
   int descriptor_ = -1;
   int openedThroughParent_ = 0;
+  /// The names that were asked for first in its directories, no name twice.
+  std::array<SharedString, 4> namesInDirectories_;
 };
 
 }  // namespace MarletFoundation

@@ -29,35 +29,42 @@ bool FileNode::Stamp::operator==(const Stamp& other) const {
          changed.tv_nsec == other.changed.tv_nsec;
 }
 
+FileNode::Directory::Directory(std::shared_ptr<DiskDirectory> directory)
+    : onDisk(std::move(directory)), children(onDisk ? onDisk->memory() : nullptr) {}
+
+std::shared_ptr<FileNode> FileNode::make(DiskDirectory* tree) {
+  if (!tree) return std::make_shared<FileNode>(Key());
+  return std::allocate_shared<FileNode>(TreeAllocator<FileNode>(tree->memory()), Key());
+}
+
 std::shared_ptr<FileNode> FileNode::inMemory(Data contents) {
-  auto node = std::make_shared<FileNode>(Key());
+  auto node = make(nullptr);
   node->kind_ = Kind::regularFile;
-  node->contents_ = std::move(contents);
-  node->contentsWereRead_ = true;
+  node->facts_ = File{{}, -1, true, std::move(contents)};
   return node;
 }
 
 std::shared_ptr<FileNode> FileNode::directoryInMemory() {
-  auto node = std::make_shared<FileNode>(Key());
+  auto node = make(nullptr);
   node->becomeDirectory(nullptr, true);
-  node->directory_->isListed = true;
+  node->directory().isListed = true;
   return node;
 }
 
-std::shared_ptr<FileNode> FileNode::onDisk(std::shared_ptr<DiskDirectory> parent, std::string_view name) {
-  auto node = std::make_shared<FileNode>(Key());
+std::shared_ptr<FileNode> FileNode::onDisk(std::shared_ptr<DiskDirectory> parent, SharedString name) {
+  auto node = make(parent.get());
   node->parent_ = std::move(parent);
-  node->diskName_ = name;
+  node->diskName_ = std::move(name);
   return node;
 }
 
 std::shared_ptr<FileNode> FileNode::atPath(const std::string& path) {
-  auto node = onDisk(nullptr, path);
+  auto node = onDisk(nullptr, SharedString(path));
   node->lookByName();
   if (node->kind_ == Kind::unreadable) {
     const auto displaced = node->error_ == ENOENT ? AtomicReplacement::displacedPath(path) : std::nullopt;
     if (!displaced) throwPosix(node->error_, path);
-    node = onDisk(nullptr, *displaced);
+    node = onDisk(nullptr, SharedString(*displaced));
     node->lookByName();
   }
   if (node->kind_ == Kind::directory) {
@@ -71,25 +78,28 @@ std::shared_ptr<FileNode> FileNode::atPath(const std::string& path) {
 }
 
 FileNode::~FileNode() {
-  if (descriptor_ >= 0) parent_->forget(descriptor_);
-  if (!directory_) return;
+  if (file() && file()->descriptor >= 0) parent_->forget(file()->descriptor);
+  auto* const directory = std::get_if<Directory>(&facts_);
+  if (!directory || directory->children.empty()) return;
   // Level by level: a tree may be deeper than the stack.
-  std::vector<std::unique_ptr<Directory>> pending;
-  pending.push_back(std::move(directory_));
+  std::vector<Children> pending;
+  pending.push_back(std::move(directory->children));
   while (!pending.empty()) {
-    const auto directory = std::move(pending.back());
+    const auto children = std::move(pending.back());
     pending.pop_back();
-    for (const auto& [name, node] : directory->children) {
-      if (node && node->directory_ && node.use_count() == 1) pending.push_back(std::move(node->directory_));
+    for (const auto& [name, node] : children) {
+      if (!node || node.use_count() > 1) continue;
+      auto* const below = std::get_if<Directory>(&node->facts_);
+      if (below && !below->children.empty()) pending.push_back(std::move(below->children));
     }
   }
 }
 
 std::optional<std::string> FileNode::preferredName() const {
   if (preferredName_) return *preferredName_;
-  if (directory_ && directory_->onDisk && !directory_->onDisk->name().empty())
-    return directory_->onDisk->name();
-  return parent_ ? std::optional(diskName_) : std::nullopt;
+  if (const auto& directory = diskDirectory(); directory && !directory->name().empty())
+    return std::string(directory->name());
+  return parent_ ? std::optional(std::string(diskName_)) : std::nullopt;
 }
 
 void FileNode::setPreferredName(std::string name) {
@@ -113,8 +123,9 @@ void FileNode::look() {
   }
   kind_ = kindOf(status.st_mode);
   if (kind_ == Kind::regularFile) {
-    stamp_ = Stamp(status);
-    parent_->keep(std::move(opened), descriptor_);
+    auto& file = facts_.emplace<File>();
+    file.stamp = Stamp(status);
+    parent_->keep(std::move(opened), file.descriptor);
   } else if (kind_ == Kind::directory) {
     becomeDirectory(DiskDirectory::child(parent_, diskName_, std::move(opened)), true);
   }
@@ -132,13 +143,11 @@ void FileNode::lookByName() {
 
 void FileNode::becomeDirectory(std::shared_ptr<DiskDirectory> onDisk, std::optional<bool> wasOpened) {
   kind_ = Kind::directory;
-  directory_ = std::make_unique<Directory>();
-  directory_->onDisk = std::move(onDisk);
-  directory_->wasOpened = wasOpened;
+  facts_.emplace<Directory>(std::move(onDisk)).wasOpened = wasOpened;
 }
 
 FileNode::Kind FileNode::kind() {
-  if (kind_ == Kind::directory && !directory_) {
+  if (kind_ == Kind::directory && !std::holds_alternative<Directory>(facts_)) {
     becomeDirectory(DiskDirectory::child(parent_, diskName_), std::nullopt);
   }
   return kind_;
@@ -146,57 +155,58 @@ FileNode::Kind FileNode::kind() {
 
 const std::shared_ptr<DiskDirectory>& FileNode::diskDirectory() const {
   static const std::shared_ptr<DiskDirectory> none;
-  return directory_ ? directory_->onDisk : none;
+  const auto* directory = std::get_if<Directory>(&facts_);
+  return directory ? directory->onDisk : none;
 }
 
 bool FileNode::hasChildren() {
   if (kind() != Kind::directory) return false;
-  if (!directory_->wasOpened) directory_->wasOpened = directory_->onDisk->descriptor() >= 0;
-  return *directory_->wasOpened;
+  auto& [onDisk, children, isListed, wasOpened, expectsDirectories] = directory();
+  if (!wasOpened) wasOpened = onDisk->descriptor() >= 0;
+  return *wasOpened;
 }
 
 std::shared_ptr<FileNode> FileNode::child(std::string_view name) {
   if (kind() != Kind::directory || !isFileName(name)) return nullptr;
-  const auto found = directory_->children.lower_bound(name);
-  if (found != directory_->children.end() && found->first == name) return found->second;
-  if (directory_->isListed || !hasChildren()) return nullptr;
-  return directory_->children.emplace_hint(found, name, lookUp(name))->second;
+  auto& children = directory().children;
+  const auto found = children.lower_bound(name);
+  if (found != children.end() && found->first.view() == name) return found->second;
+  if (directory().isListed || !hasChildren()) return nullptr;
+  auto shared = directory().onDisk->sharedName(name);
+  auto child = lookUp(shared);
+  return children.emplace_hint(found, std::move(shared), std::move(child))->second;
 }
 
 /// Finds a directory by opening in it what its brother was first asked for: the file proves the directory, and is
 /// likely to be asked for next. Null when that isn't there, which tells nothing.
-std::shared_ptr<FileNode> FileNode::lookUpByContent(std::string_view name) {
-  const auto& expected = directory_->onDisk->nameInDirectories;
+std::shared_ptr<FileNode> FileNode::lookUpByContent(const SharedString& name) {
+  const auto& expected = directory().onDisk->expectedName();
   if (expected.empty()) return nullptr;
-  auto directory = DiskDirectory::child(directory_->onDisk, std::string(name));
-  auto content = onDisk(directory, expected);
+  auto below = DiskDirectory::child(directory().onDisk, name);
+  auto content = onDisk(below, expected);
   content->look();
   if (content->kind_ == Kind::unreadable) return nullptr;
-  auto node = std::make_shared<FileNode>(Key());
-  node->becomeDirectory(std::move(directory), true);
-  node->directory_->children.emplace(expected, std::move(content));
+  auto node = make(below.get());
+  node->becomeDirectory(std::move(below), true);
+  node->directory().children.emplace(expected, std::move(content));
   return node;
 }
 
-std::shared_ptr<FileNode> FileNode::lookUp(std::string_view name) {
-  const auto& onDiskDirectory = directory_->onDisk;
-  if (directory_->children.empty() && onDiskDirectory->parent()) {
-    onDiskDirectory->parent()->nameInDirectories = name;
-  }
-  if (directory_->expectsDirectories) {
+std::shared_ptr<FileNode> FileNode::lookUp(const SharedString& name) {
+  auto& own = directory();
+  if (own.expectsDirectories) {
     if (auto node = lookUpByContent(name)) return node;
-    std::string text(name);
-    if (auto opened = onDiskDirectory->open(text.c_str(), DirectoryFlags)) {
-      auto node = std::make_shared<FileNode>(Key());
-      node->becomeDirectory(DiskDirectory::child(onDiskDirectory, std::move(text), std::move(opened)), true);
+    if (auto opened = own.onDisk->open(name.c_str(), DirectoryFlags)) {
+      auto node = make(own.onDisk.get());
+      node->becomeDirectory(DiskDirectory::child(own.onDisk, name, std::move(opened)), true);
       return node;
     }
     if (isAbsence(errno)) return nullptr;
   }
-  auto node = onDisk(onDiskDirectory, name);
+  auto node = onDisk(own.onDisk, name);
   node->look();
   if (node->kind_ == Kind::unreadable && isAbsence(node->error_)) return nullptr;
-  directory_->expectsDirectories = node->kind_ == Kind::directory;
+  own.expectsDirectories = node->kind_ == Kind::directory;
   return node;
 }
 
@@ -205,52 +215,58 @@ const FileNode::Children* FileNode::allChildren() {
     errno = kind_ == Kind::directory ? EACCES : ENOTDIR;
     return nullptr;
   }
-  auto& [onDiskDirectory, children, isListed, wasOpened, expectsDirectories] = *directory_;
+  auto& [onDiskDirectory, children, isListed, wasOpened, expectsDirectories] = directory();
   if (isListed) return &children;
   const auto entries = onDiskDirectory->entries();
   if (!entries) return nullptr;
-  for (const auto& [name, type] : *entries) {
-    const auto [place, isNew] = children.try_emplace(name);
-    if (!isNew) continue;
-    place->second = onDisk(onDiskDirectory, name);
+  for (const auto& [entryName, type] : *entries) {
+    const auto place = children.lower_bound(entryName);
+    if (place != children.end() && place->first.view() == entryName) continue;
+    const SharedString name(entryName);
+    auto node = onDisk(onDiskDirectory, name);
     if (type == DT_UNKNOWN) {
-      place->second->lookByName();
+      node->lookByName();
     } else {
-      place->second->kind_ = kindOf(DTTOIF(type));
+      node->kind_ = kindOf(DTTOIF(type));
     }
+    children.emplace_hint(place, name, std::move(node));
   }
   isListed = true;
   return &children;
 }
 
-void FileNode::setChild(std::string name, std::shared_ptr<FileNode> child) {
-  directory_->children.insert_or_assign(std::move(name), std::move(child));
+void FileNode::setChild(std::string_view name, std::shared_ptr<FileNode> child) {
+  directory().children.insert_or_assign(SharedString(name), std::move(child));
 }
 
 void FileNode::removeChild(std::string_view name) {
-  if (kind() == Kind::directory) directory_->children.insert_or_assign(std::string(name), nullptr);
+  if (kind() == Kind::directory) setChild(name, nullptr);
 }
 
 std::optional<Data> FileNode::contents() {
   if (kind() != Kind::regularFile) return std::nullopt;
-  if (!contentsWereRead_) readContents();
-  return isLoaded() ? std::optional(contents_) : std::nullopt;
+  if (!file() || !file()->wasRead) readContents();
+  return isLoaded() ? std::optional(file()->contents) : std::nullopt;
 }
 
 void FileNode::readContents() {
-  contentsWereRead_ = true;
   Descriptor opened;
-  if (descriptor_ < 0) {
+  if (!file() || file()->descriptor < 0) {
     struct stat status;
     opened = openRegularFile(status);
+    const int error = errno;
+    auto& known = facts_.emplace<File>();
+    known.wasRead = true;
     if (!opened) {
-      error_ = errno;
+      error_ = error;
       return;
     }
-    stamp_ = Stamp(status);
+    known.stamp = Stamp(status);
   }
-  auto read = readToEnd(opened ? opened.get() : descriptor_, stamp_.size);
-  contents_ = std::move(read.data);
+  auto& known = *std::get_if<File>(&facts_);
+  auto read = readToEnd(opened ? opened.get() : known.descriptor, known.stamp.size);
+  known.wasRead = true;
+  known.contents = std::move(read.data);
   error_ = read.error;
 }
 

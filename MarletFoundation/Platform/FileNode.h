@@ -5,9 +5,12 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <variant>
 
 #include "MarletFoundation/Platform/Data.h"
 #include "MarletFoundation/Platform/DiskTree.h"
+#include "MarletFoundation/Platform/SharedString.h"
+#include "MarletFoundation/Platform/TreeAllocator.h"
 
 namespace MarletFoundation {
 
@@ -17,7 +20,12 @@ class FileNode {
  public:
   enum class Kind : unsigned char { directory, regularFile, symbolicLink, other, unreadable };
   /// Children by name, as far as they were looked at; null stands for one that isn't there.
-  using Children = std::map<std::string, std::shared_ptr<FileNode>, std::less<>>;
+  struct ByName {
+    using is_transparent = void;
+    bool operator()(std::string_view a, std::string_view b) const { return a < b; }
+  };
+  using Children = std::map<SharedString, std::shared_ptr<FileNode>, ByName,
+                            TreeAllocator<std::pair<const SharedString, std::shared_ptr<FileNode>>>>;
 
   /// What a look at an open file found, enough to tell whether it has changed since.
   struct Stamp {
@@ -51,19 +59,19 @@ class FileNode {
   std::shared_ptr<FileNode> child(std::string_view name);
   /// All children; null and errno when they can't be listed. Names that aren't there may map to null.
   const Children* allChildren();
-  void setChild(std::string name, std::shared_ptr<FileNode> child);
+  void setChild(std::string_view name, std::shared_ptr<FileNode> child);
   void removeChild(std::string_view name);
   /// The bytes of a regular file, read at first call; nothing when they can't be read.
   std::optional<Data> contents();
 
   /// Whether a regular file's bytes are held in memory.
-  bool isLoaded() const { return contentsWereRead_ && error_ == 0; }
+  bool isLoaded() const { return file() && file()->wasRead && error_ == 0; }
   bool isOnDisk() const { return !diskName_.empty(); }
-  /// What the look found that came before the bytes were read.
-  const Stamp& stamp() const { return stamp_; }
+  /// What the look found that came before the bytes of a file were read.
+  const Stamp& stamp() const { return file()->stamp; }
   /// The directory on disk that holds a file or link under `diskName`. Without one, that name is a path.
   const std::shared_ptr<DiskDirectory>& parent() const { return parent_; }
-  const std::string& diskName() const { return diskName_; }
+  const SharedString& diskName() const { return diskName_; }
   /// The directory on disk that a directory node stands for; null for one in memory.
   const std::shared_ptr<DiskDirectory>& diskDirectory() const;
   /// Looks at the item on disk as it is now; what the node knows stays.
@@ -72,7 +80,16 @@ class FileNode {
   Descriptor openOnDisk();
 
  private:
+  struct File {
+    Stamp stamp;
+    int descriptor = -1;  // in a directory, from the look on: a slot of its tree
+    bool wasRead = false;
+    Data contents;
+  };
+
   struct Directory {
+    explicit Directory(std::shared_ptr<DiskDirectory> directory);
+
     std::shared_ptr<DiskDirectory> onDisk;
     Children children;
     /// Whether `children` are all.
@@ -84,25 +101,27 @@ class FileNode {
     bool expectsDirectories = false;
   };
 
-  static std::shared_ptr<FileNode> onDisk(std::shared_ptr<DiskDirectory> parent, std::string_view name);
+  /// A node in the memory of a tree on disk; on the heap without one.
+  static std::shared_ptr<FileNode> make(DiskDirectory* tree);
+  static std::shared_ptr<FileNode> onDisk(std::shared_ptr<DiskDirectory> parent, SharedString name);
+  /// What is known of a file once it was looked at, or null.
+  const File* file() const { return std::get_if<File>(&facts_); }
+  /// What is known of a directory, once `kind()` was asked for and found one.
+  Directory& directory() { return *std::get_if<Directory>(&facts_); }
   void look();
   void lookByName();
   void becomeDirectory(std::shared_ptr<DiskDirectory> onDisk, std::optional<bool> wasOpened);
-  std::shared_ptr<FileNode> lookUp(std::string_view name);
-  std::shared_ptr<FileNode> lookUpByContent(std::string_view name);
+  std::shared_ptr<FileNode> lookUp(const SharedString& name);
+  std::shared_ptr<FileNode> lookUpByContent(const SharedString& name);
   void readContents();
   Descriptor openRegularFile(struct stat& status);
 
   Kind kind_ = Kind::unreadable;
-  bool contentsWereRead_ = false;
-  int descriptor_ = -1;  // of a regular file in a directory, from the look on: a slot of its tree
   int error_ = 0;
   std::unique_ptr<std::string> preferredName_;
   std::shared_ptr<DiskDirectory> parent_;
-  std::string diskName_;
-  std::unique_ptr<Directory> directory_;  // of a directory node
-  Stamp stamp_;
-  Data contents_;
+  SharedString diskName_;
+  std::variant<std::monostate, File, Directory> facts_;
 };
 
 }  // namespace MarletFoundation

@@ -89,7 +89,7 @@ class TreeWriter {
     if (source && sameItem(status, targetStatus_)) fail(EINVAL, *job.target);
     finishes_.push_back({job.target, source ? source : job.original});
     for (const auto& [name, child] : *children) {
-      if (child) writeChild(job, name, child);
+      if (child) writeChild(job, std::string(name), child);
     }
   }
 
@@ -100,7 +100,7 @@ class TreeWriter {
         auto original = originalDirectory(job, name);
         const mode_t mode = child->diskDirectory() || original ? 0700 : 0777;
         if (::mkdirat(job.target->descriptor(), name.c_str(), mode) != 0) fail(errno, *job.target, name);
-        jobs_.push_back({child, DiskDirectory::child(job.target, name), std::move(original)});
+        jobs_.push_back({child, DiskDirectory::child(job.target, SharedString(name)), std::move(original)});
         return;
       }
       case FileNode::Kind::regularFile:
@@ -119,7 +119,7 @@ class TreeWriter {
     struct stat status;
     if (!job.original || job.original->status(name.c_str(), status) != 0 || !S_ISDIR(status.st_mode))
       return nullptr;
-    return DiskDirectory::child(job.original, name);
+    return DiskDirectory::child(job.original, SharedString(name));
   }
 
   /// Lets the new document share a file that is as it was with the document it replaces.
@@ -237,6 +237,7 @@ void FileWrapper::write(const URL& url) const {
   const bool hasAttributes = node_->diskDirectory() || replacement.replacesDirectory();
   const auto target = replacement.makeDirectory(hasAttributes ? 0700 : 0777);
   TreeWriter(replacement, target).write(node_);
+  if (wasReplaced()) throwPosix(ESTALE, path, "The document was replaced after it had been opened.");
   replacement.commit();
   // The tree that was read goes on in its own copy: the one it was opened in is gone.
   const auto& source = node_->diskDirectory();

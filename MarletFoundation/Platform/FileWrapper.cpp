@@ -41,9 +41,18 @@ std::optional<FileWrapper::Children> FileWrapper::fileWrappers() const {
   if (!children) return std::nullopt;
   Children wrappers;
   for (const auto& [name, child] : *children) {
-    if (child && child->kind() != FileNode::Kind::unreadable) wrappers.emplace(name, FileWrapper(child));
+    if (child && child->kind() != FileNode::Kind::unreadable)
+      wrappers.emplace(name.view(), FileWrapper(child));
   }
   return wrappers;
+}
+
+bool FileWrapper::wasReplaced() const {
+  const auto& directory = node_->diskDirectory();
+  struct stat opened, now;
+  if (!directory || directory->parent() || ::fstat(directory->descriptor(), &opened) != 0) return false;
+  if (opened.st_nlink == 0) return true;
+  return node_->lookAgain(now) == 0 && (now.st_dev != opened.st_dev || now.st_ino != opened.st_ino);
 }
 
 std::optional<std::string> FileWrapper::preferredFilename() const { return node_->preferredName(); }
@@ -54,7 +63,7 @@ void FileWrapper::addFileWrapper(FileWrapper child) {
   if (!isDirectory()) fatalError("A file wrapper that isn't a directory takes no children.");
   auto name = child.preferredFilename();
   if (!name) fatalError("A file wrapper needs a preferred file name to be added to a directory.");
-  node_->setChild(std::move(*name), std::move(child.node_));
+  node_->setChild(*name, std::move(child.node_));
 }
 
 void FileWrapper::removeFileWrapper(std::string_view name) { node_->removeChild(name); }

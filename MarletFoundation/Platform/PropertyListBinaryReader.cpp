@@ -1,8 +1,9 @@
+#include <algorithm>
+#include <array>
 #include <bit>
 #include <cmath>
 #include <cstring>
 #include <limits>
-#include <vector>
 
 #include "MarletFoundation/Platform/PropertyListError.h"
 #include "MarletFoundation/Platform/PropertyListEvents.h"
@@ -23,7 +24,7 @@ struct OpenContainer {
   std::size_t values;
   std::size_t keys;
   std::uint64_t count;
-  std::uint64_t next = 0;
+  std::uint64_t next;
   bool isDictionary;
 };
 
@@ -51,6 +52,8 @@ class BinaryReader {
   std::string_view body(std::size_t object, std::size_t place, std::uint64_t count,
                         std::size_t unitSize) const;
   void spend(std::size_t nodes, std::size_t textBytes, std::size_t place);
+  /// Whether an open container lies within itself. A cycle is looked for only where it ends: at a limit.
+  bool isCyclic() const;
 
   [[noreturn]] void fail(PropertyListErrorCode code, std::size_t place, std::string_view detail = {}) const {
     throw propertyListError(code, detail, place);
@@ -63,9 +66,9 @@ class BinaryReader {
   std::uint64_t objectCount_ = 0;
   std::uint64_t rootObject_ = 0;
   std::size_t tableOffset_ = 0;
-  std::vector<OpenContainer> open_;
-  // For each object, whether it is an open container.
-  std::vector<bool> isOpen_;
+  // The open containers, the first `depth_` of these.
+  std::array<OpenContainer, PropertyListDepthLimit> open_;
+  std::size_t depth_ = 0;
   std::string scratch_;
   // What sharing may still expand to.
   std::size_t nodesLeft_ = 0;
@@ -74,12 +77,10 @@ class BinaryReader {
 
 void BinaryReader::read() {
   readTrailer();
-  isOpen_.resize(objectCount_);
-  open_.reserve(16);
   nodesLeft_ = 4 * bytes_.size() + 1024;
   textLeft_ = 16 * bytes_.size() + 65536;
   readValue(rootObject_, bytes_.size() - 16);
-  while (!open_.empty()) readNextChild();
+  while (depth_ > 0) readNextChild();
 }
 
 void BinaryReader::readTrailer() {
@@ -101,9 +102,11 @@ void BinaryReader::readTrailer() {
 }
 
 inline std::uint64_t BinaryReader::unsignedAt(std::size_t place, std::size_t width) const {
-  if (width == 1) return static_cast<std::uint8_t>(bytes_[place]);
+  const auto byteAt = [this](std::size_t at) { return std::uint64_t{static_cast<std::uint8_t>(bytes_[at])}; };
+  if (width == 1) return byteAt(place);
+  if (width == 2) return byteAt(place) << 8 | byteAt(place + 1);
   std::uint64_t number = 0;
-  for (std::size_t i = 0; i < width; ++i) number = number << 8 | static_cast<std::uint8_t>(bytes_[place + i]);
+  for (std::size_t i = 0; i < width; ++i) number = number << 8 | byteAt(place + i);
   return number;
 }
 
@@ -200,9 +203,8 @@ std::string_view BinaryReader::text(std::size_t place) {
   const auto length = count(start);
   const auto units = body(place, start, length, isASCII ? 1 : 2);
   if (isASCII) {
-    const auto high = PropertyListText::findNonASCII(units);
-    if (high != PropertyListText::npos) fail(invalidString, start + high, "ASCII");
-    return units;
+    if (PropertyListText::isASCII(units)) return units;
+    fail(invalidString, start + PropertyListText::findNonASCII(units), "ASCII");
   }
   scratch_.clear();
   const auto read = PropertyListText::appendUTF8FromUTF16(scratch_, units, true);
@@ -214,11 +216,9 @@ void BinaryReader::open(std::uint64_t object, std::size_t place, bool isDictiona
   auto start = place;
   const auto length = count(start);
   body(place, start, length, isDictionary ? 2 * referenceWidth_ : referenceWidth_);
-  if (isOpen_[object]) fail(cycle, place);
-  if (open_.size() == PropertyListDepthLimit) fail(tooDeep, place);
-  isOpen_[object] = true;
+  if (depth_ == PropertyListDepthLimit) fail(isCyclic() ? cycle : tooDeep, place);
   const auto values = isDictionary ? start + static_cast<std::size_t>(length) * referenceWidth_ : start;
-  open_.push_back({object, values, start, length, 0, isDictionary});
+  open_[depth_++] = {object, values, start, length, 0, isDictionary};
   if (isDictionary) {
     events_.beginDictionary();
   } else {
@@ -227,10 +227,9 @@ void BinaryReader::open(std::uint64_t object, std::size_t place, bool isDictiona
 }
 
 void BinaryReader::readNextChild() {
-  auto& container = open_.back();
+  auto& container = open_[depth_ - 1];
   if (container.next == container.count) {
-    isOpen_[container.object] = false;
-    open_.pop_back();
+    --depth_;
     return events_.end();
   }
   const auto distance = static_cast<std::size_t>(container.next++) * referenceWidth_;
@@ -256,14 +255,24 @@ std::uint64_t BinaryReader::count(std::size_t& place) const {
 
 std::string_view BinaryReader::body(std::size_t object, std::size_t place, std::uint64_t count,
                                     std::size_t unitSize) const {
-  if (count > (tableOffset_ - place) / unitSize) fail(lengthOutOfRange, object);
+  const auto left = tableOffset_ - place;
+  if (count > (unitSize == 1 ? left : left / unitSize)) fail(lengthOutOfRange, object);
   return bytes_.substr(place, static_cast<std::size_t>(count) * unitSize);
 }
 
 inline void BinaryReader::spend(std::size_t nodes, std::size_t textBytes, std::size_t place) {
-  if (nodes > nodesLeft_ || textBytes > textLeft_) fail(tooMuchSharing, place);
+  if (nodes > nodesLeft_ || textBytes > textLeft_) fail(isCyclic() ? cycle : tooMuchSharing, place);
   nodesLeft_ -= nodes;
   textLeft_ -= textBytes;
+}
+
+bool BinaryReader::isCyclic() const {
+  const auto end = open_.begin() + static_cast<std::ptrdiff_t>(depth_);
+  for (auto outer = open_.begin(); outer != end; ++outer) {
+    const auto isSame = [outer](const OpenContainer& inner) { return inner.object == outer->object; };
+    if (std::any_of(outer + 1, end, isSame)) return true;
+  }
+  return false;
 }
 
 }  // namespace

@@ -74,6 +74,7 @@ PropertyListXMLText::PropertyListXMLText(std::string_view bytes) {
     if (hasMark) checkDeclaration(text_, "utf-8");
     if (!name.empty() && name != "utf-8" && name != "utf8") readDeclared(text_, encoding);
   }
+  if (PropertyListText::findUnusual(text_) == PropertyListText::npos) return;
   const auto illFormed = PropertyListText::findInvalidUTF8(text_);
   if (illFormed != PropertyListText::npos)
     throw propertyListError(invalidEncoding, {}, documentOffset(illFormed), lineAt(text_, illFormed));

@@ -1,9 +1,16 @@
 #include "MarletFoundation/Platform/PropertyListText.h"
 
 #include <algorithm>
+#include <cstring>
 
 namespace MarletFoundation::PropertyListText {
 namespace {
+
+std::uint64_t wordAt(const char* place) {
+  std::uint64_t word;
+  std::memcpy(&word, place, sizeof word);
+  return word;
+}
 
 std::uint8_t byteAt(std::string_view text, std::size_t place) {
   return static_cast<std::uint8_t>(text[place]);
@@ -35,18 +42,12 @@ std::size_t sequenceLength(std::string_view text, std::size_t place) {
 
 std::size_t findNonASCII(std::string_view text) {
   constexpr std::uint64_t highBits = 0x8080808080808080;
-  const auto wordAt = [text](std::size_t at) {
-    std::uint64_t word;
-    std::memcpy(&word, text.data() + at, 8);
-    return word;
-  };
+  const auto isPlain = [text](std::size_t at) { return (wordAt(text.data() + at) & highBits) == 0; };
   std::size_t place = 0;
-  for (; place + 32 <= text.size(); place += 32) {
-    if ((wordAt(place) | wordAt(place + 8) | wordAt(place + 16) | wordAt(place + 24)) & highBits) break;
-  }
-  for (; place + 8 <= text.size(); place += 8) {
-    if (wordAt(place) & highBits) break;
-  }
+  while (place + 8 <= text.size() && isPlain(place)) place += 8;
+  // The last word overlaps the one before it.
+  if (place < text.size() && text.size() >= 8 && place + 8 > text.size() && isPlain(text.size() - 8))
+    return npos;
   for (; place < text.size(); ++place) {
     if (byteAt(text, place) > 0x7F) return place;
   }
@@ -67,31 +68,51 @@ std::size_t findInvalidUTF8(std::string_view text) {
   }
 }
 
-std::size_t findInvalidXMLCharacter(std::string_view text) {
-  const auto isSuspect = [text](std::size_t place) {
-    const auto byte = byteAt(text, place);
-    return ((byte < 0x20) & (byte != '\t') & (byte != '\n') & (byte != '\r')) | (byte == 0xEF);
+std::size_t findUnusual(std::string_view text) {
+  // Signed, so that one comparison finds the controls and what is no ASCII.
+  using Block = signed char __attribute__((vector_size(16)));
+  constexpr std::size_t blockSize = sizeof(Block);
+  const auto unusual = [](Block block) {
+    return (block < 0x20) & (block != '\t') & (block != '\n') & (block != '\r');
   };
-  constexpr std::size_t blockSize = 64;
+  const auto blockAt = [text](std::size_t at) {
+    Block block;
+    std::memcpy(&block, text.data() + at, blockSize);
+    return block;
+  };
+  const auto any = [](const auto& mask) {
+    std::uint64_t halves[2];
+    std::memcpy(halves, &mask, blockSize);
+    return (halves[0] | halves[1]) != 0;
+  };
   std::size_t place = 0;
-  while (place < text.size()) {
-    // A whole block is tested without a branch, which compilers turn into a few wide instructions.
-    bool hasSuspect = text.size() - place < blockSize;
-    if (!hasSuspect) {
-      std::uint8_t any = 0;
-      for (std::size_t i = 0; i < blockSize; ++i) any |= static_cast<std::uint8_t>(isSuspect(place + i));
-      hasSuspect = any != 0;
-    }
-    const auto end = std::min(place + blockSize, text.size());
-    for (; hasSuspect && place < end; ++place) {
-      if (!isSuspect(place)) continue;
-      const bool isNonCharacter =
-          byteAt(text, place) == 0xEF && byteAt(text, place + 1) == 0xBF && byteAt(text, place + 2) >= 0xBE;
-      if (byteAt(text, place) < 0x20 || isNonCharacter) return place;
-    }
-    place = end;
+  for (; place + 4 * blockSize <= text.size(); place += 4 * blockSize) {
+    if (any(unusual(blockAt(place)) | unusual(blockAt(place + blockSize)) |
+            unusual(blockAt(place + 2 * blockSize)) | unusual(blockAt(place + 3 * blockSize))))
+      break;
+  }
+  for (; place + blockSize <= text.size(); place += blockSize) {
+    if (any(unusual(blockAt(place)))) break;
+  }
+  for (; place < text.size(); ++place) {
+    const char c = text[place];
+    if (static_cast<signed char>(c) < 0x20 && c != '\t' && c != '\n' && c != '\r') return place;
   }
   return npos;
+}
+
+std::size_t findInvalidXMLCharacter(std::string_view text) {
+  std::size_t place = 0;
+  while (true) {
+    const auto unusual = findUnusual(text.substr(place));
+    if (unusual == npos) return npos;
+    place += unusual;
+    if (byteAt(text, place) < 0x20) return place;
+    for (; place < text.size() && byteAt(text, place) > 0x7F; ++place) {
+      if (byteAt(text, place) == 0xEF && byteAt(text, place + 1) == 0xBF && byteAt(text, place + 2) >= 0xBE)
+        return place;
+    }
+  }
 }
 
 bool isXMLCharacter(char32_t character) {

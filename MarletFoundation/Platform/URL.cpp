@@ -124,6 +124,11 @@ std::string_view lastComponent(std::string_view path) {
   return path == "/" ? path : path.substr(path.rfind('/') + 1);
 }
 
+std::string_view extensionOf(std::string_view name) {
+  const auto dot = name.rfind('.');
+  return dot == std::string_view::npos || dot == 0 ? std::string_view() : name.substr(dot + 1);
+}
+
 std::string joined(std::string_view path, std::string_view component) {
   while (component.starts_with('/')) component.remove_prefix(1);
   std::string result;
@@ -232,9 +237,8 @@ std::string URL::lastPathComponent() const {
 }
 
 std::string URL::pathExtension() const {
-  const auto name = lastPathComponent();
-  const auto dot = name.rfind('.');
-  return dot == std::string::npos || dot == 0 ? std::string() : name.substr(dot + 1);
+  if (isFile_) return std::string(extensionOf(lastComponent(text_)));
+  return std::string(extensionOf(lastPathComponent()));
 }
 
 std::vector<std::string> URL::pathComponents() const {

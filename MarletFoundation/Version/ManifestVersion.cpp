@@ -5,11 +5,12 @@
 namespace MarletFoundation {
 
 ManifestVersionVerdict judgeManifestVersion(std::string_view version) {
-  const auto pieces = split(version, '.');
-  if (pieces.size() < 2) return ManifestVersionVerdict::invalid;
-  const auto major = parseDecimalInteger(pieces[0]);
+  const auto dot = version.find('.');
+  if (dot == std::string_view::npos) return ManifestVersionVerdict::invalid;
+  const auto major = parseDecimalInteger(version.substr(0, dot));
   if (!major || *major < 1) return ManifestVersionVerdict::invalid;
-  const auto minor = parseDecimalInteger(pieces[1]);
+  const auto rest = version.substr(dot + 1);
+  const auto minor = parseDecimalInteger(rest.substr(0, rest.find('.')));
   if (!minor || *minor < 0) return ManifestVersionVerdict::invalid;
   return *major > CurrentMajorManifestVersion ? ManifestVersionVerdict::tooNew
                                               : ManifestVersionVerdict::readable;

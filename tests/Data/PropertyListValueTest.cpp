@@ -82,7 +82,7 @@ TEST(PropertyListDictionary, IsAMap) {
     for (const auto& [key, number] : pairs) {
       model[key] = number;
       grown[key] = number;
-      entries.push_back({PropertyListKey(key), number});
+      entries.push_back({SharedString(key), number});
     }
     RC_ASSERT(grown == PropertyListDictionary(std::move(entries)));
     RC_ASSERT(grown.erase(gone) == (model.erase(gone) == 1));
