@@ -1,5 +1,6 @@
 #include "Guarded.h"
 
+#include "ErrorWords.h"
 #include "FatalProblem.h"
 #include "JSON.h"
 #include "MarletFoundation/Platform/ErrorObject.h"
@@ -7,9 +8,8 @@
 using namespace MarletFoundation;
 
 std::string inWords(const Error& error) {
-  const ErrorObject object(error);
-  const auto suggestion = object.localizedRecoverySuggestion();
-  return object.localizedDescription() + (suggestion ? ": " + *suggestion : "");
+  const auto suggestion = ErrorObject(error).localizedRecoverySuggestion();
+  return wordsOf(error) + (suggestion ? ": " + *suggestion : "");
 }
 
 ExitStatus guarded(const std::string& path, const Terminal& terminal,

@@ -4,8 +4,7 @@
 #include <filesystem>
 
 #include "Document.h"
-#include "ErrorWords.h"
-#include "FatalProblem.h"
+#include "Guarded.h"
 #include "MarletFoundation/MarletFoundation.h"
 #include "MarletFoundation/Platform/Host.h"
 #include "MarletFoundation/Platform/Text.h"
@@ -16,55 +15,37 @@ using namespace MarletFoundation;
 
 namespace {
 
-struct Refusal {
-  std::string words;
-  ExitStatus status;
-};
-
-/// Runs `make`, which may throw a refusal, and says how it went.
+/// Runs `make` and says what was made.
 template <class Make>
 ExitStatus making(const std::string& what, const Terminal& terminal, Make make) {
-  try {
+  return guarded(what, terminal, [&] {
     make();
     terminal.note("made " + printable(what));
     return ExitStatus::good;
-  } catch (const Refusal& refusal) {
-    terminal.complain(printable(what + ": " + refusal.words));
-    return refusal.status;
-  } catch (const Error& error) {
-    terminal.complain(printable(what + ": " + wordsWithSuggestion(error)));
-  } catch (const FatalProblem& fatal) {
-    terminal.complain(printable(what + ": " + fatal.message));
-  }
-  return ExitStatus::negative;
+  });
 }
 
 void write(const FileWrapper& tree, const URL& url) {
-  try {
-    tree.write(url);
-  } catch (const Error& error) {
-    throw Refusal{wordsOf(error), ExitStatus::failedWrite};
-  }
+  orFailWith(ExitStatus::failedWrite, url.path(), [&] { tree.write(url); });
+}
+
+[[noreturn]] void refuseToOverwrite(const std::string& name) {
+  throw CommandFailure{ExitStatus::failedWrite, name + ": There is something of that name already."};
 }
 
 /// A name from the command line that is to name a directory.
 void requireFilename(const std::string& name) {
   if (name.empty() || name.starts_with('.') || name.find('/') != std::string::npos || !isValidUTF8(name))
-    throw Refusal{"This can't be the name of a directory.", ExitStatus::wrongUsage};
+    throw CommandFailure{ExitStatus::wrongUsage, name + ": This can't be the name of a directory."};
 }
 
 Document openBook(const std::string& path) {
-  try {
-    return Document(path);
-  } catch (const Error& error) {
-    throw Refusal{wordsOf(error), ExitStatus::unreadablePath};
-  }
+  return orFailWith(ExitStatus::unreadablePath, path, [&] { return Document(path); });
 }
 
 void addTo(FileWrapper& parent, const std::string& key, FileWrapper item) {
   auto directory = *parent.child(key);
-  if (directory.child(*item.preferredFilename()))
-    throw Refusal{"There is something of that name already.", ExitStatus::failedWrite};
+  if (directory.child(*item.preferredFilename())) refuseToOverwrite(*item.preferredFilename());
   addListed(parent, key, directory, std::move(item));
 }
 
@@ -77,10 +58,10 @@ ExitStatus makeBook(const std::string& path, const std::optional<std::string>& n
     const auto filename = url.lastPathComponent();
     requireFilename(filename);
     if (url.pathExtension() != "marletbook")
-      throw Refusal{"A book's name ends in \".marletbook\".", ExitStatus::wrongUsage};
+      throw CommandFailure{ExitStatus::wrongUsage, path + ": A book's name ends in \".marletbook\"."};
     std::error_code unknown;
     if (std::filesystem::symlink_status(url.path(), unknown).type() != std::filesystem::file_type::not_found)
-      throw Refusal{"There is something of that name already.", ExitStatus::failedWrite};
+      refuseToOverwrite(path);
     const auto stem = filename.substr(0, filename.rfind('.'));
     write(newBook(filename, name.value_or(stem), identifier ? *identifier : randomUUIDString()), url);
   });

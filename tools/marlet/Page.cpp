@@ -3,8 +3,7 @@
 #include <iostream>
 
 #include "Document.h"
-#include "ErrorWords.h"
-#include "FatalProblem.h"
+#include "Guarded.h"
 #include "JSON.h"
 #include "MarletFoundation/MarletFoundation.h"
 #include "MarletFoundation/Platform/Text.h"
@@ -66,36 +65,21 @@ void printSummary(const BookPageSnapshotType& page, const Terminal& terminal) {
 
 ExitStatus showPage(const std::string& book, const std::string& chapter, const std::string& page,
                     PageOutput output, const Terminal& terminal) {
-  std::optional<Document> document;
-  const auto complain = [&](const std::string& words) {
-    terminal.complain(printable(book + ": " + chapter + ": " + page + ": " + words));
-    return ExitStatus::negative;
-  };
-  try {
-    document.emplace(book);
-  } catch (const Error& error) {
-    terminal.complain(printable(book + ": " + wordsOf(error)));
-    return ExitStatus::unreadablePath;
-  }
-  try {
+  return guarded(book + ": " + chapter + ": " + page, terminal, [&] {
+    const auto document = orFailWith(ExitStatus::unreadablePath, book, [&] { return Document(book); });
     std::optional<DiffPackSnapshot> pack;
-    const MarletBookSnapshot snapshot(document->wrapper, document->url, pack);
-    const auto fetched = snapshotForPageWithFilename(page, chapter, document->url, &snapshot, pack);
+    const MarletBookSnapshot snapshot(document.wrapper, document.url, pack);
+    const auto fetched = snapshotForPageWithFilename(page, chapter, document.url, &snapshot, pack);
+    const auto* code = dynamic_cast<const MarletPageSnapshotType*>(fetched.get());
     if (output == PageOutput::summary) {
       printSummary(*fetched, terminal);
     } else if (output == PageOutput::json) {
       std::cout << dumped(json(*fetched)) << "\n";
-    } else if (const auto* code = dynamic_cast<const MarletPageSnapshotType*>(fetched.get())) {
+    } else if (code) {
       std::cout << sourceOf(*code);
     } else {
-      return complain("A page of this kind has no source.");
+      throw CommandFailure{ExitStatus::negative, page + ": A page of this kind has no source."};
     }
     return ExitStatus::good;
-  } catch (const Error& error) {
-    return complain(wordsWithSuggestion(error));
-  } catch (const FatalProblem& fatal) {
-    return complain(fatal.message);
-  } catch (const NotRepresentable& reason) {
-    return complain(reason.what());
-  }
+  });
 }

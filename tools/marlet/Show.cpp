@@ -3,8 +3,8 @@
 #include <iostream>
 
 #include "Document.h"
-#include "ErrorWords.h"
 #include "FatalProblem.h"
+#include "Guarded.h"
 #include "JSON.h"
 #include "MarletFoundation/MarletFoundation.h"
 
@@ -99,7 +99,7 @@ ExitStatus show(const std::string& path, bool asJSON, const Terminal& terminal) 
     }
     return ExitStatus::good;
   } catch (const Error& error) {
-    terminal.complain(printable(path + ": " + wordsWithSuggestion(error)));
+    terminal.complain(printable(path + ": " + inWords(error)));
   } catch (const FatalProblem& fatal) {
     terminal.complain(printable(path + ": " + fatal.message));
   } catch (const NotRepresentable& reason) {
