@@ -1,9 +1,9 @@
 #include <cerrno>
-#include <span>
 
 #include "MarletFoundation/Data/PropertyListSerializable.h"
 #include "MarletFoundation/DiffPack/DiffPackFormat.h"
 #include "MarletFoundation/DiffPack/DiffPackSnapshot.h"
+#include "MarletFoundation/DiffPack/TreePaths.h"
 #include "MarletFoundation/Platform/RelativePath.h"
 #include "MarletFoundation/Platform/Text.h"
 
@@ -81,23 +81,10 @@ class DiffPackWriter {
             {modifiedContentKey, text(descriptor.modifiedContent)}};
   }
 
-  /// Puts a file where the path says, in directories made as needed; one that is there is used again, and
-  /// gives way if it is a file.
   void place(std::string_view path, FileWrapper file) {
-    const auto components = relativePathComponents(path);
-    if (!components) throw pathError(EINVAL, path);
-    auto directory = root_;
-    for (const auto component : std::span(*components).first(components->size() - 1)) {
-      auto next = directory.child(component);
-      if (!next || !next->hasChildren()) {
-        next = FileWrapper::directory();
-        next->setPreferredFilename(std::string(component));
-        directory.addFileWrapper(*next);
-      }
-      directory = *next;
-    }
-    file.setPreferredFilename(std::string(components->back()));
-    directory.addFileWrapper(std::move(file));
+    const auto names = relativePathComponents(path);
+    if (!names) throw pathError(EINVAL, path);
+    addDescendant(root_, *names, std::move(file));
   }
 
   ErrorObject pathError(int errorNumber, std::string_view path) const {

@@ -23,89 +23,130 @@ struct SplitPath {
   }
 };
 
-/// The names that replacements of an item build under begin alike, whatever the length of the item's name.
-std::string prefixFor(std::string_view name) {
+constexpr std::string_view StageMark = ".stage.";
+constexpr std::string_view DisplacedMark = ".displaced";
+constexpr std::size_t StageLetters = 6;
+/// What the system takes for a name, less the longest that is put around one.
+constexpr std::size_t LongestName = NAME_MAX - 1 - StageMark.size() - StageLetters;
+
+/// How the names begin that stand for an item while it is replaced. A name too long to be added to is cut and
+/// told from others by a digest.
+std::string hiddenName(const std::string& name) {
+  if (name.size() <= LongestName) return "." + name;
   MD5 digest;
   digest.update(name);
-  std::string prefix = ".marlet-";
-  for (int i = 0; const auto byte : digest.final()) {
-    if (i++ == 8) break;
-    prefix += "0123456789abcdef"[byte >> 4];
-    prefix += "0123456789abcdef"[byte & 15];
+  std::string digits;
+  for (const auto byte : digest.final()) {
+    digits += "0123456789abcdef"[byte >> 4];
+    digits += "0123456789abcdef"[byte & 15];
   }
-  return prefix + "-";
+  return "." + name.substr(0, LongestName - digits.size()) + digits;
 }
 
-constexpr std::string_view DisplacedSuffix = "displaced";
+std::string randomLetters() {
+  auto letters = randomUUIDString();
+  std::erase(letters, '-');
+  letters.resize(StageLetters);
+  return letters;
+}
+
+/// Whether the file system or a layer above it can't do what was asked for, rather than that it failed.
+bool isRefusal(int error) {
+  return error == EINVAL || error == ENOSYS || error == EOPNOTSUPP || error == EXDEV;
+}
+
+bool isMountPoint(int parent, const std::string& name) {
+  struct statx status;
+  return ::statx(parent, name.c_str(), AT_SYMLINK_NOFOLLOW, STATX_TYPE, &status) == 0 &&
+         (status.stx_attributes & STATX_ATTR_MOUNT_ROOT) != 0;
+}
 
 }  // namespace
 
-AtomicReplacement::AtomicReplacement(std::string path) : path_(std::move(path)) {
-  findDestination();
-  prefix_ = prefixFor(name_);
-  if (!replaced_) undoHalfReplacement();
+AtomicReplacement::AtomicReplacement(std::string path) : path_(std::move(path)), place_(placeOf(path_)) {
+  stagePrefix_ = hiddenName(place_.name) + std::string(StageMark);
+  displaced_ = hiddenName(place_.name) + std::string(DisplacedMark);
+  if (!place_.item) undoHalfReplacement();
+  if (place_.item && isMountPoint(place_.parent.get(), place_.name)) {
+    throwPosix(EBUSY, path_, "A mount point can't be replaced as a whole.");
+  }
   clearLeftovers();
 }
 
 AtomicReplacement::~AtomicReplacement() {
-  if (!staging_.empty()) removeTree(parent_.get(), staging_);
+  if (!staging_.empty()) removeTree(place_.parent.get(), staging_);
 }
 
-void AtomicReplacement::findDestination() {
-  std::string path = path_;
+AtomicReplacement::Place AtomicReplacement::placeOf(const std::string& path) {
+  std::string way = path;
   for (int links = 0;; ++links) {
-    const SplitPath split(path);
-    name_ = split.name;
-    if (!isFileName(name_)) throwPosix(EINVAL, path_);
-    parent_ =
+    const SplitPath split(way);
+    Place place;
+    place.name = split.name;
+    if (!isFileName(place.name)) throwPosix(EINVAL, path);
+    place.parent =
         Descriptor(retrying([&] { return ::open(split.parent.c_str(), DirectoryFlags & ~O_NOFOLLOW); }));
-    if (!parent_) throwPosix(errno, path_);
+    if (!place.parent) throwPosix(errno, path);
     struct stat status;
-    if (::fstatat(parent_.get(), name_.c_str(), &status, AT_SYMLINK_NOFOLLOW) != 0) {
-      if (errno != ENOENT) throwPosix(errno, path_);
-      return;
+    if (::fstatat(place.parent.get(), place.name.c_str(), &status, AT_SYMLINK_NOFOLLOW) != 0) {
+      if (errno != ENOENT) throwPosix(errno, path);
+      return place;
     }
     if (!S_ISLNK(status.st_mode)) {
-      if (!S_ISREG(status.st_mode) && !S_ISDIR(status.st_mode)) throwPosix(EINVAL, path_);
-      replaced_ = status;
-      return;
+      if (!S_ISREG(status.st_mode) && !S_ISDIR(status.st_mode)) throwPosix(EINVAL, path);
+      place.item = status;
+      return place;
     }
-    if (links == MostLinks) throwPosix(ELOOP, path_);
+    if (links == MostLinks) throwPosix(ELOOP, path);
     std::string target(static_cast<std::size_t>(PATH_MAX), '\0');
-    const auto length = ::readlinkat(parent_.get(), name_.c_str(), target.data(), target.size());
-    if (length < 0) throwPosix(errno, path_);
+    const auto length = ::readlinkat(place.parent.get(), place.name.c_str(), target.data(), target.size());
+    if (length < 0) throwPosix(errno, path);
     target.resize(static_cast<std::size_t>(length));
-    path = target.starts_with('/') ? target : split.parent + target;
+    way = target.starts_with('/') ? target : split.parent + target;
   }
 }
 
 void AtomicReplacement::undoHalfReplacement() {
-  const auto displaced = prefix_ + std::string(DisplacedSuffix);
-  if (::renameat2(parent_.get(), displaced.c_str(), parent_.get(), name_.c_str(), RENAME_NOREPLACE) != 0 &&
-      (errno != EINVAL || ::renameat(parent_.get(), displaced.c_str(), parent_.get(), name_.c_str()) != 0)) {
-    return;
+  if (moveToFreeName(displaced_, place_.name) == 0) place_ = placeOf(path_);
+}
+
+bool AtomicReplacement::isStage(std::string_view name) const {
+  return name.size() == stagePrefix_.size() + StageLetters && name.starts_with(stagePrefix_);
+}
+
+int AtomicReplacement::moveToFreeName(const std::string& from, const std::string& to) {
+  const int parent = place_.parent.get();
+  const int result = ::renameat2(parent, from.c_str(), parent, to.c_str(), RENAME_NOREPLACE);
+  if (result == 0 || !isRefusal(errno)) return result;
+  struct stat status;
+  if (::fstatat(parent, to.c_str(), &status, AT_SYMLINK_NOFOLLOW) == 0) {
+    errno = EEXIST;
+    return -1;
   }
-  findDestination();
+  return ::renameat(parent, from.c_str(), parent, to.c_str());
 }
 
 void AtomicReplacement::clearLeftovers() {
+  // With the item in its place the displaced one is done with. It must not be taken for the item once a part
+  // of it is gone.
+  if (place_.item) moveToFreeName(displaced_, stagePrefix_ + randomLetters());
   const auto entries =
-      DiskDirectory::root(Descriptor(::openat(parent_.get(), ".", DirectoryFlags)))->entries();
+      DiskDirectory::root(Descriptor(::openat(place_.parent.get(), ".", DirectoryFlags)))->entries();
   if (!entries) return;
   for (const auto& entry : *entries) {
-    if (!entry.name.starts_with(prefix_)) continue;
+    if (!isStage(entry.name)) continue;
     struct stat status;
-    if (::fstatat(parent_.get(), entry.name.c_str(), &status, AT_SYMLINK_NOFOLLOW) != 0) continue;
+    if (::fstatat(place_.parent.get(), entry.name.c_str(), &status, AT_SYMLINK_NOFOLLOW) != 0) continue;
     if (!S_ISREG(status.st_mode) && !S_ISDIR(status.st_mode)) continue;
     // Whoever is still building holds a lock on it.
-    const Descriptor left(::openat(parent_.get(), entry.name.c_str(), ReadingFlags | O_NOFOLLOW));
-    if (left && ::flock(left.get(), LOCK_EX | LOCK_NB) == 0) removeTree(parent_.get(), entry.name);
+    const Descriptor left(::openat(place_.parent.get(), entry.name.c_str(), ReadingFlags | O_NOFOLLOW));
+    if (left && ::flock(left.get(), LOCK_EX | LOCK_NB) == 0) removeTree(place_.parent.get(), entry.name);
   }
 }
 
 Descriptor AtomicReplacement::openReplaced() const {
-  Descriptor opened(
-      retrying([&] { return ::openat(parent_.get(), name_.c_str(), ReadingFlags | O_NOFOLLOW); }));
+  Descriptor opened(retrying(
+      [&] { return ::openat(place_.parent.get(), place_.name.c_str(), ReadingFlags | O_NOFOLLOW); }));
   if (!opened) throwPosix(errno, path_);
   return opened;
 }
@@ -113,7 +154,8 @@ Descriptor AtomicReplacement::openReplaced() const {
 int AtomicReplacement::makeFile() {
   const mode_t mode = replacesFile() ? 0600 : 0666;
   start([&] {
-    return Descriptor(::openat(parent_.get(), staging_.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, mode));
+    return Descriptor(
+        ::openat(place_.parent.get(), staging_.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, mode));
   });
   if (replacesFile() && copyAttributes(openReplaced().get(), built_.get()) != 0) throwPosix(errno, path_);
   return built_.get();
@@ -121,8 +163,8 @@ int AtomicReplacement::makeFile() {
 
 std::shared_ptr<DiskDirectory> AtomicReplacement::makeDirectory(mode_t mode) {
   start([&] {
-    if (::mkdirat(parent_.get(), staging_.c_str(), mode) != 0) return Descriptor();
-    return Descriptor(::openat(parent_.get(), staging_.c_str(), DirectoryFlags));
+    if (::mkdirat(place_.parent.get(), staging_.c_str(), mode) != 0) return Descriptor();
+    return Descriptor(::openat(place_.parent.get(), staging_.c_str(), DirectoryFlags));
   });
   Descriptor root(::fcntl(built_.get(), F_DUPFD_CLOEXEC, 0));
   if (!root) throwPosix(errno, path_);
@@ -134,8 +176,9 @@ std::shared_ptr<DiskDirectory> AtomicReplacement::makeDirectory(mode_t mode) {
 template <class Make>
 void AtomicReplacement::start(Make make) {
   for (int attempt = 0; attempt < MostAttempts; ++attempt) {
-    staging_ = prefix_ + randomUUIDString();
+    staging_ = stagePrefix_ + randomLetters();
     built_ = make();
+    if (!built_ && errno == EEXIST) continue;
     if (!built_ && errno != ENOENT) break;
     struct stat status;
     // A file system without locks has none for the other writer, either, who then clears nothing.
@@ -145,19 +188,29 @@ void AtomicReplacement::start(Make make) {
     }
   }
   const int error = built_ ? EBUSY : errno;
-  removeTree(parent_.get(), staging_);
+  if (error != EEXIST) removeTree(place_.parent.get(), staging_);
   staging_.clear();
   throwPosix(error, path_);
 }
 
 void AtomicReplacement::commit() {
   if (::fsync(built_.get()) != 0) throwPosix(errno, path_);
+  requireSamePlace();
   putInPlace();
   ::flock(built_.get(), LOCK_UN);
-  if (::fsync(parent_.get()) != 0 && errno != EINVAL) throwPosix(errno, path_);
+  if (::fsync(place_.parent.get()) != 0 && errno != EINVAL) throwPosix(errno, path_);
   if (staging_.empty()) return;
-  removeTree(parent_.get(), staging_);
+  removeTree(place_.parent.get(), staging_);
   staging_.clear();
+}
+
+void AtomicReplacement::requireSamePlace() const {
+  const auto now = placeOf(path_);
+  struct stat parent, parentNow;
+  const bool isSame = now.name == place_.name && ::fstat(place_.parent.get(), &parent) == 0 &&
+                      ::fstat(now.parent.get(), &parentNow) == 0 && parent.st_dev == parentNow.st_dev &&
+                      parent.st_ino == parentNow.st_ino;
+  if (!isSame) throwPosix(ESTALE, path_, "A link on the way to the document changed while it was written.");
 }
 
 void AtomicReplacement::putInPlace() {
@@ -165,42 +218,38 @@ void AtomicReplacement::putInPlace() {
   if (::fstat(built_.get(), &built) != 0) throwPosix(errno, path_);
   for (int attempt = 0; attempt < MostAttempts; ++attempt) {
     struct stat old;
-    const bool exists = ::fstatat(parent_.get(), name_.c_str(), &old, AT_SYMLINK_NOFOLLOW) == 0;
+    const bool exists = ::fstatat(place_.parent.get(), place_.name.c_str(), &old, AT_SYMLINK_NOFOLLOW) == 0;
     if (!exists && errno != ENOENT) throwPosix(errno, path_);
-    const bool exchanges = exists && (S_ISDIR(old.st_mode) || S_ISDIR(built.st_mode));
-    const unsigned flags = exchanges ? RENAME_EXCHANGE : exists ? 0 : RENAME_NOREPLACE;
-    if (::renameat2(parent_.get(), staging_.c_str(), parent_.get(), name_.c_str(), flags) == 0) {
-      if (!exchanges) staging_.clear();
-      return;
-    }
-    if (exchanges && (errno == EINVAL || errno == ENOSYS)) return replaceInTwoSteps();
-    if (!exists && (errno == EINVAL || errno == ENOSYS)) {
-      if (::renameat(parent_.get(), staging_.c_str(), parent_.get(), name_.c_str()) != 0)
-        throwPosix(errno, path_);
-      staging_.clear();
-      return;
+    if (!exists) {
+      if (moveToFreeName(staging_, place_.name) == 0) return staging_.clear();
+    } else if (S_ISDIR(old.st_mode) || S_ISDIR(built.st_mode)) {
+      if (::renameat2(place_.parent.get(), staging_.c_str(), place_.parent.get(), place_.name.c_str(),
+                      RENAME_EXCHANGE) == 0)
+        return;
+      if (isRefusal(errno)) return replaceInTwoSteps();
+    } else if (::renameat(place_.parent.get(), staging_.c_str(), place_.parent.get(), place_.name.c_str()) ==
+               0) {
+      return staging_.clear();
     }
     if (errno != ENOENT && errno != EEXIST) throwPosix(errno, path_);
   }
   throwPosix(EBUSY, path_);
 }
 
+/// The displaced item's name is the journal: while nothing bears the item's own name, that one is the item.
 void AtomicReplacement::replaceInTwoSteps() {
-  const auto displaced = prefix_ + std::string(DisplacedSuffix);
-  removeTree(parent_.get(), displaced);
-  if (::renameat(parent_.get(), name_.c_str(), parent_.get(), displaced.c_str()) != 0)
-    throwPosix(errno, path_);
-  if (::renameat(parent_.get(), staging_.c_str(), parent_.get(), name_.c_str()) != 0) {
+  if (moveToFreeName(place_.name, displaced_) != 0) throwPosix(errno, path_);
+  if (::fsync(place_.parent.get()) != 0 || moveToFreeName(staging_, place_.name) != 0) {
     const int error = errno;
-    ::renameat(parent_.get(), displaced.c_str(), parent_.get(), name_.c_str());
+    moveToFreeName(displaced_, place_.name);
     throwPosix(error, path_);
   }
-  staging_ = displaced;
+  if (moveToFreeName(displaced_, staging_) != 0) staging_ = displaced_;
 }
 
 std::optional<std::string> AtomicReplacement::displacedPath(const std::string& path) {
   const SplitPath split(path);
-  auto displaced = split.parent + prefixFor(split.name) + std::string(DisplacedSuffix);
+  auto displaced = split.parent + hiddenName(split.name) + std::string(DisplacedMark);
   struct stat status;
   const bool exists =
       ::lstat(displaced.c_str(), &status) == 0 && (S_ISDIR(status.st_mode) || S_ISREG(status.st_mode));

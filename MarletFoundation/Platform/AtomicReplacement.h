@@ -3,19 +3,22 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <string_view>
 
 #include "MarletFoundation/Platform/Descriptor.h"
 #include "MarletFoundation/Platform/DiskTree.h"
 
 namespace MarletFoundation {
 
-/// Builds a file or directory beside the one whose place it is to take, and changes the two at once. A crash
-/// at any instruction leaves the old item or the new one, and what it left of the other the next replacement
-/// of that item clears away. Failures throw.
+/// Builds a file or directory beside the one whose place it is to take, as `.NAME.stage.XXXXXX`, and changes
+/// the two at once. A crash at any instruction leaves the old item or the new one, and what it left of the
+/// other the next replacement of that item clears away; a lock (flock) tells it what is still being built.
+/// Where the file system can't exchange two names, the old item bears the name `.NAME.displaced` for a moment
+/// in which nothing has its own; a crash then is undone by the next replacement. Failures throw.
 class AtomicReplacement {
  public:
   /// Takes the place of the item at `path`, or of what it links to in the end; it need not exist. Only files
-  /// and directories are replaced (EINVAL).
+  /// and directories are replaced (EINVAL), and no mount points (EBUSY).
   explicit AtomicReplacement(std::string path);
   /// Removes what was built but not committed.
   ~AtomicReplacement();
@@ -24,9 +27,9 @@ class AtomicReplacement {
 
   const std::string& path() const { return path_; }
   /// What the path named at the start.
-  const std::optional<struct stat>& replaced() const { return replaced_; }
-  bool replacesFile() const { return replaced_ && S_ISREG(replaced_->st_mode); }
-  bool replacesDirectory() const { return replaced_ && S_ISDIR(replaced_->st_mode); }
+  const std::optional<struct stat>& replaced() const { return place_.item; }
+  bool replacesFile() const { return place_.item && S_ISREG(place_.item->st_mode); }
+  bool replacesDirectory() const { return place_.item && S_ISDIR(place_.item->st_mode); }
   /// The replaced item, opened for reading.
   Descriptor openReplaced() const;
 
@@ -35,7 +38,8 @@ class AtomicReplacement {
   int makeFile();
   /// Starts a directory.
   std::shared_ptr<DiskDirectory> makeDirectory(mode_t mode);
-  /// Flushes what was started, puts it in place, flushes the directory, and removes the old item.
+  /// Flushes what was started, puts it in place, flushes the directory, and removes the old item. Refuses
+  /// (ESTALE) when the path leads elsewhere by now.
   void commit();
 
   /// Where the old item lies after a replacement in two steps that was cut off between them; nothing when
@@ -43,19 +47,29 @@ class AtomicReplacement {
   static std::optional<std::string> displacedPath(const std::string& path);
 
  private:
-  void findDestination();
+  /// A directory, a name in it, and the file or directory that bears it.
+  struct Place {
+    Descriptor parent;
+    std::string name;
+    std::optional<struct stat> item;
+  };
+  /// What a path means, the links at its end followed.
+  static Place placeOf(const std::string& path);
   void undoHalfReplacement();
+  bool isStage(std::string_view name) const;
+  /// Renames within the directory, never over another item.
+  int moveToFreeName(const std::string& from, const std::string& to);
   void clearLeftovers();
   template <class Make>
   void start(Make make);
+  void requireSamePlace() const;
   void putInPlace();
   void replaceInTwoSteps();
 
   std::string path_;
-  Descriptor parent_;
-  std::string name_;
-  std::string prefix_;  // of the names of what is built for this name
-  std::optional<struct stat> replaced_;
+  Place place_;              // as it was at the start
+  std::string stagePrefix_;  // of the names of what is built for this name
+  std::string displaced_;
   std::string staging_;  // the name of what is being built, or of the old item once it is replaced
   Descriptor built_;
 };

@@ -89,4 +89,10 @@ std::string systemPath(const URL& url) {
 
 void throwPosix(int errorNumber, std::string_view path) { throw ErrorObject::posix(errorNumber, path); }
 
+void throwPosix(int errorNumber, std::string_view path, std::string_view sentence) {
+  throw ErrorObject(std::string(PosixErrorDomain), errorNumber,
+                    {{std::string(LocalizedDescriptionKey), std::string(sentence)},
+                     {std::string(FilePathKey), std::string(path)}});
+}
+
 }  // namespace MarletFoundation

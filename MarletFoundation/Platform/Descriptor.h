@@ -78,5 +78,7 @@ int writeAll(int descriptor, std::string_view bytes);
 std::string systemPath(const URL& url);
 
 [[noreturn]] void throwPosix(int errorNumber, std::string_view path);
+/// With a sentence of ours in place of the system's words, which say too little.
+[[noreturn]] void throwPosix(int errorNumber, std::string_view path, std::string_view sentence);
 
 }  // namespace MarletFoundation

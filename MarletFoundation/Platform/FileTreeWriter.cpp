@@ -237,6 +237,7 @@ void FileWrapper::write(const URL& url) const {
   const bool hasAttributes = node_->diskDirectory() || replacement.replacesDirectory();
   const auto target = replacement.makeDirectory(hasAttributes ? 0700 : 0777);
   TreeWriter(replacement, target).write(node_);
+  if (wasReplaced()) throwPosix(ESTALE, path, "The document was replaced after it had been opened.");
   replacement.commit();
   // The tree that was read goes on in its own copy: the one it was opened in is gone.
   const auto& source = node_->diskDirectory();

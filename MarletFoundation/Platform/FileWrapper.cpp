@@ -41,9 +41,18 @@ std::optional<FileWrapper::Children> FileWrapper::fileWrappers() const {
   if (!children) return std::nullopt;
   Children wrappers;
   for (const auto& [name, child] : *children) {
-    if (child && child->kind() != FileNode::Kind::unreadable) wrappers.emplace(name.view(), FileWrapper(child));
+    if (child && child->kind() != FileNode::Kind::unreadable)
+      wrappers.emplace(name.view(), FileWrapper(child));
   }
   return wrappers;
+}
+
+bool FileWrapper::wasReplaced() const {
+  const auto& directory = node_->diskDirectory();
+  struct stat opened, now;
+  if (!directory || directory->parent() || ::fstat(directory->descriptor(), &opened) != 0) return false;
+  if (opened.st_nlink == 0) return true;
+  return node_->lookAgain(now) == 0 && (now.st_dev != opened.st_dev || now.st_ino != opened.st_ino);
 }
 
 std::optional<std::string> FileWrapper::preferredFilename() const { return node_->preferredName(); }

@@ -52,13 +52,23 @@ class MARLET_EXPORT FileWrapper {
   void addFileWrapper(FileWrapper child);
   void removeFileWrapper(std::string_view name);
 
+  /// Whether something else has taken the place that this wrapper was opened at, or it was removed. The tree
+  /// goes on showing the old item, but for what had not been looked at when that went away, which shows as
+  /// absent. A reader that must not miss anything asks at its end and opens again. False for a node in
+  /// memory.
+  bool wasReplaced() const;
+
   /// Writes the tree to `url`, all of it or nothing: it is built in a sibling of `url`, flushed, and takes
   /// the place of what was there, or of what a symbolic link there points to. Unchanged files are shared with
   /// the directory that is replaced, modes, extended attributes and symbolic links of a tree from disk stay,
   /// and what is new takes the mode and attributes of what it replaces. Throws an `ErrorObject` of the POSIX
   /// domain, also for a child whose name is empty, ".", ".." or holds a slash or NUL (EINVAL), for a
   /// directory within itself (ELOOP, EINVAL), and for a node that couldn't be read or is of no writable kind
-  /// (EINVAL). A wrapper that was opened at `url` goes on in what was written.
+  /// (EINVAL). A tree that `wasReplaced` isn't written (ESTALE), since parts of it may be gone. A wrapper that was
+  /// opened at `url` goes on in what was written.
+  ///
+  /// A directory that is replaced is another one afterwards: watch its parent for changes. Mount points are
+  /// refused (EBUSY), and so is a path whose links change while it is written (ESTALE).
   void write(const URL& url) const;
 
  private:

@@ -1,6 +1,8 @@
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <pthread.h>
 #include <signal.h>
+#include <sys/file.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <sys/xattr.h>
@@ -11,7 +13,6 @@
 #include <fstream>
 #include <functional>
 
-#include "MarletFoundation/Platform/Digest.h"
 #include "MarletFoundation/Platform/ErrorObject.h"
 #include "MarletFoundation/Platform/FileManager.h"
 #include "MarletFoundation/Platform/FileWrapper.h"
@@ -224,15 +225,7 @@ TEST(FileWrapperWriting, SurvivesAWriterThatIsKilled) {
 TEST(FileWrapperWriting, RecoversFromAReplacementInTwoSteps) {
   const TemporaryDirectory directory;
   Tree{{"book/file", "old"s}}.writeTo(directory.path());
-  MD5 digest;
-  digest.update("book");
-  std::string displaced = ".marlet-";
-  for (int i = 0; const auto byte : digest.final()) {
-    char digits[3];
-    std::snprintf(digits, sizeof digits, "%02x", byte);
-    if (i++ < 8) displaced += digits;
-  }
-  fs::rename(directory.path() / "book", directory.path() / (displaced + "-displaced"));
+  fs::rename(directory.path() / "book", directory.path() / ".book.displaced");
 
   FileWrapper root(directory.url("book"));
   EXPECT_EQ(root.preferredFilename(), "book");
@@ -241,6 +234,47 @@ TEST(FileWrapperWriting, RecoversFromAReplacementInTwoSteps) {
   root.write(directory.url("book"));
   EXPECT_EQ(text(directory.path() / "book/file") + text(directory.path() / "book/more"), "oldnew");
   EXPECT_EQ(names(directory), (std::vector<std::string>{"book"}));
+}
+
+TEST(FileWrapperWriting, ClearsWhatDeadWritersLeftAndNothingElse) {
+  const TemporaryDirectory directory;
+  const std::string longName(255, 'n');
+  Tree{{"book/file", "old"s},
+       {".book.stage.abcdef/file", "dead"s},
+       {".book.displaced/file", "done with"s},
+       {".book.stage.alive1/file", "being built"s},
+       {".book.stage.longer-than-that/file", "another's"s},
+       {".other.stage.abcdef/file", "another's"s}}
+      .writeTo(directory.path());
+  const int alive = ::open((directory.path() / ".book.stage.alive1").c_str(), O_RDONLY);
+  ASSERT_EQ(::flock(alive, LOCK_EX), 0);
+  FileWrapper(directory.url("book")).write(directory.url("book"));
+  EXPECT_EQ(names(directory), (std::vector<std::string>{".book.stage.alive1", ".book.stage.longer-than-that",
+                                                        ".other.stage.abcdef", "book"}));
+  ::close(alive);
+  const Tree document{{"file", "1"s}};
+  for (int round = 0; round < 2; ++round) document.wrapper().write(directory.url(longName));
+  EXPECT_EQ(names(directory).size(), 5u);
+}
+
+TEST(FileWrapperWriting, ATreeThatWasReplacedSaysSoAndIsNotWritten) {
+  const TemporaryDirectory directory;
+  Tree{{"book/file", "old"s}, {"book/other", "old"s}}.writeTo(directory.path());
+  const FileWrapper reader(directory.url("book")), writer(directory.url("book"));
+  EXPECT_EQ(reader.child("file")->regularFileContents()->view(), "old");
+  EXPECT_FALSE(reader.wasReplaced());
+  auto other = FileWrapper(directory.url("book"));
+  other.addFileWrapper(file("file", "new"));
+  other.write(directory.url("book"));
+  EXPECT_FALSE(other.wasReplaced());
+  EXPECT_TRUE(reader.wasReplaced());
+  EXPECT_EQ(reader.child("file")->regularFileContents()->view(), "old");
+  EXPECT_FALSE(reader.child("other"));
+  EXPECT_EQ(errorOfWriting(writer, directory.url("book")), ESTALE);
+  EXPECT_EQ(errorOfWriting(reader, directory.url("elsewhere")), ESTALE);
+  EXPECT_EQ(text(directory.path() / "book/file") + text(directory.path() / "book/other"), "newold");
+  EXPECT_EQ(names(directory), (std::vector<std::string>{"book"}));
+  EXPECT_EQ(errorOfWriting(other, URL::file("/proc")), EBUSY);
 }
 
 }  // namespace

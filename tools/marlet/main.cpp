@@ -2,8 +2,12 @@
 #include <iostream>
 #include <map>
 
+#include "ApplyCommand.h"
+#include "BookDiffCommand.h"
 #include "Check.h"
+#include "EditCommand.h"
 #include "FatalProblem.h"
+#include "LearnerText.h"
 #include "MarletFoundation/MarletFoundation.h"
 #include "PropertyListCommand.h"
 #include "Show.h"
@@ -71,6 +75,51 @@ int run(int argc, char** argv) {
       ->transform(CLI::CheckedTransformer(forms));
   plistCommand->add_option("-o,--output", output, "Where to write; - is standard output");
   plistCommand->callback([&] { status = convertPropertyList(path, form, output, terminal); });
+
+  std::string updated;
+  BookDiffOptions diffOptions;
+  auto* diffCommand = app.add_subcommand("diff", "Make the update pack that leads from one book to the next");
+  diffCommand->add_option("OLD", path, "The book as it is")->required();
+  diffCommand->add_option("NEW", updated, "Its next patch release")->required();
+  diffCommand->add_option("-o,--output", diffOptions.output, "The .diffpack to write");
+  diffCommand->add_flag("-p,--patch", diffOptions.withHunks, "Print the hunks, too");
+  diffCommand->add_flag("--exit-code", diffOptions.exitCode, "Exit 1 where there is a difference");
+  diffCommand->add_flag("--json", diffOptions.asJSON, "Print as JSON");
+  diffCommand->callback([&] { status = diffBooks(path, updated, diffOptions, terminal); });
+
+  std::string pack;
+  ApplyOptions applyOptions;
+  auto* applyCommand = app.add_subcommand("apply", "Bring an update into a book under its learner's edits");
+  applyCommand->add_option("BOOK", path, "The book")->required();
+  applyCommand->add_option("PACK", pack, "The update, a .diffpack directory")->required();
+  applyCommand->add_flag("--dry-run", applyOptions.isDryRun, "Only say what would be done");
+  applyCommand->add_option("--backup", applyOptions.backup, "A directory to copy the book to first");
+  applyCommand->add_flag("--force", applyOptions.force, "Apply a pack that isn't meant for this book");
+  applyCommand->add_flag("--json", applyOptions.asJSON, "Report as JSON");
+  applyCommand->callback([&] { status = apply(path, pack, applyOptions, terminal); });
+
+  std::vector<std::string> settings, reverted;
+  auto* editCommand = app.add_subcommand("edit", "Save files as the learner's edits");
+  editCommand->add_option("BOOK", path, "The book")->required();
+  editCommand->add_option("--set", settings, "A path below Contents and the file that holds its edited text")
+      ->type_name("PATH=FILE")
+      ->allow_extra_args(false);
+  editCommand->add_option("--revert", reverted, "A path below Contents to take back to its authored text")
+      ->type_name("PATH")
+      ->allow_extra_args(false);
+  editCommand->add_flag("--json", asJSON, "Report as JSON");
+  editCommand->callback([&] { status = edit(path, settings, reverted, asJSON, terminal); });
+
+  std::string file;
+  auto* textCommand = app.add_subcommand("text", "Print a file as the learner sees it");
+  textCommand->add_option("BOOK", path, "The book")->required();
+  textCommand->add_option("PATH", file, "The file, below Contents")->required();
+  textCommand->callback([&] { status = printLearnerText(path, file, terminal); });
+
+  auto* editsCommand = app.add_subcommand("edits", "List the learner's edits");
+  editsCommand->add_option("BOOK", path, "The book")->required();
+  editsCommand->add_flag("--json", asJSON, "List as JSON");
+  editsCommand->callback([&] { status = listEdits(path, asJSON, terminal); });
 
   app.parse_complete_callback([&] { setUpLibrary(terminal); });
   try {

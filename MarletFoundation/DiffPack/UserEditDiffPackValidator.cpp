@@ -1,0 +1,61 @@
+#include "MarletFoundation/DiffPack/UserEditDiffPackValidator.h"
+
+#include <algorithm>
+
+#include "MarletFoundation/Platform/FatalError.h"
+#include "MarletFoundation/SourceAnnotations/EditableRanges.h"
+
+namespace MarletFoundation {
+namespace {
+
+using MarletDiff::DiffDescriptor;
+using MarletDiff::FileDiffDescriptor;
+
+/// Answers for any number of hunks which of them lie within one of the ranges, whatever order these have.
+class RangesByStart {
+ public:
+  explicit RangesByStart(std::vector<TextRange> ranges) : ranges_(std::move(ranges)) {
+    std::sort(ranges_.begin(), ranges_.end(),
+              [](const TextRange& a, const TextRange& b) { return a.location < b.location; });
+    std::int64_t end = 0;
+    for (const auto& range : ranges_) farthestEnds_.push_back(end = std::max(end, range.end()));
+  }
+
+  bool holdWhole(const TextRange& hunk) const {
+    // Of the ranges that start early enough, the one that reaches farthest decides.
+    const auto after =
+        std::upper_bound(ranges_.begin(), ranges_.end(), hunk.location,
+                         [](std::int64_t at, const TextRange& range) { return at < range.location; });
+    return after != ranges_.begin() &&
+           farthestEnds_[static_cast<std::size_t>(after - ranges_.begin()) - 1] >= hunk.end();
+  }
+
+ private:
+  std::vector<TextRange> ranges_;
+  std::vector<std::int64_t> farthestEnds_;
+};
+
+}  // namespace
+
+UserEditDiffPackValidator::UserEditDiffPackValidator(DiffPackSnapshot pack) : userEditPack(std::move(pack)) {
+  if (userEditPack.diffPackType != DiffPackType::UserEditPack ||
+      userEditPack.baseVersion != userEditPack.updateVersion ||
+      userEditPack.documentType != DiffPackDocumentType::MarletBook) {
+    throw diffError(DiffErrorCode::CriticalDiffPackValidationError, "Invalid user-edit DiffPack");
+  }
+}
+
+std::optional<FileDiffDescriptor> UserEditDiffPackValidator::validatedUpdate(
+    const FileDiffDescriptor& descriptor, std::optional<std::u16string_view> content) const {
+  const auto* modified = std::get_if<FileDiffDescriptor::Modified>(&descriptor.change);
+  if (!modified) return descriptor;
+  if (!content) fatalError("A modified file is validated against its original text.");
+  const RangesByStart editable(editableRanges(*content));
+  std::vector<DiffDescriptor> survivors;
+  std::copy_if(modified->diff.begin(), modified->diff.end(), std::back_inserter(survivors),
+               [&](const DiffDescriptor& hunk) { return editable.holdWhole(hunk.originalRange); });
+  if (survivors.empty()) return std::nullopt;
+  return FileDiffDescriptor{FileDiffDescriptor::Modified{modified->path, std::move(survivors)}};
+}
+
+}  // namespace MarletFoundation

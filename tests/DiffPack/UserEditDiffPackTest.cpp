@@ -1,0 +1,158 @@
+#include "MarletFoundation/DiffPack/UserEditDiffPack.h"
+
+#include <gtest/gtest.h>
+
+#include "DiffPack/Packs.h"
+#include "MarletDiff/ContentDiff.h"
+#include "MarletFoundation/DiffPack/MergedUserEdit.h"
+#include "MarletFoundation/DiffPack/UserEditDiffPackValidator.h"
+#include "MarletFoundation/Marlet/MarletBookSnapshot.h"
+#include "support/Documents.h"
+#include "support/Fatal.h"
+
+namespace MarletFoundation::test {
+namespace {
+
+using namespace std::string_literals;
+using MarletDiff::DiffDescriptor;
+
+const std::string field = "//#-editable-code\nfirst\nsecond\n//#-end-editable-code\n";
+const std::string source = "let fixed = 1\n" + field + "fixed()\n";
+
+DiffPackSnapshot packOf(const URL& contentUrl, std::vector<FileDiff> updates = {}) {
+  return {DiffPackType::UserEditPack, DiffPackDocumentType::MarletBook, contentUrl, "id", "1.0", "1.0",
+          std::move(updates)};
+}
+
+std::string replacing(std::string text, const std::string& what, const std::string& with) {
+  return text.replace(text.find(what), what.size(), with);
+}
+
+TEST(UserEditDiffPack, IsEmptyAndOfTheBooksVersionAtFirst) {
+  const TemporaryDirectory directory;
+  goodBook().writeTo(directory.path());
+  const MarletBookSnapshot book(FileWrapper(directory.url()), directory.url());
+  const auto pack = makeUserEditDiffPack(book, directory.url("Contents"));
+  EXPECT_EQ(pack.description(), "MarletBook UserEdit, org.example.loops 1.2");
+  EXPECT_EQ(pack.contentUrl, directory.url("Contents"));
+  EXPECT_TRUE(pack.updates.empty());
+}
+
+TEST(UserEditDiffPack, OnlyAValidPackIsUpdated) {
+  const auto url = URL::file("/nowhere");
+  const DiffPackSnapshot update(DiffPackType::UpdatePack, DiffPackDocumentType::MarletBook, url, "id", "1",
+                                "1", {});
+  const DiffPackSnapshot moving(DiffPackType::UserEditPack, DiffPackDocumentType::MarletBook, url, "id", "1",
+                                "1.0", {});
+  for (const auto& pack : {update, moving}) {
+    try {
+      updatedUserEditDiffPack(pack, {});
+      ADD_FAILURE() << pack.description();
+    } catch (const ErrorObject& error) {
+      EXPECT_EQ(error.domain(), "Diff");
+      EXPECT_EQ(error.code(), 5);
+      EXPECT_EQ(error.localizedDescription(), "Invalid user-edit DiffPack");
+    }
+  }
+  EXPECT_NO_THROW(UserEditDiffPackValidator(packOf(url)).validate());
+}
+
+/// What becomes of a hunk over one range, given the text.
+bool survives(std::u16string_view content, TextRange range) {
+  const UserEditDiffPackValidator validator(packOf(URL::file("/nowhere")));
+  const auto kept = validator.validatedUpdate({FileDiff::Modified{"p", {{range, {}, u"", u""}}}}, content);
+  return kept.has_value();
+}
+
+TEST(UserEditDiffPack, AHunkStaysWhenItLiesWhollyInOneEditableRange) {
+  const std::u16string text(source.begin(), source.end());
+  const auto start = static_cast<std::int64_t>(text.find(u"first"));
+  const auto end = static_cast<std::int64_t>(text.find(u"//#-end"));
+  const std::vector<std::pair<TextRange, bool>> cases = {{{start, 0}, true},
+                                                         {{end, 0}, true},
+                                                         {{start - 1, 0}, false},
+                                                         {{end + 1, 0}, false},
+                                                         {{start, end - start}, true},
+                                                         {{start - 1, 2}, false},
+                                                         {{end - 1, 1}, true},
+                                                         {{end - 1, 2}, false},
+                                                         {{0, 3}, false}};
+  for (const auto& [range, stays] : cases) {
+    EXPECT_EQ(survives(text, range), stays) << range.location << " " << range.length;
+  }
+  EXPECT_TRUE(survives(u"no tags", {0, 7}));
+  EXPECT_FALSE(survives(u"no tags", {0, 8}));
+
+  const UserEditDiffPackValidator validator(packOf(URL::file("/nowhere")));
+  const std::vector<DiffDescriptor> hunks{
+      {{end, 0}, {}, u"", u"b"}, {{0, 1}, {}, u"l", u"m"}, {{start, 0}, {}, u"", u"a"}};
+  EXPECT_EQ(validator.validatedUpdate({FileDiff::Modified{"p", hunks}}, text),
+            (FileDiff{FileDiff::Modified{"p", {hunks[0], hunks[2]}}}));
+  for (const auto& entry : {FileDiff{FileDiff::Added{"p"}}, FileDiff{FileDiff::Removed{"p"}},
+                            FileDiff{FileDiff::Replaced{"p", Data("x"s)}}}) {
+    EXPECT_EQ(validator.validatedUpdate(entry), entry);
+  }
+  EXPECT_NE(fatalMessage([&] { validator.validatedUpdate({FileDiff::Modified{"p"}}); }), "");
+}
+
+class UpdatingUserEdits : public testing::Test {
+ protected:
+  UpdatingUserEdits() {
+    Tree{{"page", source}, {"bare", "one\ntwo"s}, {"binary", "\xff"s}, {"crlf", "a\r\n"s}}.writeTo(
+        directory_.path());
+  }
+
+  std::vector<FileDiff> updated(const UserEdits& edits, std::vector<FileDiff> before = {}) const {
+    return entries(updatedUserEditDiffPack(packOf(directory_.url(), std::move(before)), edits));
+  }
+  /// The file as the learner sees it after an edit.
+  std::string seen(const std::string& path, const std::string& edited) const {
+    const auto pack = updatedUserEditDiffPack(packOf(directory_.url()), {{path, Data(edited)}});
+    return std::string(mergedUserEdit(pack, path)->view());
+  }
+
+  const TemporaryDirectory directory_;
+};
+
+TEST_F(UpdatingUserEdits, KeepsWhatIsEditableOfATextAndDropsTheRest) {
+  const auto edited = replacing(source, "second", "2nd");
+  EXPECT_EQ(seen("page", edited), edited);
+  EXPECT_EQ(seen("page", replacing(edited, "fixed()", "broken()")), edited);
+  EXPECT_TRUE(updated({{"page", Data(replacing(source, "fixed()", "broken()"))}}).empty());
+  EXPECT_EQ(seen("bare", "three\ntwo"), "three\ntwo");
+  // A learner's slashes ahead of the end tag are the learner's.
+  const auto slashes = replacing(source, "second\n", "second\n//\n//\n////\n");
+  EXPECT_EQ(seen("page", slashes), slashes);
+}
+
+TEST_F(UpdatingUserEdits, ALineFeedThatTheEditorAddsIsNoEdit) {
+  EXPECT_TRUE(updated({{"bare", Data("one\ntwo\n"s)}}).empty());
+  EXPECT_EQ(seen("bare", "one\ntwo\n\n"), "one\ntwo\n");
+  EXPECT_EQ(seen("bare", "one\ntwo\r\n"), "one\ntwo\r\n");
+  EXPECT_EQ(seen("crlf", "a\r\n\n"), "a\r\n");
+  const std::string shorter = "a";
+  EXPECT_EQ(seen("crlf", shorter), shorter);
+}
+
+TEST_F(UpdatingUserEdits, CarriesWholeWhatIsNoText) {
+  const Data text("text"s), bytes("\xfe"s);
+  EXPECT_EQ(updated({{"page", bytes}, {"binary", text}, {"new", text}, {"../out", text}}),
+            (std::vector<FileDiff>{{FileDiff::Added{"../out", text}},
+                                   {FileDiff::Replaced{"binary", text}},
+                                   {FileDiff::Added{"new", text}},
+                                   {FileDiff::Replaced{"page", bytes}}}));
+}
+
+TEST_F(UpdatingUserEdits, TakesThePlaceOfTheFirstEntryOfThatPath) {
+  const Data text("text"s);
+  const FileDiff first{FileDiff::Removed{"new"}}, other{FileDiff::Removed{"other"}},
+      second{FileDiff::Added{"new", Data("old"s)}}, added{FileDiff::Added{"new", text}};
+  EXPECT_EQ(updated({{"new", text}}, {first, other, second}), (std::vector{added, other, second}));
+  EXPECT_EQ(updated({{"new", std::nullopt}}, {first, other, second}), (std::vector{other, second}));
+  EXPECT_EQ(updated({{"none", std::nullopt}}, {first, other}), (std::vector{first, other}));
+  EXPECT_EQ(updated({{"page", Data(source)}}, {{FileDiff::Replaced{"page", text}}, other}),
+            (std::vector{other}));
+}
+
+}  // namespace
+}  // namespace MarletFoundation::test

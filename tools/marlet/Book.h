@@ -1,0 +1,42 @@
+#pragma once
+
+#include <optional>
+#include <string>
+
+#include "Document.h"
+#include "Guarded.h"
+#include "MarletFoundation/MarletFoundation.h"
+
+/// A book as a command opens it, with what the learner changed in it.
+struct Book {
+  const Document& document;
+  std::optional<MarletFoundation::DiffPackSnapshot> userEdits;
+  MarletFoundation::MarletBookSnapshot snapshot;
+
+  /// Throws the error of a book that doesn't load.
+  explicit Book(const Document& document);
+
+  MarletFoundation::URL contentsUrl() const;
+  /// The learner's pack; an empty one where the book has none.
+  MarletFoundation::DiffPackSnapshot userEditPack() const;
+};
+
+/// Throws `CommandFailure` for a path that can't be read or is no book.
+Document openBookDocument(const std::string& path);
+
+/// What `use` makes of the book at the path. A book that another process replaces meanwhile is opened again,
+/// so that the answer is about the old one or the new one and no mixture; `use` may thus run more than once.
+template <class Use>
+auto withBook(const std::string& path, Use use) {
+  constexpr int mostAttempts = 1000;
+  for (int attempt = 1;; ++attempt) {
+    const auto document = openBookDocument(path);
+    try {
+      const Book book(document);
+      auto result = use(book);
+      if (!document.wrapper.wasReplaced() || attempt == mostAttempts) return result;
+    } catch (...) {
+      if (!document.wrapper.wasReplaced() || attempt == mostAttempts) throw;
+    }
+  }
+}

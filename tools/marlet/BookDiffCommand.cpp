@@ -1,0 +1,101 @@
+#include "BookDiffCommand.h"
+
+#include <iostream>
+#include <set>
+
+#include "Guarded.h"
+#include "Hunks.h"
+#include "JSON.h"
+#include "MarletFoundation/MarletFoundation.h"
+
+using namespace MarletFoundation;
+using nlohmann::ordered_json;
+
+namespace {
+
+using MarletDiff::FileDiffDescriptor;
+
+/// The file that an entry puts into a pack's directory, or nothing.
+std::optional<std::string> fileInPack(const FileDiffDescriptor& entry) {
+  if (std::holds_alternative<FileDiffDescriptor::Removed>(entry.change)) return std::nullopt;
+  const bool isModified = std::holds_alternative<FileDiffDescriptor::Modified>(entry.change);
+  return entry.filePath() + (isModified ? ".delta" : "");
+}
+
+/// A pack in which one file would take another's place, or lie below it, can't be written.
+void requireNoCollision(const DiffPackSnapshot& pack) {
+  const auto collision = [](const std::string& path) {
+    return CommandFailure{
+        ExitStatus::negative,
+        path + ": this file would take the place of another one in the pack." +
+            (path == "Manifest.plist" ? " Write the book's manifest as XML first, with marlet plist --to xml."
+                                      : " Give it another name.")};
+  };
+  std::set<std::string> files{"Manifest.plist"};
+  for (const auto& entry : pack.updates) {
+    const auto path = fileInPack(entry);
+    if (path && !files.insert(*path).second) throw collision(*path);
+  }
+  for (const auto& path : files) {
+    for (auto slash = path.find('/'); slash != std::string::npos; slash = path.find('/', slash + 1)) {
+      if (files.contains(path.substr(0, slash))) throw collision(path.substr(0, slash));
+    }
+  }
+}
+
+void writePack(const DiffPackSnapshot& pack, const std::string& output) {
+  const auto url = URL::file(output, true).standardized();
+  if (url.pathExtension() != "diffpack") {
+    throw CommandFailure{ExitStatus::wrongUsage, output + ": a pack's name ends in .diffpack."};
+  }
+  requireNoCollision(pack);
+  orFailWith(ExitStatus::failedWrite, output, [&] { pack.fileWrapper().write(url); });
+}
+
+ordered_json json(const DiffPackSnapshot& pack) {
+  auto files = ordered_json::array();
+  for (const auto& entry : pack.updates) {
+    files.push_back(
+        {{"file", entry.filePath()}, {"kind", kindName(entry)}, {"hunks", hunksJSON(hunksOf(entry))}});
+  }
+  return {{"name", pack.name},
+          {"baseVersion", pack.baseVersion},
+          {"updateVersion", pack.updateVersion},
+          {"files", std::move(files)}};
+}
+
+void print(const DiffPackSnapshot& pack, bool withHunks, const Terminal& terminal) {
+  std::cout << terminal.styled(Terminal::Style::bold, printable(pack.description())) << "\n";
+  for (const auto& entry : pack.updates) {
+    const auto hunks = hunksOf(entry);
+    const bool isModified = std::holds_alternative<FileDiffDescriptor::Modified>(entry.change);
+    std::cout << kindName(entry) << " " << printable(entry.filePath())
+              << (isModified ? ", " + counted(hunks.size(), "hunk") : "") << "\n";
+    if (!withHunks) continue;
+    for (const auto& hunk : hunks) printHunk(hunk, terminal);
+  }
+}
+
+}  // namespace
+
+ExitStatus diffBooks(const std::string& original, const std::string& updated, const BookDiffOptions& options,
+                     const Terminal& terminal) {
+  return guarded(updated, terminal, [&] {
+    const auto urlOf = [](const std::string& path) {
+      return orFailWith(ExitStatus::unreadablePath, path, [&] {
+        auto url = URL::file(path, true).standardized();
+        FileManager::resourceIsReachable(url);
+        return url;
+      });
+    };
+    const auto originalUrl = urlOf(original);
+    const auto pack = makeUpdateDiffPack(originalUrl, urlOf(updated));
+    if (options.output) writePack(pack, *options.output);
+    if (options.asJSON) {
+      std::cout << dumped(json(pack)) << "\n";
+    } else if (!options.output || options.withHunks) {
+      print(pack, options.withHunks, terminal);
+    }
+    return options.exitCode && !pack.updates.empty() ? ExitStatus::negative : ExitStatus::good;
+  });
+}

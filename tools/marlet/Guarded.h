@@ -1,0 +1,32 @@
+#pragma once
+
+#include <functional>
+#include <string>
+
+#include "ExitStatus.h"
+#include "MarletFoundation/Platform/Error.h"
+#include "Terminal.h"
+
+/// What ends a command: a sentence and a status.
+struct CommandFailure {
+  ExitStatus status;
+  std::string sentence;
+};
+
+/// An error's words for the user, with its suggestion.
+std::string inWords(const MarletFoundation::Error& error);
+
+/// Runs a command's work, and complains about what it throws; a library error or a fatal condition of the
+/// document at `path` ends in `ExitStatus::negative`.
+ExitStatus guarded(const std::string& path, const Terminal& terminal,
+                   const std::function<ExitStatus()>& work);
+
+/// Runs work whose library errors end the command with `status`.
+template <class Work>
+auto orFailWith(ExitStatus status, const std::string& path, Work work) {
+  try {
+    return work();
+  } catch (const MarletFoundation::Error& error) {
+    throw CommandFailure{status, path + ": " + inWords(error)};
+  }
+}

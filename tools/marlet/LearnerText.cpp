@@ -1,0 +1,39 @@
+#include "LearnerText.h"
+
+#include <iostream>
+
+#include "Book.h"
+#include "Hunks.h"
+#include "JSON.h"
+
+using namespace MarletFoundation;
+using nlohmann::ordered_json;
+
+ExitStatus printLearnerText(const std::string& path, const std::string& file, const Terminal& terminal) {
+  return guarded(path, terminal, [&] {
+    const auto text =
+        withBook(path, [&](const Book& book) { return mergedUserEdit(book.userEditPack(), file); });
+    if (!text) throw CommandFailure{ExitStatus::negative, file + ": the learner sees no such file."};
+    std::cout << text->view();
+    return ExitStatus::good;
+  });
+}
+
+ExitStatus listEdits(const std::string& path, bool asJSON, const Terminal& terminal) {
+  return guarded(path, terminal, [&] {
+    const auto pack = withBook(path, [](const Book& book) { return book.userEditPack(); });
+    auto list = ordered_json::array();
+    for (const auto& entry : pack.updates) {
+      const auto count = hunksOf(entry).size();
+      const bool isModified = std::holds_alternative<MarletDiff::FileDiffDescriptor::Modified>(entry.change);
+      if (asJSON) {
+        list.push_back({{"file", entry.filePath()}, {"kind", kindName(entry)}, {"hunks", count}});
+      } else {
+        std::cout << kindName(entry) << " " << printable(entry.filePath())
+                  << (isModified ? ", " + counted(count, "hunk") : "") << "\n";
+      }
+    }
+    if (asJSON) std::cout << dumped(list) << "\n";
+    return ExitStatus::good;
+  });
+}
