@@ -13,8 +13,8 @@ namespace {
 
 /// Work that is allowed for any text, and for each unit of it. The first is as much as it takes to compare
 /// two pages of a thousand lines that have every line in common and none in its place.
-constexpr std::int64_t leastBudget = std::int64_t{1} << 22;
-constexpr std::int64_t budgetPerUnit = 8;
+constexpr std::int64_t leastBudget = std::int64_t{1} << 21;
+constexpr std::int64_t budgetPerUnit = 3;
 
 /// Offsets count in 32 bits, with room for differences.
 constexpr std::size_t longestText = std::size_t{1} << 30;
