@@ -13,8 +13,8 @@ namespace {
 
 /// Work that is allowed for any text, and for each unit of it. The first is as much as it takes to compare
 /// two pages of a thousand lines that have every line in common and none in its place.
-constexpr std::int64_t leastBudget = std::int64_t{1} << 22;
-constexpr std::int64_t budgetPerUnit = 8;
+constexpr std::int64_t leastBudget = std::int64_t{1} << 21;
+constexpr std::int64_t budgetPerUnit = 3;
 
 /// Offsets count in 32 bits, with room for differences.
 constexpr std::size_t longestText = std::size_t{1} << 30;
@@ -84,9 +84,14 @@ class ContentDiff {
   struct Side {
     TokenStarts starts;
     std::vector<std::uint32_t> numbers;
+
+    std::u16string_view token(std::u16string_view text, std::size_t index) const {
+      return text.substr(starts[index], starts[index + 1] - starts[index]);
+    }
   };
   void cut(Text& text, std::uint32_t start, std::uint32_t end, Level level, Side& side) const;
-  void number(const Text& text, Side& side);
+  void numberOriginal(Side& side);
+  void numberModified(Side& side, const Side& original);
 
   /// Kept from part to part, for each level that is under way.
   struct Workspace {
@@ -100,6 +105,8 @@ class ContentDiff {
   bool smallerHunks_;
   std::int64_t budget_;
   TokenNumbers numbers_;
+  /// Where in the original each number comes first.
+  std::vector<std::uint32_t> firstPlaces_;
   std::array<Workspace, 3> workspaces_;
   std::vector<Change> changes_;
 };
@@ -126,11 +133,28 @@ void ContentDiff::cut(Text& text, std::uint32_t start, std::uint32_t end, Level 
   }
 }
 
-void ContentDiff::number(const Text& text, Side& side) {
+void ContentDiff::numberOriginal(Side& side) {
   side.numbers.clear();
-  for (std::size_t i = 0; i + 1 < side.starts.size(); ++i) {
-    const auto start = side.starts[i];
-    side.numbers.push_back(numbers_.number(text.view.substr(start, side.starts[i + 1] - start)));
+  firstPlaces_.clear();
+  for (std::uint32_t i = 0; i + 1 < side.starts.size(); ++i) {
+    side.numbers.push_back(numbers_.number(side.token(original_.view, i)));
+    if (side.numbers.back() == firstPlaces_.size()) firstPlaces_.push_back(i);
+  }
+}
+
+/// Most tokens stand behind the same ones as in the original, so that place is tried before all others.
+void ContentDiff::numberModified(Side& side, const Side& original) {
+  side.numbers.clear();
+  std::size_t expected = 0;
+  for (std::uint32_t i = 0; i + 1 < side.starts.size(); ++i) {
+    const auto token = side.token(modified_.view, i);
+    if (expected < original.numbers.size() && original.token(original_.view, expected) == token) {
+      side.numbers.push_back(original.numbers[expected++]);
+      continue;
+    }
+    const auto number = numbers_.number(token);
+    side.numbers.push_back(number);
+    expected = (number < firstPlaces_.size() ? firstPlaces_[number] : expected) + 1;
   }
 }
 
@@ -140,8 +164,8 @@ void ContentDiff::compare(const Change& part, Level level) {
   cut(original_, part.original, part.originalEnd, level, original);
   cut(modified_, part.modified, part.modifiedEnd, level, modified);
   numbers_.reset(original.starts.size() + modified.starts.size());
-  number(original_, original);
-  number(modified_, modified);
+  numberOriginal(original);
+  numberModified(modified, original);
   const auto& changes = comparison.changes(original.numbers, modified.numbers, numbers_.size(), budget_);
   for (const auto& change : changes) {
     add({original.starts[change.original], original.starts[change.originalEnd],

@@ -10,9 +10,13 @@
 
 namespace MarletDiff {
 
-/// The hunks that lead from `original` to `modified`, in ascending order and disjoint; none when the texts
-/// are equal. The same texts give the same hunks everywhere. Time and memory are linear in the texts' lengths
-/// plus a constant: where the texts differ too much, the last hunk takes in all that is left.
+/// The hunks that lead from `original` to `modified`, ascending, with equal text between any two of them; none
+/// when the texts are equal. No range divides a character (extended grapheme cluster). Hunks are whole lines;
+/// with `SmallerHunks` they are refined by words and by characters, and no hunk's two contents start or end
+/// with the same character. The same texts give the same hunks everywhere.
+///
+/// Time and memory are linear in the texts' lengths plus a constant: where the texts differ too much, one hunk
+/// takes in what is left. Texts of more than 2^30 units differ as a whole.
 MARLET_EXPORT std::vector<DiffDescriptor> diffContent(std::u16string_view original,
                                                       std::u16string_view modified,
                                                       std::optional<DiffOptions> options = std::nullopt);

@@ -7,7 +7,7 @@ namespace MarletDiff {
 /// A set of flags that say how to diff.
 class DiffOptions {
  public:
-  /// Asks for finer hunks: words within the lines that differ, instead of whole lines.
+  /// Asks for finer hunks: words, and characters within them, instead of whole lines.
   static const DiffOptions SmallerHunks;
 
   /// The empty set.

@@ -3,7 +3,6 @@
 #include <map>
 
 #include "ApplyCommand.h"
-#include "BookDiffCommand.h"
 #include "Check.h"
 #include "EditCommand.h"
 #include "FatalProblem.h"
@@ -14,6 +13,7 @@
 #include "PropertyListCommand.h"
 #include "Show.h"
 #include "TagsCommand.h"
+#include "TextCommand.h"
 
 using namespace MarletFoundation;
 
@@ -131,14 +131,24 @@ int run(int argc, char** argv) {
 
   std::string updated;
   BookDiffOptions diffOptions;
-  auto* diffCommand = app.add_subcommand("diff", "Make the update pack that leads from one book to the next");
-  diffCommand->add_option("OLD", path, "The book as it is")->required();
-  diffCommand->add_option("NEW", updated, "Its next patch release")->required();
+  auto* diffCommand = app.add_subcommand(
+      "diff", "Show how two text files differ, or make the update pack from one book to the next");
+  diffCommand->add_option("OLD", path, "The book or text file as it is")->required();
+  diffCommand->add_option("NEW", updated, "Its next patch release, or the changed text")->required();
   diffCommand->add_option("-o,--output", diffOptions.output, "The .diffpack to write");
   diffCommand->add_flag("-p,--patch", diffOptions.withHunks, "Print the hunks, too");
   diffCommand->add_flag("--exit-code", diffOptions.exitCode, "Exit 1 where there is a difference");
   diffCommand->add_flag("--json", diffOptions.asJSON, "Print as JSON");
-  diffCommand->callback([&] { status = diffBooks(path, updated, diffOptions, terminal); });
+  diffCommand->callback([&] { status = diff(path, updated, diffOptions, terminal); });
+
+  std::string ours, theirs;
+  std::optional<std::string> mergedOutput;
+  auto* mergeCommand = app.add_subcommand("merge", "Merge the changes of two text files against a third");
+  mergeCommand->add_option("BASE", path, "The text that both were made from")->required();
+  mergeCommand->add_option("OURS", ours, "The one text")->required();
+  mergeCommand->add_option("THEIRS", theirs, "The other")->required();
+  mergeCommand->add_option("-o,--output", mergedOutput, "Where to write the merged text");
+  mergeCommand->callback([&] { status = merge(path, ours, theirs, mergedOutput, terminal); });
 
   std::string pack;
   ApplyOptions applyOptions;
