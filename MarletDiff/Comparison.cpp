@@ -1,144 +1,102 @@
 #include "MarletDiff/Comparison.h"
 
 #include <algorithm>
+#include <limits>
 
 namespace MarletDiff {
 namespace {
 
-/// A round of the search costs memory for as many points as it has edits, and the rounds before it are kept
-/// to find the way back: 2048 rounds take 16 MB.
-constexpr std::size_t maximumEdits = 2048;
-
-/// Myers' greedy search. A point (x, y) has passed x tokens of one list and y of the other; one edit moves it
-/// by one token of one list, and equal tokens carry it on for free. Round d finds, for every diagonal x - y
-/// from -d to d in steps of 2, the furthest point that d edits reach.
-class Search {
- public:
-  Search(const Tokens& a, const Tokens& b, std::size_t prefix, std::size_t suffix, std::int64_t& budget)
-      : a_(a),
-        b_(b),
-        prefix_(prefix),
-        n_(static_cast<std::int64_t>(a.size() - prefix - suffix)),
-        m_(static_cast<std::int64_t>(b.size() - prefix - suffix)),
-        budget_(budget) {}
-
-  std::vector<TokenChange> run() {
-    reached_.push_back(followEqual(0, 0));
-    std::size_t edits = 0;
-    while (!foundEnd(edits) && edits < maximumEdits && budget_ > 0) {
-      if (!searchRound(edits + 1)) break;
-      ++edits;
-    }
-    return wayBack(edits);
-  }
-
- private:
-  static std::size_t roundStart(std::size_t edits) { return edits * (edits + 1) / 2; }
-  static std::int64_t diagonal(std::size_t edits, std::size_t index) {
-    return 2 * static_cast<std::int64_t>(index) - static_cast<std::int64_t>(edits);
-  }
-  std::int64_t x(std::size_t edits, std::size_t index) const { return reached_[roundStart(edits) + index]; }
-
-  /// Whether the last edit that leads to a point of this round passed a token of `b`, from the neighbour of
-  /// the same index in the round before, and not one of `a`, from the neighbour ahead of that.
-  bool cameDown(std::size_t edits, std::size_t index) const {
-    return index == 0 || (index < edits && x(edits - 1, index - 1) < x(edits - 1, index));
-  }
-  std::int64_t afterEdit(std::size_t edits, std::size_t index) const {
-    return cameDown(edits, index) ? x(edits - 1, index) : x(edits - 1, index - 1) + 1;
-  }
-
-  bool equal(std::int64_t x, std::int64_t y) {
-    const auto first = a_[prefix_ + static_cast<std::size_t>(x)];
-    const auto second = b_[prefix_ + static_cast<std::size_t>(y)];
-    --budget_;
-    if (first.size() != second.size()) return false;
-    budget_ -= static_cast<std::int64_t>(first.size() / 16);
-    return first == second;
-  }
-
-  std::int64_t followEqual(std::int64_t x, std::int64_t diagonal) {
-    while (x < n_ && x - diagonal < m_ && equal(x, x - diagonal)) ++x;
-    return x;
-  }
-
-  /// False when the budget ends first; then the round before is the last.
-  bool searchRound(std::size_t edits) {
-    for (std::size_t index = 0; index <= edits; ++index) {
-      if (--budget_ < 0) return false;
-      reached_.push_back(followEqual(afterEdit(edits, index), diagonal(edits, index)));
-    }
-    return true;
-  }
-
-  bool foundEnd(std::size_t edits) const {
-    const auto index = n_ - m_ + static_cast<std::int64_t>(edits);
-    return index >= 0 && index % 2 == 0 && index / 2 <= static_cast<std::int64_t>(edits) &&
-           x(edits, static_cast<std::size_t>(index / 2)) == n_;
-  }
-
-  /// The point of a round that has passed the most tokens; a search may run beyond either list's end, from
-  /// where no way leads to the end of both.
-  std::size_t furthest(std::size_t edits) const {
-    std::size_t best = 0;
-    std::int64_t bestSum = -1;
-    for (std::size_t index = 0; index <= edits; ++index) {
-      const auto px = x(edits, index), py = px - diagonal(edits, index);
-      if (px <= n_ && py <= m_ && px + py > bestSum) {
-        best = index;
-        bestSum = px + py;
-      }
-    }
-    return best;
-  }
-
-  std::vector<TokenChange> wayBack(std::size_t edits) const {
-    std::vector<TokenChange> changes;
-    const auto add = [&](std::int64_t x, std::int64_t xEnd, std::int64_t y, std::int64_t yEnd) {
-      const auto token = [&](std::int64_t at) { return prefix_ + static_cast<std::size_t>(at); };
-      if (!changes.empty() && changes.back().original == token(xEnd) &&
-          changes.back().modified == token(yEnd)) {
-        changes.back().original = token(x);
-        changes.back().modified = token(y);
-      } else {
-        changes.push_back({token(x), token(xEnd), token(y), token(yEnd)});
-      }
-    };
-    auto index = furthest(edits);
-    const auto lastX = x(edits, index), lastY = lastX - diagonal(edits, index);
-    if (lastX < n_ || lastY < m_) add(lastX, n_, lastY, m_);
-    for (; edits > 0; --edits) {
-      const bool down = cameDown(edits, index);
-      const auto px = afterEdit(edits, index), py = px - diagonal(edits, index);
-      add(down ? px : px - 1, px, down ? py - 1 : py, py);
-      if (!down) --index;
-    }
-    std::reverse(changes.begin(), changes.end());
-    return changes;
-  }
-
-  const Tokens& a_;
-  const Tokens& b_;
-  std::size_t prefix_;
-  std::int64_t n_;
-  std::int64_t m_;
-  std::int64_t& budget_;
-  /// The x of each point, round after round.
-  std::vector<std::int64_t> reached_;
-};
+constexpr auto none = std::numeric_limits<std::uint32_t>::max();
 
 }  // namespace
 
-std::vector<TokenChange> changes(const Tokens& original, const Tokens& modified, std::int64_t& budget) {
-  const auto shorter = std::min(original.size(), modified.size());
-  std::size_t prefix = 0, suffix = 0;
-  while (prefix < shorter && original[prefix] == modified[prefix]) ++prefix;
-  while (suffix < shorter - prefix &&
-         original[original.size() - 1 - suffix] == modified[modified.size() - 1 - suffix]) {
-    ++suffix;
+void Comparison::countOccurrences(std::span<const std::uint32_t> original,
+                                  std::span<const std::uint32_t> modified, std::size_t numbers) {
+  occurrences_.assign(numbers, {});
+  for (const auto number : original) ++occurrences_[number].original;
+  for (const auto number : modified) ++occurrences_[number].modified;
+  original_.clear(), originalPlaces_.clear(), modified_.clear(), modifiedPlaces_.clear();
+  for (std::uint32_t i = 0; i < original.size(); ++i) {
+    if (occurrences_[original[i]].modified == 0) continue;
+    original_.push_back(original[i]);
+    originalPlaces_.push_back(i);
   }
-  if (prefix == original.size() && prefix == modified.size()) return {};
-  return Search(original, modified, prefix, suffix, budget).run();
+  for (std::uint32_t i = 0; i < modified.size(); ++i) {
+    auto& occurrences = occurrences_[modified[i]];
+    if (occurrences.original == 0) continue;
+    occurrences.lastModified = static_cast<std::uint32_t>(modified_.size());
+    modified_.push_back(modified[i]);
+    modifiedPlaces_.push_back(i);
+  }
+}
+
+/// Leaves in `anchors_` the longest row of tokens that are unique in both lists and ascend in both.
+void Comparison::findAnchors() {
+  anchors_.clear();
+  rowEnds_.clear();
+  for (std::uint32_t i = 0; i < original_.size(); ++i) {
+    const auto& occurrences = occurrences_[original_[i]];
+    if (occurrences.original != 1 || occurrences.modified != 1) continue;
+    const auto place = occurrences.lastModified;
+    auto row = rowEnds_.end();
+    if (!rowEnds_.empty() && anchors_[rowEnds_.back()].modified > place) {
+      row =
+          std::lower_bound(rowEnds_.begin(), rowEnds_.end(), place,
+                           [&](std::uint32_t end, std::uint32_t at) { return anchors_[end].modified < at; });
+    }
+    const auto added = static_cast<std::uint32_t>(anchors_.size());
+    anchors_.push_back({i, place, row == rowEnds_.begin() ? none : *(row - 1)});
+    if (row == rowEnds_.end()) {
+      rowEnds_.push_back(added);
+    } else {
+      *row = added;
+    }
+  }
+  // The row from its last anchor back to the first, put in its place.
+  for (auto at = rowEnds_.size(), next = std::size_t{rowEnds_.empty() ? none : rowEnds_.back()}; at > 0;
+       --at) {
+    rowEnds_[at - 1] = static_cast<std::uint32_t>(next);
+    next = anchors_[next].previous;
+  }
+  for (std::size_t i = 0; i < rowEnds_.size(); ++i) anchors_[i] = anchors_[rowEnds_[i]];
+  anchors_.resize(rowEnds_.size());
+}
+
+const std::vector<Change>& Comparison::changes(std::span<const std::uint32_t> original,
+                                               std::span<const std::uint32_t> modified, std::size_t numbers,
+                                               std::int64_t& budget) {
+  countOccurrences(original, modified, numbers);
+  findAnchors();
+
+  runs_.clear();
+  shortestEdit_.start(original_, modified_);
+  std::uint32_t originalDone = 0, modifiedDone = 0;
+  for (const auto& anchor : anchors_) {
+    shortestEdit_.appendRuns({originalDone, anchor.original, modifiedDone, anchor.modified}, runs_, budget);
+    appendRun(runs_, {anchor.original, anchor.modified, 1});
+    originalDone = anchor.original + 1;
+    modifiedDone = anchor.modified + 1;
+  }
+  shortestEdit_.appendRuns({originalDone, static_cast<std::uint32_t>(original_.size()), modifiedDone,
+                            static_cast<std::uint32_t>(modified_.size())},
+                           runs_, budget);
+
+  changes_.clear();
+  Change gap{0, 0, 0, 0};
+  const auto match = [&](std::uint32_t i, std::uint32_t j) {
+    gap.originalEnd = i;
+    gap.modifiedEnd = j;
+    if (gap.original < i || gap.modified < j) changes_.push_back(gap);
+    gap.original = i + 1;
+    gap.modified = j + 1;
+  };
+  for (const auto& run : runs_) {
+    for (std::uint32_t i = 0; i < run.length; ++i) {
+      match(originalPlaces_[run.original + i], modifiedPlaces_[run.modified + i]);
+    }
+  }
+  match(static_cast<std::uint32_t>(original.size()), static_cast<std::uint32_t>(modified.size()));
+  return changes_;
 }
 
 }  // namespace MarletDiff

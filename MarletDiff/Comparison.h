@@ -1,23 +1,59 @@
 #pragma once
 
 #include <cstdint>
+#include <span>
 #include <vector>
 
-#include "MarletDiff/Tokens.h"
+#include "MarletDiff/ShortestEdit.h"
 
 namespace MarletDiff {
 
-/// A stretch of tokens and what it became; either may be empty. Ends are exclusive.
-struct TokenChange {
-  std::size_t original;
-  std::size_t originalEnd;
-  std::size_t modified;
-  std::size_t modifiedEnd;
+/// A stretch of either list and what it became; either may be empty. Ends are exclusive.
+struct Change {
+  std::uint32_t original;
+  std::uint32_t originalEnd;
+  std::uint32_t modified;
+  std::uint32_t modifiedEnd;
 };
 
-/// The changes that lead from one list of tokens to the other, in ascending order with an equal token between
-/// any two of them. Takes the comparisons it makes off `budget`; once that is used up, or the lists are too
-/// far apart, the last change takes in all that is left.
-std::vector<TokenChange> changes(const Tokens& original, const Tokens& modified, std::int64_t& budget);
+/// Compares lists of numbered tokens. An object may be used again; it keeps its memory.
+class Comparison {
+ public:
+  /// The changes that lead from one list to the other, ascending, with an equal token between any two of
+  /// them. All numbers are less than `numbers`. Takes its work off `budget`; where that ends, a change takes
+  /// in all that isn't compared yet.
+  const std::vector<Change>& changes(std::span<const std::uint32_t> original,
+                                     std::span<const std::uint32_t> modified, std::size_t numbers,
+                                     std::int64_t& budget);
+
+ private:
+  /// What is known of the tokens of one number.
+  struct Occurrences {
+    std::uint32_t original = 0;
+    std::uint32_t modified = 0;
+    /// Where it is among the modified tokens that have a partner.
+    std::uint32_t lastModified = 0;
+  };
+  /// Tokens of either list that are matched with each other, by their places among those with a partner.
+  struct Anchor {
+    std::uint32_t original;
+    std::uint32_t modified;
+    /// The anchor that comes before in the longest ascending row that ends here.
+    std::uint32_t previous;
+  };
+
+  void countOccurrences(std::span<const std::uint32_t> original, std::span<const std::uint32_t> modified,
+                        std::size_t numbers);
+  void findAnchors();
+
+  std::vector<Occurrences> occurrences_;
+  /// The tokens with a partner in the other list, and their places in the whole lists.
+  std::vector<std::uint32_t> original_, originalPlaces_, modified_, modifiedPlaces_;
+  std::vector<Anchor> anchors_;
+  std::vector<std::uint32_t> rowEnds_;
+  ShortestEdit shortestEdit_;
+  std::vector<TokenRun> runs_;
+  std::vector<Change> changes_;
+};
 
 }  // namespace MarletDiff

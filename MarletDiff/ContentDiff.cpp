@@ -1,64 +1,218 @@
 #include "MarletDiff/ContentDiff.h"
 
+#include <algorithm>
+#include <array>
+#include <cstring>
+
 #include "MarletDiff/Comparison.h"
+#include "MarletDiff/Sliding.h"
+#include "MarletDiff/Tokens.h"
 
 namespace MarletDiff {
 namespace {
 
-/// A stretch of either text, by offsets.
-struct Change {
-  std::size_t original;
-  std::size_t originalEnd;
-  std::size_t modified;
-  std::size_t modifiedEnd;
-};
+/// Work that is allowed for any text, and for each unit of it. The first is as much as it takes to compare
+/// two pages of a thousand lines that have every line in common and none in its place.
+constexpr std::int64_t leastBudget = std::int64_t{1} << 22;
+constexpr std::int64_t budgetPerUnit = 8;
 
-DiffDescriptor descriptor(std::u16string_view original, std::u16string_view modified, const Change& change) {
-  const auto range = [](std::size_t start, std::size_t end) {
-    return MarletFoundation::TextRange{static_cast<std::int64_t>(start),
-                                       static_cast<std::int64_t>(end - start)};
-  };
-  return {range(change.original, change.originalEnd), range(change.modified, change.modifiedEnd),
-          std::u16string(original.substr(change.original, change.originalEnd - change.original)),
-          std::u16string(modified.substr(change.modified, change.modifiedEnd - change.modified))};
+/// Offsets count in 32 bits, with room for differences.
+constexpr std::size_t longestText = std::size_t{1} << 30;
+
+constexpr std::size_t blockLength = 2048;
+
+std::size_t commonPrefix(std::u16string_view a, std::u16string_view b) {
+  const auto shorter = std::min(a.size(), b.size());
+  std::size_t length = 0;
+  while (length + blockLength <= shorter &&
+         std::memcmp(a.data() + length, b.data() + length, blockLength * sizeof(char16_t)) == 0) {
+    length += blockLength;
+  }
+  while (length < shorter && a[length] == b[length]) ++length;
+  return length;
 }
 
-/// The changes between the parts of two texts that `within` names, token by token.
-std::vector<Change> changesWithin(const Change& within, std::u16string_view original,
-                                  std::u16string_view modified, Tokens (*cut)(std::u16string_view),
-                                  std::int64_t& budget) {
-  const auto a = cut(original.substr(within.original, within.originalEnd - within.original));
-  const auto b = cut(modified.substr(within.modified, within.modifiedEnd - within.modified));
-  std::vector<Change> result;
-  for (const auto& change : changes(a, b, budget)) {
-    result.push_back(
-        {within.original + a.start(change.original), within.original + a.start(change.originalEnd),
-         within.modified + b.start(change.modified), within.modified + b.start(change.modifiedEnd)});
+std::size_t commonSuffix(std::u16string_view a, std::u16string_view b) {
+  const auto shorter = std::min(a.size(), b.size());
+  const auto *aEnd = a.data() + a.size(), *bEnd = b.data() + b.size();
+  std::size_t length = 0;
+  while (length + blockLength <= shorter &&
+         std::memcmp(aEnd - length - blockLength, bEnd - length - blockLength,
+                     blockLength * sizeof(char16_t)) == 0) {
+    length += blockLength;
   }
-  return result;
+  while (length < shorter &&
+         aEnd[-1 - static_cast<std::ptrdiff_t>(length)] == bEnd[-1 - static_cast<std::ptrdiff_t>(length)]) {
+    ++length;
+  }
+  return length;
+}
+
+enum class Level { lines, words, characters };
+
+class ContentDiff {
+ public:
+  ContentDiff(std::u16string_view original, std::u16string_view modified, bool smallerHunks)
+      : original_(original),
+        modified_(modified),
+        smallerHunks_(smallerHunks),
+        budget_(leastBudget + budgetPerUnit * static_cast<std::int64_t>(original.size() + modified.size())) {}
+
+  std::vector<DiffDescriptor> run() {
+    const auto differing = withoutEqualLines();
+    if (isEmpty(differing)) return {};
+    compare(differing, Level::lines);
+    slideChanges(original_, modified_, changes_);
+    joinTouching();
+    std::vector<DiffDescriptor> result;
+    result.reserve(changes_.size());
+    for (const auto& change : changes_) result.push_back(descriptor(change));
+    return result;
+  }
+
+ private:
+  static bool isEmpty(const Change& c) { return c.original == c.originalEnd && c.modified == c.modifiedEnd; }
+
+  Change withoutEqualLines() const;
+  void compare(const Change& part, Level level);
+  void add(const Change& change, Level level);
+  void joinTouching();
+  Change trimmed(Change change);
+  DiffDescriptor descriptor(const Change& change) const;
+
+  /// One side of a part, cut into tokens.
+  struct Side {
+    TokenStarts starts;
+    std::vector<std::uint32_t> numbers;
+  };
+  void cut(Text& text, std::uint32_t start, std::uint32_t end, Level level, Side& side) const;
+  void number(const Text& text, Side& side);
+
+  /// Kept from part to part, for each level that is under way.
+  struct Workspace {
+    Side original;
+    Side modified;
+    Comparison comparison;
+  };
+
+  Text original_;
+  Text modified_;
+  bool smallerHunks_;
+  std::int64_t budget_;
+  TokenNumbers numbers_;
+  std::array<Workspace, 3> workspaces_;
+  std::vector<Change> changes_;
+};
+
+/// The part that is left when the whole lines that both texts start and end with are taken off.
+Change ContentDiff::withoutEqualLines() const {
+  const auto a = original_.view, b = modified_.view;
+  auto prefix = commonPrefix(a, b);
+  while (!isLineStart(a, prefix) || !isLineStart(b, prefix)) --prefix;
+  auto suffix = commonSuffix(a.substr(prefix), b.substr(prefix));
+  while (suffix > 0 && (!isLineStart(a, a.size() - suffix) || !isLineStart(b, b.size() - suffix))) --suffix;
+  const auto offset = [](std::size_t value) { return static_cast<std::uint32_t>(value); };
+  return {offset(prefix), offset(a.size() - suffix), offset(prefix), offset(b.size() - suffix)};
+}
+
+void ContentDiff::cut(Text& text, std::uint32_t start, std::uint32_t end, Level level, Side& side) const {
+  switch (level) {
+    case Level::lines:
+      return cutLines(text.view, start, end, side.starts);
+    case Level::words:
+      return cutWords(text.view, text.characters, start, end, side.starts);
+    case Level::characters:
+      return cutCharacters(text.characters, start, end, side.starts);
+  }
+}
+
+void ContentDiff::number(const Text& text, Side& side) {
+  side.numbers.clear();
+  for (std::size_t i = 0; i + 1 < side.starts.size(); ++i) {
+    const auto start = side.starts[i];
+    side.numbers.push_back(numbers_.number(text.view.substr(start, side.starts[i + 1] - start)));
+  }
+}
+
+/// Adds the changes within a part of the texts, compared token by token.
+void ContentDiff::compare(const Change& part, Level level) {
+  auto& [original, modified, comparison] = workspaces_[static_cast<std::size_t>(level)];
+  cut(original_, part.original, part.originalEnd, level, original);
+  cut(modified_, part.modified, part.modifiedEnd, level, modified);
+  numbers_.reset(original.starts.size() + modified.starts.size());
+  number(original_, original);
+  number(modified_, modified);
+  const auto& changes = comparison.changes(original.numbers, modified.numbers, numbers_.size(), budget_);
+  for (const auto& change : changes) {
+    add({original.starts[change.original], original.starts[change.originalEnd],
+         modified.starts[change.modified], modified.starts[change.modifiedEnd]},
+        level);
+  }
+}
+
+/// Adds a change that was found at a level, or what it comes to at the levels below.
+void ContentDiff::add(const Change& change, Level level) {
+  const bool replaces = change.original < change.originalEnd && change.modified < change.modifiedEnd;
+  if (!smallerHunks_ || !replaces) {
+    changes_.push_back(change);
+  } else if (level == Level::characters || budget_ <= 0) {
+    changes_.push_back(trimmed(change));
+  } else {
+    compare(change, level == Level::lines ? Level::words : Level::characters);
+  }
+}
+
+void ContentDiff::joinTouching() {
+  std::vector<Change> joined;
+  for (const auto& change : changes_) {
+    if (joined.empty() || joined.back().originalEnd < change.original) {
+      joined.push_back(change);
+      continue;
+    }
+    auto& last = joined.back();
+    last.originalEnd = change.originalEnd;
+    last.modifiedEnd = change.modifiedEnd;
+    if (smallerHunks_) last = trimmed(last);
+  }
+  changes_ = std::move(joined);
+}
+
+/// The change without the whole characters that both its texts start and end with.
+Change ContentDiff::trimmed(Change change) {
+  const auto a = original_.view.substr(change.original, change.originalEnd - change.original);
+  const auto b = modified_.view.substr(change.modified, change.modifiedEnd - change.modified);
+  const auto bothStartAt = [&](std::size_t offset, std::size_t otherOffset) {
+    return original_.characters.startAt(offset) && modified_.characters.startAt(otherOffset);
+  };
+  auto prefix = static_cast<std::uint32_t>(commonPrefix(a, b));
+  while (prefix > 0 && !bothStartAt(change.original + prefix, change.modified + prefix)) --prefix;
+  auto suffix = static_cast<std::uint32_t>(commonSuffix(a.substr(prefix), b.substr(prefix)));
+  while (suffix > 0 && !bothStartAt(change.originalEnd - suffix, change.modifiedEnd - suffix)) --suffix;
+  return {change.original + prefix, change.originalEnd - suffix, change.modified + prefix,
+          change.modifiedEnd - suffix};
+}
+
+DiffDescriptor ContentDiff::descriptor(const Change& change) const {
+  const auto range = [](std::uint32_t start, std::uint32_t end) {
+    return MarletFoundation::TextRange{start, end - start};
+  };
+  return {range(change.original, change.originalEnd), range(change.modified, change.modifiedEnd),
+          std::u16string(original_.view.substr(change.original, change.originalEnd - change.original)),
+          std::u16string(modified_.view.substr(change.modified, change.modifiedEnd - change.modified))};
 }
 
 }  // namespace
 
 std::vector<DiffDescriptor> diffContent(std::u16string_view original, std::u16string_view modified,
                                         std::optional<DiffOptions> options) {
-  const bool smaller = options && options->contains(DiffOptions::SmallerHunks);
-  // One budget for the whole call, so that many hunks can't add up to more than it.
-  std::int64_t budget =
-      (std::int64_t{1} << 24) + 16 * static_cast<std::int64_t>(original.size() + modified.size());
-
-  std::vector<DiffDescriptor> hunks;
-  const Change whole{0, original.size(), 0, modified.size()};
-  for (const auto& lines : changesWithin(whole, original, modified, Tokens::lines, budget)) {
-    if (!smaller || lines.original == lines.originalEnd || lines.modified == lines.modifiedEnd) {
-      hunks.push_back(descriptor(original, modified, lines));
-      continue;
-    }
-    for (const auto& words : changesWithin(lines, original, modified, Tokens::words, budget)) {
-      hunks.push_back(descriptor(original, modified, words));
-    }
+  if (original.size() > longestText || modified.size() > longestText) {
+    if (original == modified) return {};
+    return {{{0, std::ssize(original)},
+             {0, std::ssize(modified)},
+             std::u16string(original),
+             std::u16string(modified)}};
   }
-  return hunks;
+  return ContentDiff(original, modified, options && options->contains(DiffOptions::SmallerHunks)).run();
 }
 
 }  // namespace MarletDiff

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cstdint>
 
-#include "MarletDiff/Tokens.h"
+#include "MarletDiff/Characters.h"
 #include "MarletFoundation/Platform/ErrorObject.h"
 #include "MarletFoundation/Platform/Text.h"
 
@@ -190,7 +190,10 @@ std::u16string mergeContent(std::u16string_view base, Hunks diff, Hunks otherDif
   const auto first = [&]() -> Side* {
     const auto *a = side.next(), *b = otherSide.next();
     if (!a || !b) return a ? &side : b ? &otherSide : nullptr;
-    return a->originalRange.location <= b->originalRange.location ? &side : &otherSide;
+    const auto at = a->originalRange.location, otherAt = b->originalRange.location;
+    if (at != otherAt) return at < otherAt ? &side : &otherSide;
+    // The one that ties the place to what is in front comes first, whichever side it is of.
+    return changesWordBefore(base, *a) ? &side : &otherSide;
   };
 
   std::u16string merged;

@@ -1,46 +1,110 @@
 #include "MarletDiff/Tokens.h"
 
+#include <algorithm>
+#include <bit>
+#include <cstring>
+#include <random>
+
 namespace MarletDiff {
 namespace {
 
-constexpr char16_t paragraphSeparator = u'\u2029';
-
-/// The offset behind the character at `offset`, CR LF taken as one.
-std::size_t characterEnd(std::u16string_view text, std::size_t offset) {
-  return offset + (text.substr(offset, 2) == u"\r\n" ? 2 : 1);
+/// The offset of the first unit from `at` on that ends a line, or `end`.
+std::size_t lineEnd(std::u16string_view text, std::size_t at, std::size_t end) {
+  using Block = char16_t __attribute__((vector_size(16)));
+  constexpr std::size_t unitsPerBlock = sizeof(Block) / sizeof(char16_t);
+  for (; at + unitsPerBlock <= end; at += unitsPerBlock) {
+    Block block;
+    std::memcpy(&block, text.data() + at, sizeof block);
+    const auto found = (block == u'\n') | (block == u'\r') | (block == ParagraphSeparator);
+    std::uint64_t halves[2];
+    std::memcpy(halves, &found, sizeof halves);
+    if (halves[0]) return at + static_cast<std::size_t>(std::countr_zero(halves[0])) / 16;
+    if (halves[1]) return at + 4 + static_cast<std::size_t>(std::countr_zero(halves[1])) / 16;
+  }
+  while (at < end && !endsLine(text[at])) ++at;
+  return at;
 }
 
-bool endsLine(char16_t unit) { return unit == u'\n' || unit == u'\r' || unit == paragraphSeparator; }
+/// Another number in each process, so that no text can be made to put all its tokens in one slot. Numbers
+/// don't depend on it.
+const std::uint64_t seed = [] {
+  std::random_device device;
+  return (std::uint64_t{device()} << 32 | device()) | 1;
+}();
+
+std::uint64_t mixed(std::uint64_t a, std::uint64_t b) {
+  __extension__ using Wide = unsigned __int128;
+  const Wide product = static_cast<Wide>(a) * b;
+  return static_cast<std::uint64_t>(product) ^ static_cast<std::uint64_t>(product >> 64);
+}
+
+std::uint64_t hash(std::u16string_view token) {
+  constexpr std::uint64_t first = 0x9E3779B97F4A7C15, second = 0xC2B2AE3D27D4EB4F;
+  const auto* bytes = reinterpret_cast<const char*>(token.data());
+  auto size = token.size() * sizeof(char16_t);
+  std::uint64_t result = seed ^ size;
+  std::uint64_t words[2];
+  for (; size > sizeof words; bytes += sizeof words, size -= sizeof words) {
+    std::memcpy(words, bytes, sizeof words);
+    result = mixed(words[0] ^ first ^ result, words[1] ^ second);
+  }
+  words[0] = words[1] = 0;
+  std::memcpy(words, bytes, size);
+  return mixed(words[0] ^ first ^ result, words[1] ^ second ^ seed);
+}
 
 }  // namespace
 
-bool isWordUnit(char16_t unit) {
-  if (unit >= 0x80) return unit != paragraphSeparator;
-  return (unit >= u'a' && unit <= u'z') || (unit >= u'A' && unit <= u'Z') || (unit >= u'0' && unit <= u'9') ||
-         unit == u'_';
-}
-
-Tokens Tokens::lines(std::u16string_view text) {
-  Tokens tokens(text);
-  for (std::size_t offset = 0; offset < text.size();) {
-    while (offset < text.size() && !endsLine(text[offset])) ++offset;
-    if (offset < text.size()) offset = characterEnd(text, offset);
-    tokens.ends_.push_back(offset);
+void cutLines(std::u16string_view text, std::uint32_t start, std::uint32_t end, TokenStarts& tokens) {
+  tokens.clear();
+  for (std::size_t at = start; at < end;) {
+    tokens.push_back(static_cast<std::uint32_t>(at));
+    at = lineEnd(text, at, end);
+    if (at < end) at += text.substr(at, 2) == u"\r\n" ? 2 : 1;
   }
-  return tokens;
+  tokens.push_back(end);
 }
 
-Tokens Tokens::words(std::u16string_view text) {
-  Tokens tokens(text);
-  for (std::size_t offset = 0; offset < text.size();) {
-    if (isWordUnit(text[offset])) {
-      while (offset < text.size() && isWordUnit(text[offset])) ++offset;
-    } else {
-      offset = characterEnd(text, offset);
+void cutWords(std::u16string_view text, Characters& characters, std::uint32_t start, std::uint32_t end,
+              TokenStarts& tokens) {
+  tokens.clear();
+  bool inWord = false;
+  for (auto at = start; at < end; ++at) {
+    if (at != start && !characters.startAt(at)) continue;
+    const bool isWord = isWordUnit(text[at]);
+    if (!isWord || !inWord) tokens.push_back(at);
+    inWord = isWord;
+  }
+  tokens.push_back(end);
+}
+
+void cutCharacters(Characters& characters, std::uint32_t start, std::uint32_t end, TokenStarts& tokens) {
+  tokens.clear();
+  for (auto at = start; at < end; ++at) {
+    if (at == start || characters.startAt(at)) tokens.push_back(at);
+  }
+  tokens.push_back(end);
+}
+
+void TokenNumbers::reset(std::size_t tokens) {
+  mask_ = std::bit_ceil(2 * tokens + 1) - 1;
+  if (slots_.size() <= mask_) slots_.resize(mask_ + 1);
+  std::fill_n(slots_.begin(), mask_ + 1, Slot{});
+  known_.clear();
+}
+
+std::uint32_t TokenNumbers::number(std::u16string_view token) {
+  const auto tokenHash = hash(token);
+  const auto hashBits = static_cast<std::uint32_t>(tokenHash >> 32);
+  for (auto place = tokenHash & mask_;; place = (place + 1) & mask_) {
+    auto& slot = slots_[place];
+    if (slot.number == 0) {
+      known_.push_back(token);
+      slot = {hashBits, static_cast<std::uint32_t>(known_.size())};
+      return slot.number - 1;
     }
-    tokens.ends_.push_back(offset);
+    if (slot.hashBits == hashBits && known_[slot.number - 1] == token) return slot.number - 1;
   }
-  return tokens;
 }
 
 }  // namespace MarletDiff

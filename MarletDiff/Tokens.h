@@ -1,33 +1,41 @@
 #pragma once
 
+#include <cstdint>
 #include <string_view>
 #include <vector>
 
+#include "MarletDiff/Characters.h"
+
 namespace MarletDiff {
 
-/// Whether a UTF-16 unit is part of a word: a letter, a digit or an underscore, and whatever lies beyond
-/// ASCII, so that neither a surrogate pair nor a letter with its marks is ever divided.
-bool isWordUnit(char16_t unit);
+/// Where the tokens of a stretch of text start, and behind the last one where it ends.
+using TokenStarts = std::vector<std::uint32_t>;
 
-/// A text cut into tokens that follow each other without a gap.
-class Tokens {
+/// Lines with their ends.
+void cutLines(std::u16string_view text, std::uint32_t start, std::uint32_t end, TokenStarts& tokens);
+/// Words, and every other character by itself.
+void cutWords(std::u16string_view text, Characters& characters, std::uint32_t start, std::uint32_t end,
+              TokenStarts& tokens);
+void cutCharacters(Characters& characters, std::uint32_t start, std::uint32_t end, TokenStarts& tokens);
+
+/// Gives tokens numbers, the same to equal ones, counted from 0 in the order in which they come first. Tokens
+/// are found by a hash and compared for real.
+class TokenNumbers {
  public:
-  /// Lines with their ends: LF, CR, CR LF or U+2029.
-  static Tokens lines(std::u16string_view text);
-  /// Words, and every other character by itself.
-  static Tokens words(std::u16string_view text);
-
-  std::size_t size() const { return ends_.size(); }
-  std::u16string_view operator[](std::size_t index) const {
-    return text_.substr(start(index), ends_[index] - start(index));
-  }
-  /// The offset of a token, or for `size()` the text's length.
-  std::size_t start(std::size_t index) const { return index == 0 ? 0 : ends_[index - 1]; }
+  /// Forgets all tokens and makes room for as many.
+  void reset(std::size_t tokens);
+  std::uint32_t number(std::u16string_view token);
+  std::size_t size() const { return known_.size(); }
 
  private:
-  explicit Tokens(std::u16string_view text) : text_(text) {}
-  std::u16string_view text_;
-  std::vector<std::size_t> ends_;
+  std::vector<std::u16string_view> known_;
+  /// A hash table with open addressing: numbers plus 1, 0 where free, beside some bits of the hash.
+  struct Slot {
+    std::uint32_t hashBits;
+    std::uint32_t number;
+  };
+  std::vector<Slot> slots_;
+  std::size_t mask_ = 0;
 };
 
 }  // namespace MarletDiff

@@ -138,7 +138,12 @@ class CharacterWalk {
     ubrk_setUText(iterator_, &text_, &status);
     if (U_FAILURE(status)) fatalError("the character break iterator takes no text");
   }
-  /// Bytes from the start to the end of the next character. Not to be called at the end.
+  void start(std::u16string_view text) {
+    UErrorCode status = U_ZERO_ERROR;
+    ubrk_setText(iterator_, text.data(), static_cast<std::int32_t>(text.size()), &status);
+    if (U_FAILURE(status)) fatalError("the character break iterator takes no text");
+  }
+  /// Units from the start to the end of the next character. Not to be called at the end.
   std::size_t next() { return static_cast<std::size_t>(ubrk_next(iterator_)); }
 
  private:
@@ -152,6 +157,9 @@ class CharacterWalk {
   UBreakIterator* iterator_ = nullptr;
 };
 
+// ICU counts its offsets in 32 bits.
+constexpr std::size_t window = std::size_t{1} << 30;
+
 struct Run {
   std::size_t end;
   std::int64_t count;
@@ -160,8 +168,6 @@ struct Run {
 /// Walks at most `limit` characters from `from` on. Starts ICU only where a character isn't ASCII by itself,
 /// and always at the start of a character, so that nothing in front is looked at again.
 Run walk(std::string_view text, std::size_t from, std::int64_t limit) {
-  // ICU counts its offsets in 32 bits.
-  constexpr std::size_t window = std::size_t{1} << 30;
   std::size_t at = std::min(from, text.size());
   std::int64_t count = 0;
   while (at < text.size() && count < limit) {
@@ -254,6 +260,17 @@ std::int64_t graphemeCount(std::string_view text) {
 
 std::size_t graphemeRunEnd(std::string_view text, std::size_t from, std::int64_t count) {
   return walk(text, from, count).end;
+}
+
+std::vector<bool> graphemeStarts(std::u16string_view text) {
+  std::vector<bool> starts(text.size());
+  auto& characters = CharacterWalk::ofThisThread();
+  for (std::size_t base = 0; base < text.size(); base += window) {
+    const auto part = text.substr(base, window);
+    characters.start(part);
+    for (std::size_t at = 0; at < part.size(); at = characters.next()) starts[base + at] = true;
+  }
+  return starts;
 }
 
 bool canonicallyEquivalent(std::string_view a, std::string_view b) {

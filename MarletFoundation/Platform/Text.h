@@ -29,6 +29,10 @@ MARLET_EXPORT std::int64_t graphemeCount(std::string_view text);
 /// there are fewer. Linear in the bytes passed over when called run after run.
 MARLET_EXPORT std::size_t graphemeRunEnd(std::string_view text, std::size_t from, std::int64_t count);
 
+/// For each offset of a text in UTF-16, whether a character starts there. An unpaired surrogate is a character
+/// of its own.
+MARLET_EXPORT std::vector<bool> graphemeStarts(std::u16string_view text);
+
 /// Equality by Unicode canonical equivalence.
 MARLET_EXPORT bool canonicallyEquivalent(std::string_view a, std::string_view b);
 

@@ -1,0 +1,77 @@
+#include "MarletDiff/Sliding.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace MarletDiff {
+namespace {
+
+/// How good a place is to start or end a change at.
+int rank(std::u16string_view text, std::size_t offset) {
+  if (offset == text.size() || isLineStart(text, offset)) return 5;
+  const char16_t before = text[offset - 1], after = text[offset];
+  // Never through a delimiter, if it can be helped: text beside a comment is then not taken for a part of it.
+  if ((before == u'/' && after == u'*') || (before == u'*' && after == u'/')) return 0;
+  const bool opens = after == u'/' && offset + 1 < text.size() && text[offset + 1] == u'*';
+  const bool closes = before == u'/' && offset >= 2 && text[offset - 2] == u'*';
+  if (opens || closes) return 4;
+  const bool wordBefore = isWordUnit(before), wordAfter = isWordUnit(after);
+  if (wordAfter) return wordBefore ? 0 : 3;
+  return wordBefore ? 2 : 1;
+}
+
+struct Score {
+  int worse = -1;
+  int sum = 0;
+  bool standsAlone = false;
+  auto operator<=>(const Score&) const = default;
+};
+
+Score score(Text& original, Text& modified, const Change& change, bool standsAlone) {
+  const bool wholeCharacters =
+      original.characters.startAt(change.original) && original.characters.startAt(change.originalEnd) &&
+      modified.characters.startAt(change.modified) && modified.characters.startAt(change.modifiedEnd);
+  if (!wholeCharacters) return {};
+  const auto start = rank(original.view, change.original), end = rank(original.view, change.originalEnd);
+  return {std::min(start, end), start + end, standsAlone};
+}
+
+Change moved(const Change& change, std::int64_t by) {
+  const auto add = [&](std::uint32_t offset) { return static_cast<std::uint32_t>(offset + by); };
+  return {add(change.original), add(change.originalEnd), add(change.modified), add(change.modifiedEnd)};
+}
+
+}  // namespace
+
+void slideChanges(Text& original, Text& modified, std::vector<Change>& changes) {
+  for (std::size_t i = 0; i < changes.size(); ++i) {
+    auto& change = changes[i];
+    const bool inserts = change.original == change.originalEnd;
+    if (!inserts && change.modified != change.modifiedEnd) continue;
+    const auto text = inserts ? modified.view : original.view;
+    const auto start = inserts ? change.modified : change.original;
+    const auto end = inserts ? change.modifiedEnd : change.originalEnd;
+    const bool isFirst = i == 0, isLast = i + 1 == changes.size();
+    const std::int64_t before = change.original - (isFirst ? 0 : changes[i - 1].originalEnd);
+    const std::int64_t behind =
+        (isLast ? std::ssize(original.view) : changes[i + 1].original) - std::int64_t{change.originalEnd};
+    std::int64_t back = 0, ahead = 0;
+    while (back < before && text[start - 1 - back] == text[end - 1 - back]) ++back;
+    while (ahead < behind && text[start + ahead] == text[end + ahead]) ++ahead;
+    if (back == 0 && ahead == 0) continue;
+
+    auto best = change;
+    Score bestScore;
+    for (auto by = -back; by <= ahead; ++by) {
+      const auto candidate = moved(change, by);
+      const bool touches = (by == -before && !isFirst) || (by == behind && !isLast);
+      const auto candidateScore = score(original, modified, candidate, !touches);
+      if (candidateScore < bestScore) continue;
+      best = candidate;
+      bestScore = candidateScore;
+    }
+    change = best;
+  }
+}
+
+}  // namespace MarletDiff

@@ -1,0 +1,23 @@
+#pragma once
+
+#include <string_view>
+#include <vector>
+
+#include "MarletDiff/Characters.h"
+#include "MarletDiff/Comparison.h"
+
+namespace MarletDiff {
+
+/// A text with its characters.
+struct Text {
+  explicit Text(std::u16string_view text) : view(text), characters(text) {}
+  std::u16string_view view;
+  Characters characters;
+};
+
+/// Moves each insertion and removal along equal text to where it starts and ends best in the original: at a
+/// line's start, at the outer edge of a comment, at a word's start, at a word's end. Of equally good places it
+/// takes the last. Changes are given by offsets; two may touch afterwards, but only where that is better.
+void slideChanges(Text& original, Text& modified, std::vector<Change>& changes);
+
+}  // namespace MarletDiff
