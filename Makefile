@@ -2,7 +2,6 @@
 .DEFAULT_GOAL := marlet
 .PHONY: marlet demo test asan tsan bench fuzz format check-format embed
 
-EXAMPLE := examples/LearnLoops.marletbook
 FUZZ_SECONDS ?= 600
 
 configure = cmake --preset $(1)
@@ -14,8 +13,7 @@ marlet:
 	cmake --build --preset release
 
 demo: marlet
-	build/release/bin/marlet check $(EXAMPLE)
-	build/release/bin/marlet show $(EXAMPLE)
+	scripts/demo
 
 test:
 	scripts/install-dependencies

@@ -232,7 +232,7 @@ void BinaryWriter::writeObject(const Object& object) {
 }
 
 void BinaryWriter::writeString(std::string_view text) {
-  if (PropertyListText::findNonASCII(text) == PropertyListText::npos) {
+  if (PropertyListText::isASCII(text)) {
     writeMarker(0x5, text.size());
     bytes_ += text;
     return;

@@ -18,6 +18,12 @@ thread_local std::vector<PropertyListValue>* waiting = nullptr;
 
 bool isContainer(const PropertyListValue& value) { return value.payload.index() < 2; }
 
+// The first bytes mostly tell.
+bool isBefore(std::string_view a, std::string_view b) {
+  if (a.empty() || b.empty() || a[0] == b[0]) return a < b;
+  return static_cast<unsigned char>(a[0]) < static_cast<unsigned char>(b[0]);
+}
+
 bool equalScalars(const PropertyListValue& a, const PropertyListValue& b) {
   switch (a.payload.index()) {
     case 2:
@@ -52,7 +58,7 @@ PropertyListDictionary::PropertyListDictionary(Entries entries) : entries_(std::
 }
 
 void PropertyListDictionary::sortEntries() {
-  const auto notAscending = [](const Entry& a, const Entry& b) { return a.key.view() >= b.key.view(); };
+  const auto notAscending = [](const Entry& a, const Entry& b) { return !isBefore(a.key, b.key); };
   if (std::adjacent_find(entries_.begin(), entries_.end(), notAscending) == entries_.end()) return;
   std::stable_sort(entries_.begin(), entries_.end(),
                    [](const Entry& a, const Entry& b) { return a.key.view() < b.key.view(); });

@@ -9,9 +9,9 @@
 #include <variant>
 #include <vector>
 
-#include "MarletFoundation/Platform/SharedString.h"
 #include "MarletFoundation/Platform/Data.h"
 #include "MarletFoundation/Platform/Date.h"
+#include "MarletFoundation/Platform/SharedString.h"
 
 namespace MarletFoundation {
 
@@ -82,6 +82,10 @@ struct MARLET_EXPORT PropertyListValue {
       : payload(static_cast<std::int64_t>(value)) {}
   PropertyListValue(double value) : payload(value) {}
   PropertyListValue(bool value) : payload(value) {}
+  /// The named case, made in place.
+  template <class Case, class... Arguments>
+  explicit PropertyListValue(std::in_place_type_t<Case> named, Arguments&&... arguments)
+      : payload(named, std::forward<Arguments>(arguments)...) {}
 
   PropertyListValue(const PropertyListValue& other);
   PropertyListValue(PropertyListValue&& other) noexcept : payload(moved(other.payload)) {}
@@ -115,6 +119,14 @@ struct MARLET_EXPORT PropertyListValue {
 struct PropertyListDictionary::Entry {
   SharedString key;
   PropertyListValue value;
+
+  Entry() = default;
+  Entry(SharedString itsKey, PropertyListValue itsValue)
+      : key(std::move(itsKey)), value(std::move(itsValue)) {}
+  /// The value is made in place.
+  template <class Case, class... Arguments>
+  Entry(SharedString&& itsKey, std::in_place_type_t<Case> named, Arguments&&... arguments)
+      : key(std::move(itsKey)), value(named, std::forward<Arguments>(arguments)...) {}
 };
 
 // Entries hold values, so what handles them has to wait until here.

@@ -29,6 +29,14 @@ std::size_t hash(std::string_view text) {
   return static_cast<std::size_t>(mixed >> 32);
 }
 
+// Of short keys, the same bytes that were hashed are all.
+bool isEqual(std::string_view a, std::string_view b) {
+  if (a.size() != b.size()) return false;
+  if (a.size() < 8 || a.size() > 16) return a == b;
+  return std::memcmp(a.data(), b.data(), 8) == 0 &&
+         std::memcmp(a.data() + a.size() - 8, b.data() + b.size() - 8, 8) == 0;
+}
+
 template <class Element>
 void clearStack(std::vector<Element>& stack) {
   constexpr std::size_t mostKept = 1024;
@@ -48,7 +56,9 @@ void PropertyListValueBuilder::clear() {
 }
 
 void PropertyListValueBuilder::end() {
-  const auto [isDictionary, start] = open_.back();
+  const auto isDictionary = open_.back().isDictionary;
+  const auto start = open_.back().start;
+  key_ = std::move(open_.back().key);
   open_.pop_back();
   if (isDictionary) {
     add<PropertyListDictionary>(taken(entries_, start));
@@ -58,13 +68,12 @@ void PropertyListValueBuilder::end() {
 }
 
 void PropertyListValueBuilder::key(std::string_view text) {
-  auto& entry = entries_.emplace_back();
-  entry.key = text.size() > longestSharedKey ? SharedString(text) : sharedKey(text);
+  key_ = text.size() > longestSharedKey ? SharedString(text) : sharedKey(text);
 }
 
 const SharedString& PropertyListValueBuilder::sharedKey(std::string_view text) {
   auto& recent = recentKeys_[hash(text) % recentKeys_.size()];
-  if (recent.view() != text) recent = SharedString(text);
+  if (!isEqual(recent.view(), text)) recent = SharedString(text);
   return recent;
 }
 

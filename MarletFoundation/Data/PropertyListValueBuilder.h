@@ -12,8 +12,8 @@ namespace MarletFoundation {
 /// container takes its own, in one allocation of the right size, when it ends.
 class PropertyListValueBuilder final : public PropertyListEvents {
  public:
-  void beginArray() override { open_.push_back({false, values_.size()}); }
-  void beginDictionary() override { open_.push_back({true, entries_.size()}); }
+  void beginArray() override { begin(false, values_.size()); }
+  void beginDictionary() override { begin(true, entries_.size()); }
   void end() override;
   void key(std::string_view text) override;
   void string(std::string_view text) override { add<std::string>(text); }
@@ -34,22 +34,31 @@ class PropertyListValueBuilder final : public PropertyListEvents {
     bool isDictionary;
     // Where its children begin on their stack.
     std::size_t start;
+    // The key that it stands under.
+    SharedString key;
   };
+
+  void begin(bool isDictionary, std::size_t start) {
+    open_.push_back({isDictionary, start, std::move(key_)});
+  }
 
   template <class Payload, class Argument>
   void add(Argument&& argument) {
-    // In a dictionary the entry was begun with its key.
-    const bool hasEntry = !open_.empty() && open_.back().isDictionary;
-    auto& value = hasEntry ? entries_.back().value : values_.emplace_back();
-    value.payload.emplace<Payload>(std::forward<Argument>(argument));
+    if (!open_.empty() && open_.back().isDictionary) {
+      entries_.emplace_back(std::move(key_), std::in_place_type<Payload>, std::forward<Argument>(argument));
+    } else {
+      values_.emplace_back(std::in_place_type<Payload>, std::forward<Argument>(argument));
+    }
   }
   const SharedString& sharedKey(std::string_view text);
 
   std::vector<OpenContainer> open_;
   std::vector<PropertyListValue> values_;
   std::vector<PropertyListDictionary::Entry> entries_;
+  // The key of the value that follows.
+  SharedString key_;
   // The keys met last, each in the place that its text hashes to.
-  std::array<SharedString, 64> recentKeys_;
+  std::array<SharedString, 256> recentKeys_;
 };
 
 }  // namespace MarletFoundation

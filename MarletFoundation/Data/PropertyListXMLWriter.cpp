@@ -1,3 +1,5 @@
+#include <array>
+
 #include "MarletFoundation/Data/PropertyListWriters.h"
 #include "MarletFoundation/Platform/PropertyListError.h"
 #include "MarletFoundation/Platform/PropertyListEvents.h"
@@ -10,13 +12,16 @@ namespace {
 
 using enum PropertyListErrorCode;
 
-std::string_view referenceFor(char c) {
-  if (c == '&') return "&amp;";
-  if (c == '<') return "&lt;";
-  if (c == '>') return "&gt;";
+// What stands for a character that can't stand for itself.
+constexpr auto references = [] {
+  std::array<std::string_view, 256> table;
+  table['&'] = "&amp;";
+  table['<'] = "&lt;";
+  table['>'] = "&gt;";
   // Readers take a carriage return as it stands for a line feed.
-  return c == '\r' ? "&#13;" : "";
-}
+  table['\r'] = "&#13;";
+  return table;
+}();
 
 class XMLWriter {
  public:
@@ -138,7 +143,7 @@ void XMLWriter::checkText(std::string_view text) {
 void XMLWriter::writeWithReferences(std::string_view text) {
   std::size_t written = 0;
   for (std::size_t place = 0; place < text.size(); ++place) {
-    const auto reference = referenceFor(text[place]);
+    const auto reference = references[static_cast<std::uint8_t>(text[place])];
     if (reference.empty()) continue;
     text_.append(text, written, place - written).append(reference);
     written = place + 1;

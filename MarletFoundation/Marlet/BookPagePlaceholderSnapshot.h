@@ -10,6 +10,8 @@
 
 namespace MarletFoundation {
 
+struct BookPagePlaceholder;
+
 /// What a table of contents needs to know of a page: enough to draw it with its pass mark, without its
 /// source.
 struct MARLET_EXPORT BookPagePlaceholderSnapshot {
@@ -38,6 +40,7 @@ struct MARLET_EXPORT BookPagePlaceholderSnapshot {
   /// `SerializationError`, or what reading through the pack throws.
   BookPagePlaceholderSnapshot(const FileWrapper& fileWrapper, const URL& baseURL,
                               const std::optional<DiffPackSnapshot>& userEditsDiffPack);
+  explicit BookPagePlaceholderSnapshot(const BookPagePlaceholder& page);
 };
 
 MARLET_EXPORT const ErrorTable& errorTable(BookPagePlaceholderSnapshot::SerializationErrorCase);

@@ -23,6 +23,17 @@ inline std::optional<Data> fileContents(const FileWrapper& directory, std::strin
   return child && child->isRegularFile() ? child->regularFileContents() : std::nullopt;
 }
 
+/// The contents of a file that need not be there, but must be one if it is.
+template <class ErrorType>
+std::optional<Data> optionalFileContents(const FileWrapper& directory, std::string_view name,
+                                         typename ErrorType::Case notAFile) {
+  const auto child = directory.child(name);
+  if (!child) return std::nullopt;
+  auto contents = child->isRegularFile() ? child->regularFileContents() : std::nullopt;
+  require<ErrorType>(contents.has_value(), notAFile);
+  return contents;
+}
+
 /// The root dictionary of the required file "Manifest.plist".
 template <class ErrorType>
 PropertyListDictionary loadManifest(const FileWrapper& directory, typename ErrorType::Case missing,

@@ -1,6 +1,7 @@
 #include "MarletFoundation/Marlet/MarletBookSnapshot.h"
 
 #include "MarletFoundation/Marlet/LoadChecks.h"
+#include "MarletFoundation/Marlet/MarletBook.h"
 #include "MarletFoundation/PathUtilities/PathUniquifier.h"
 #include "MarletFoundation/Platform/Host.h"
 #include "MarletFoundation/Version/ManifestVersion.h"
@@ -60,11 +61,8 @@ MarletChapterSnapshot loadChapter(const FileWrapper& chapters, const URL& chapte
 }
 
 MarletKeyValueStoreSnapshot loadKeyValueStore(const FileWrapper& edits) {
-  const auto file = edits.child("KeyValueStore.plist");
-  if (!file) return {};
-  const auto data = file->isRegularFile() ? file->regularFileContents() : std::nullopt;
-  require<E>(data.has_value(), Case::keyValueStoreNotARegularFile);
-  return MarletKeyValueStoreSnapshot(*data);
+  const auto data = optionalFileContents<E>(edits, "KeyValueStore.plist", Case::keyValueStoreNotARegularFile);
+  return data ? MarletKeyValueStoreSnapshot(*data) : MarletKeyValueStoreSnapshot();
 }
 
 /// The load, in the one order in which its failures are reported.
@@ -159,6 +157,22 @@ MarletBookSnapshot::MarletBookSnapshot(const FileWrapper& fileWrapper, const URL
         std::optional<DiffPackSnapshot> discarded;
         return loadBook(fileWrapper, baseURL, discarded);
       }()) {}
+
+MarletBookSnapshot::MarletBookSnapshot(const MarletBook& book)
+    : name(book.name),
+      filename(book.filename),
+      bookDescription(book.bookDescription),
+      contentIdentifier(book.contentIdentifier),
+      contentVersion(book.contentVersion),
+      uniquifier(book.uniquifier),
+      target(book.target),
+      sourcesDirectoryURL(book.sourcesDirectoryURL),
+      resourcesDirectoryURL(book.resourcesDirectoryURL),
+      userResourcesDirectoryURL(book.userResourcesDirectoryURL),
+      imageReference(book.imageReference),
+      keyValueStore(book.keyValueStore.snapshot()) {
+  for (const auto& chapter : book.chapters) chapters.push_back(chapter->snapshot());
+}
 
 PropertyListValue MarletBookSnapshot::manifest() const {
   PropertyListValue::Array filenames;

@@ -11,6 +11,8 @@
 
 namespace MarletFoundation {
 
+struct MarletBook;
+
 /// A whole book as an immutable value: what opening a ".marletbook" directory yields. Pages stay on disk;
 /// their placeholders make the table of contents.
 struct MARLET_EXPORT MarletBookSnapshot {
@@ -89,6 +91,9 @@ struct MARLET_EXPORT MarletBookSnapshot {
   /// fails.
   MarletBookSnapshot(const FileWrapper& fileWrapper, const URL& baseURL,
                      std::optional<DiffPackSnapshot>& userEditsDiffPack);
+
+  /// The book as it stands; nothing is checked.
+  explicit MarletBookSnapshot(const MarletBook& book);
 
   /// The book's manifest, of the current format version and with the target's own `DeploymentTarget`. Keys
   /// that a load didn't know are not in it.

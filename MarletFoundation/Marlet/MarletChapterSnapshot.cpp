@@ -1,6 +1,7 @@
 #include "MarletFoundation/Marlet/MarletChapterSnapshot.h"
 
 #include "MarletFoundation/Marlet/LoadChecks.h"
+#include "MarletFoundation/Marlet/MarletChapter.h"
 
 namespace MarletFoundation {
 
@@ -91,6 +92,16 @@ MarletChapterSnapshot::MarletChapterSnapshot(const FileWrapper& fileWrapper, con
   pages.reserve(filenames.size());
   for (const auto& element : filenames)
     pages.push_back(loadPage(pagesWrapper, pagesURL, element, userEditsDiffPack));
+}
+
+MarletChapterSnapshot::MarletChapterSnapshot(const MarletChapter& chapter)
+    : name(chapter.name),
+      filename(chapter.filename),
+      chapterDescription(chapter.chapterDescription),
+      imageReference(chapter.imageReference),
+      sourcesDirectoryURL(chapter.sourcesDirectoryURL),
+      resourcesDirectoryURL(chapter.resourcesDirectoryURL) {
+  for (const auto& page : chapter.pages) pages.push_back(page->snapshot());
 }
 
 PropertyListValue MarletChapterSnapshot::manifest() const {

@@ -8,6 +8,8 @@
 
 namespace MarletFoundation {
 
+struct MarletChapter;
+
 /// One chapter of a book, with its pages as placeholders.
 struct MARLET_EXPORT MarletChapterSnapshot {
   enum class SerializationErrorCase {
@@ -50,6 +52,9 @@ struct MARLET_EXPORT MarletChapterSnapshot {
   /// Loads the chapter's directory; throws `SerializationError`.
   MarletChapterSnapshot(const FileWrapper& fileWrapper, const URL& baseURL,
                         const std::optional<DiffPackSnapshot>& userEditsDiffPack);
+
+  /// The chapter as it stands; nothing is checked.
+  explicit MarletChapterSnapshot(const MarletChapter& chapter);
 
   /// The chapter's manifest. Keys that a load didn't know are not in it.
   PropertyListValue manifest() const;

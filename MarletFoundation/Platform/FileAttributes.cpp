@@ -84,7 +84,8 @@ void removeTree(int parent, const std::string& name) {
       const bool removed =
           entry.type != DT_DIR && ::unlinkat(level.directory->descriptor(), entry.name.c_str(), 0) == 0;
       if (!removed)
-        levels.push_back({DiskDirectory::child(level.directory, SharedString(entry.name)), level.directory, entry.name});
+        levels.push_back(
+            {DiskDirectory::child(level.directory, SharedString(entry.name)), level.directory, entry.name});
     }
   }
 }

@@ -102,9 +102,11 @@ void BinaryReader::readTrailer() {
 }
 
 inline std::uint64_t BinaryReader::unsignedAt(std::size_t place, std::size_t width) const {
-  if (width == 1) return static_cast<std::uint8_t>(bytes_[place]);
+  const auto byteAt = [this](std::size_t at) { return std::uint64_t{static_cast<std::uint8_t>(bytes_[at])}; };
+  if (width == 1) return byteAt(place);
+  if (width == 2) return byteAt(place) << 8 | byteAt(place + 1);
   std::uint64_t number = 0;
-  for (std::size_t i = 0; i < width; ++i) number = number << 8 | static_cast<std::uint8_t>(bytes_[place + i]);
+  for (std::size_t i = 0; i < width; ++i) number = number << 8 | byteAt(place + i);
   return number;
 }
 
@@ -201,9 +203,8 @@ std::string_view BinaryReader::text(std::size_t place) {
   const auto length = count(start);
   const auto units = body(place, start, length, isASCII ? 1 : 2);
   if (isASCII) {
-    const auto high = PropertyListText::findNonASCII(units);
-    if (high != PropertyListText::npos) fail(invalidString, start + high, "ASCII");
-    return units;
+    if (PropertyListText::isASCII(units)) return units;
+    fail(invalidString, start + PropertyListText::findNonASCII(units), "ASCII");
   }
   scratch_.clear();
   const auto read = PropertyListText::appendUTF8FromUTF16(scratch_, units, true);
@@ -254,7 +255,8 @@ std::uint64_t BinaryReader::count(std::size_t& place) const {
 
 std::string_view BinaryReader::body(std::size_t object, std::size_t place, std::uint64_t count,
                                     std::size_t unitSize) const {
-  if (count > (tableOffset_ - place) / unitSize) fail(lengthOutOfRange, object);
+  const auto left = tableOffset_ - place;
+  if (count > (unitSize == 1 ? left : left / unitSize)) fail(lengthOutOfRange, object);
   return bytes_.substr(place, static_cast<std::size_t>(count) * unitSize);
 }
 

@@ -1,9 +1,16 @@
 #include "MarletFoundation/Platform/PropertyListText.h"
 
 #include <algorithm>
+#include <cstring>
 
 namespace MarletFoundation::PropertyListText {
 namespace {
+
+std::uint64_t wordAt(const char* place) {
+  std::uint64_t word;
+  std::memcpy(&word, place, sizeof word);
+  return word;
+}
 
 std::uint8_t byteAt(std::string_view text, std::size_t place) {
   return static_cast<std::uint8_t>(text[place]);
@@ -35,18 +42,12 @@ std::size_t sequenceLength(std::string_view text, std::size_t place) {
 
 std::size_t findNonASCII(std::string_view text) {
   constexpr std::uint64_t highBits = 0x8080808080808080;
-  const auto wordAt = [text](std::size_t at) {
-    std::uint64_t word;
-    std::memcpy(&word, text.data() + at, 8);
-    return word;
-  };
+  const auto isPlain = [text](std::size_t at) { return (wordAt(text.data() + at) & highBits) == 0; };
   std::size_t place = 0;
-  for (; place + 32 <= text.size(); place += 32) {
-    if ((wordAt(place) | wordAt(place + 8) | wordAt(place + 16) | wordAt(place + 24)) & highBits) break;
-  }
-  for (; place + 8 <= text.size(); place += 8) {
-    if (wordAt(place) & highBits) break;
-  }
+  while (place + 8 <= text.size() && isPlain(place)) place += 8;
+  // The last word overlaps the one before it.
+  if (place < text.size() && text.size() >= 8 && place + 8 > text.size() && isPlain(text.size() - 8))
+    return npos;
   for (; place < text.size(); ++place) {
     if (byteAt(text, place) > 0x7F) return place;
   }

@@ -15,6 +15,26 @@ inline constexpr std::size_t npos = std::string_view::npos;
 /// Offset of the first byte that is neither printable ASCII, delete included, nor tab, line feed or carriage
 /// return, or `npos`.
 std::size_t findUnusual(std::string_view text);
+/// Whether no byte is over 0x7F. Texts of property lists are mostly short.
+inline bool isASCII(std::string_view text) {
+  constexpr std::uint64_t highBits = 0x8080808080808080;
+  const char* place = text.data();
+  const char* const end = place + text.size();
+  std::uint64_t any = 0;
+  std::uint64_t word = 0;
+  for (; end - place >= 8; place += 8) {
+    std::memcpy(&word, place, 8);
+    any |= word;
+  }
+  if (text.size() >= 8) {
+    // The last word overlaps the one before it.
+    std::memcpy(&word, end - 8, 8);
+    any |= word;
+  } else {
+    for (; place < end; ++place) any |= static_cast<std::uint8_t>(*place);
+  }
+  return (any & highBits) == 0;
+}
 /// Offset of the first byte over 0x7F, or `npos`.
 std::size_t findNonASCII(std::string_view text);
 /// Offset of the first ill-formed sequence, or `npos`.

@@ -61,6 +61,13 @@ class XMLReader {
   template <std::size_t Size>
   std::string_view readText(Element element, const char (&endTag)[Size]);
   std::string_view readMixedText(Element element);
+  /// The first reference or carriage return from `place` on, or the end.
+  const char* nextReference(const char* place) { return next('&', place, nextReference_); }
+  const char* nextReturn(const char* place) { return next('\r', place, nextReturn_); }
+  const char* next(char character, const char* place, const char*& known) {
+    if (known < place) known = cursor_.find(character, place);
+    return known;
+  }
   void appendText(const char* from, const char* to);
   void appendReference();
   bool acceptEndTag(std::string_view name);
@@ -75,8 +82,7 @@ class XMLReader {
   std::array<OpenElement, PropertyListDepthLimit + 1> open_;
   std::size_t depth_ = 0;
   std::string scratch_;
-  // The first reference and carriage return at or behind a place that was passed, so that texts without them
-  // are not searched for them one by one.
+  // As far as they are known, so that texts without them are not searched for them one by one.
   const char* nextReference_ = cursor_.place();
   const char* nextReturn_ = cursor_.place();
   bool hasRoot_ = false;
@@ -170,9 +176,14 @@ void XMLReader::readStartTag(const char* tag) {
 }
 
 void XMLReader::readEndTag(const char* tag) {
+  const auto element = depth_ > 0 ? open_[depth_ - 1].element : Element::plist;
+  if ((element == Element::dict && cursor_.accept("</dict>")) ||
+      (element == Element::array && cursor_.accept("</array>"))) {
+    return endContainer(tag);
+  }
   cursor_.moveTo(tag + 2);
   const auto name = cursor_.readName();
-  if (depth_ == 0 || name != nameOf(open_[depth_ - 1].element)) fail(mismatchedTag, tag, name);
+  if (depth_ == 0 || name != nameOf(element)) fail(mismatchedTag, tag, name);
   cursor_.skipBlanks();
   if (!cursor_.accept(">")) fail(malformedMarkup, tag);
   endContainer(tag);
@@ -271,9 +282,7 @@ template <std::size_t Size>
 inline std::string_view XMLReader::readText(Element element, const char (&endTag)[Size]) {
   const char* const start = cursor_.place();
   const char* const tag = cursor_.find('<', start);
-  if (nextReference_ < start) nextReference_ = cursor_.find('&', start);
-  if (nextReturn_ < start) nextReturn_ = cursor_.find('\r', start);
-  if (nextReference_ < tag || nextReturn_ < tag || !cursor_.startsWith(endTag, tag))
+  if (nextReference(start) < tag || nextReturn(start) < tag || !cursor_.startsWith(endTag, tag))
     return readMixedText(element);
   cursor_.moveTo(tag + Size - 1);
   return {start, static_cast<std::size_t>(tag - start)};
@@ -286,7 +295,7 @@ std::string_view XMLReader::readMixedText(Element element) {
     if (*start == '&') {
       appendReference();
     } else if (*start != '<') {
-      cursor_.moveTo(std::find_if(start, cursor_.end(), [](char c) { return c == '<' || c == '&'; }));
+      cursor_.moveTo(std::min(cursor_.find('<', start), nextReference(start)));
       appendText(start, cursor_.place());
     } else if (cursor_.accept("<![CDATA[")) {
       const char* const text = cursor_.place();
@@ -320,7 +329,7 @@ bool XMLReader::acceptEndTag(std::string_view name) {
 // A line ends in a line feed, however the document ends it.
 void XMLReader::appendText(const char* from, const char* to) {
   while (true) {
-    const char* const carriageReturn = std::find(from, to, '\r');
+    const char* const carriageReturn = std::min(nextReturn(from), to);
     scratch_.append(from, carriageReturn);
     if (carriageReturn == to) return;
     scratch_.push_back('\n');

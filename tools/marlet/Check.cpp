@@ -3,11 +3,10 @@
 #include <algorithm>
 #include <iostream>
 
+#include "CheckBook.h"
 #include "Document.h"
-#include "FatalProblem.h"
 #include "JSON.h"
 #include "MarletFoundation/MarletFoundation.h"
-#include "Problem.h"
 
 using namespace MarletFoundation;
 
@@ -30,17 +29,6 @@ Problem problem(std::string rule, std::string description) {
   result.rule = std::move(rule);
   result.description = std::move(description);
   return result;
-}
-
-std::vector<Problem> problemsOfBook(const Document& document) {
-  try {
-    MarletBookSnapshot(document.wrapper, document.url);
-    return {};
-  } catch (const Error& error) {
-    return {problemOfBookLoad(error)};
-  } catch (const FatalProblem& fatal) {
-    return {problemOfFatalError(fatal.message)};
-  }
 }
 
 Report report(const std::string& path) {

@@ -1,16 +1,13 @@
 #include "Problem.h"
 
+#include "ErrorWords.h"
+#include "JSON.h"
 #include "MarletFoundation/MarletFoundation.h"
 #include "ProblemPlace.h"
 
 using namespace MarletFoundation;
 
 namespace {
-
-template <class T>
-nlohmann::ordered_json orNull(const std::optional<T>& value) {
-  return value ? nlohmann::ordered_json(*value) : nlohmann::ordered_json(nullptr);
-}
 
 Problem described(std::string rule, const Error& error) {
   const ErrorObject object(error);
@@ -19,18 +16,32 @@ Problem described(std::string rule, const Error& error) {
   problem.domain = object.domain();
   problem.code = object.code();
   if (!error.caseName().empty()) problem.caseName = error.caseName();
-  problem.description = object.localizedDescription();
+  problem.description = wordsOf(error);
   problem.recoverySuggestion = object.localizedRecoverySuggestion();
+  return problem;
+}
+
+Problem placed(const ProblemPlace& place, const Error& error) {
+  auto problem = described(place.rule, error);
+  problem.file = place.file;
+  problem.line = place.line;
   return problem;
 }
 
 }  // namespace
 
-Problem problemOfBookLoad(const Error& error) {
-  const auto place = placeInBook(error);
-  auto problem = described(place.rule, error);
-  problem.file = place.file;
-  problem.line = place.line;
+Problem problemOfBookLoad(const Error& error) { return placed(placeInBook(error), error); }
+
+Problem problemOfPageLoad(const Error& error, const std::string& directory) {
+  return placed(placeInPage(directory, error), error);
+}
+
+Problem warning(std::string rule, std::string description, std::string file) {
+  Problem problem;
+  problem.severity = "warning";
+  problem.rule = std::move(rule);
+  problem.description = std::move(description);
+  problem.file = std::move(file);
   return problem;
 }
 

@@ -26,6 +26,10 @@ struct Problem {
 
 /// The finding that the failure of a book's load amounts to.
 Problem problemOfBookLoad(const MarletFoundation::Error& error);
+/// The finding that the failure of a page's load amounts to; `directory` is the page's, relative to the book.
+Problem problemOfPageLoad(const MarletFoundation::Error& error, const std::string& directory);
+/// What a load lets pass.
+Problem warning(std::string rule, std::string description, std::string file);
 /// A path at which there is nothing to look at.
 Problem problemOfUnreadablePath(const MarletFoundation::Error& error);
 /// A fatal condition that the document ran into.

@@ -48,6 +48,21 @@ const Kind* kindOf(const Error& error) {
        "page",
        "Manifest.plist",
        {{"NotADirectory", ""}, {"ResultInfoNotAFile", "ResultInfo.plist"}}},
+      {MarletBookPageSnapshot::SerializationError::errorDomain(),
+       "page",
+       "Manifest.plist",
+       {{"NotADirectory", ""},
+        {"MissingContentsFile", "Contents.swift"},
+        {"InvalidContentsFile", "Contents.swift"},
+        {"ResultInfoNotAFile", "ResultInfo.plist"},
+        {"SourcesNotADirectory", "Sources"},
+        {"ResourcesNotADirectory", "Resources"},
+        {"LiveViewSourceFileNotAFile", "LiveView.swift"}}},
+      {CutsceneBookPageSnapshot::SerializationError::errorDomain(),
+       "page",
+       "Manifest.plist",
+       {{"NotADirectory", ""}, {"ResourcesNotADirectory", "Resources"}}},
+      {BookPageLoadingError::errorDomain(), "page", "", {}},
       {MarletKeyValueStoreSnapshot::SerializationError::errorDomain(),
        "keyValueStore",
        "Edits/KeyValueStore.plist",
@@ -95,3 +110,7 @@ ProblemPlace placeBeneath(const std::string& directory, const Error& error) {
 }  // namespace
 
 ProblemPlace placeInBook(const Error& error) { return placeBeneath("", error); }
+
+ProblemPlace placeInPage(const std::string& directory, const Error& error) {
+  return placeBeneath(directory, error);
+}

@@ -13,4 +13,7 @@ struct ProblemPlace {
   std::optional<std::int64_t> line;
 };
 
+/// Of an error that was met while the book was loaded.
 ProblemPlace placeInBook(const MarletFoundation::Error& error);
+/// Of an error that was met while the page at `directory`, relative to the book, was loaded.
+ProblemPlace placeInPage(const std::string& directory, const MarletFoundation::Error& error);

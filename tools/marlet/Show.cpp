@@ -3,6 +3,7 @@
 #include <iostream>
 
 #include "Document.h"
+#include "ErrorWords.h"
 #include "FatalProblem.h"
 #include "JSON.h"
 #include "MarletFoundation/MarletFoundation.h"
@@ -11,10 +12,6 @@ using namespace MarletFoundation;
 using nlohmann::ordered_json;
 
 namespace {
-
-ordered_json orNull(const std::optional<std::string>& text) {
-  return text ? ordered_json(*text) : ordered_json(nullptr);
-}
 
 /// Whether the page was ever passed; nothing for a page that keeps no record.
 std::optional<bool> passed(const BookPagePlaceholderSnapshot& page) {
@@ -102,10 +99,7 @@ ExitStatus show(const std::string& path, bool asJSON, const Terminal& terminal) 
     }
     return ExitStatus::good;
   } catch (const Error& error) {
-    const ErrorObject object(error);
-    const auto suggestion = object.localizedRecoverySuggestion();
-    terminal.complain(
-        printable(path + ": " + object.localizedDescription() + (suggestion ? ": " + *suggestion : "")));
+    terminal.complain(printable(path + ": " + wordsWithSuggestion(error)));
   } catch (const FatalProblem& fatal) {
     terminal.complain(printable(path + ": " + fatal.message));
   } catch (const NotRepresentable& reason) {

@@ -9,8 +9,11 @@
 #include "FatalProblem.h"
 #include "LearnerText.h"
 #include "MarletFoundation/MarletFoundation.h"
+#include "New.h"
+#include "Page.h"
 #include "PropertyListCommand.h"
 #include "Show.h"
+#include "TagsCommand.h"
 
 using namespace MarletFoundation;
 
@@ -24,8 +27,10 @@ void setUpLibrary(const Terminal& terminal) {
   registerUserVisibleError<AssessmentInformation::SerializationError>();
   registerUserVisibleError<AssessmentStatus::SerializationError>();
   auto environment = HostEnvironment::defaults();
-  environment.systemLog =
-      environment.diagnostics = [&terminal](std::string_view line) { terminal.note(printable(line)); };
+  environment.systemLog = [&terminal](std::string_view line) { terminal.note(printable(line)); };
+  environment.diagnostics = [&terminal](std::string_view line) {
+    if (terminal.verbose) terminal.note(printable(line));
+  };
   HostEnvironment::setCurrent(std::move(environment));
   setFatalErrorHandler(
       [](std::string_view message, const SourceLocation&) { throw FatalProblem{std::string(message)}; });
@@ -62,6 +67,54 @@ int run(int argc, char** argv) {
   showCommand->add_option("PATH", path, "The book")->required();
   showCommand->add_flag("--json", asJSON, "Show as JSON");
   showCommand->callback([&] { status = show(path, asJSON, terminal); });
+
+  auto* tagsCommand = app.add_subcommand(
+      "tags", "Show what the tags of a page's source make of each line, and their mistakes");
+  tagsCommand->add_option("FILE", paths, "Sources of pages")->required();
+  tagsCommand->add_flag("--json", asJSON, "Show tags, errors, editable ranges and placeholders as JSON");
+  tagsCommand->callback([&] { status = showTags(paths, asJSON, terminal); });
+
+  std::string chapter;
+  std::string name;
+  bool asText = false;
+  auto* pageCommand = app.add_subcommand("page", "Show a page as the learner has it before them");
+  pageCommand->add_option("BOOK", path, "The book")->required();
+  pageCommand->add_option("CHAPTER", chapter, "The chapter's directory name")->required();
+  pageCommand->add_option("PAGE", name, "The page's directory name")->required();
+  auto* textFlag = pageCommand->add_flag("--text", asText, "Print the source only");
+  pageCommand->add_flag("--json", asJSON, "Show as JSON")->excludes(textFlag);
+  pageCommand->callback([&] {
+    const auto output = asJSON ? PageOutput::json : asText ? PageOutput::text : PageOutput::summary;
+    status = showPage(path, chapter, name, output, terminal);
+  });
+
+  std::optional<std::string> bookName;
+  std::optional<std::string> identifier;
+  bool isCutscene = false;
+  auto* newCommand = app.add_subcommand("new", "Make a book, or add a page or a chapter to one");
+  auto* newPath = newCommand->add_option("BOOK", path, "The book to make, NAME.marletbook");
+  newCommand->add_option("--name", bookName, "The book's name; its file's by default");
+  newCommand->add_option("--identifier", identifier,
+                         "What identifies its content for good; random by default");
+  auto* newPageCommand = newCommand->add_subcommand("page", "Add a page at the end of a chapter");
+  newPageCommand->add_option("BOOK", path, "The book")->required();
+  newPageCommand->add_option("CHAPTER", chapter, "The chapter's directory name")->required();
+  newPageCommand->add_option("NAME", name, "The page's name")->required();
+  newPageCommand->add_flag("--cutscene", isCutscene, "A page that shows an asset, without code");
+  auto* newChapterCommand = newCommand->add_subcommand("chapter", "Add a chapter at the end of a book");
+  newChapterCommand->add_option("BOOK", path, "The book")->required();
+  newChapterCommand->add_option("NAME", name, "The chapter's name")->required();
+  newCommand->callback([&] {
+    if (newPageCommand->parsed()) {
+      status = makePage(path, chapter, name, isCutscene, terminal);
+    } else if (newChapterCommand->parsed()) {
+      status = makeChapter(path, name, terminal);
+    } else if (newPath->count() == 0) {
+      throw CLI::RequiredError("BOOK");
+    } else {
+      status = makeBook(path, bookName, identifier, terminal);
+    }
+  });
 
   auto form = PropertyListOutput::xml;
   std::string output = "-";

@@ -1,0 +1,160 @@
+#include <gtest/gtest.h>
+#include <rapidcheck.h>
+
+#include "MarletFoundation/Marlet/MarletBook.h"
+#include "MarletFoundation/Marlet/MarletBookPage.h"
+#include "MarletFoundation/Platform/HostEnvironment.h"
+#include "MarletFoundation/Platform/Text.h"
+#include "support/Documents.h"
+
+namespace MarletFoundation::test {
+namespace {
+
+const URL baseURL = URL::file("/books/Loops.marletbook", true);
+const std::string book = "Contents/Manifest.plist";
+
+std::string text() {
+  return *rc::gen::container<std::string>(rc::gen::oneOf(rc::gen::inRange('\n', '~'), rc::gen::just('"')));
+}
+std::optional<std::string> optionalText() {
+  return *rc::gen::arbitrary<bool>() ? std::optional(text()) : std::nullopt;
+}
+
+MarletHint hint() {
+  const auto title = optionalText();
+  return {MarletHint::Contents{text()},
+          title ? MarletHint::PresentationType(MarletHint::HiddenWithSpoilerInstruction{*title})
+                : MarletHint::AlwaysVisible{}};
+}
+
+MarletResultInfoSnapshot resultInfo() {
+  InlineResults results;
+  for (const auto line : *rc::gen::container<std::vector<std::int64_t>>(rc::gen::arbitrary<std::int64_t>()))
+    results.emplace(line, MarletInlineResultData(line, 0, MarletInlineResultData::Hidden{}));
+  std::optional<AssessmentInformation> assessment;
+  if (*rc::gen::arbitrary<bool>()) {
+    assessment.emplace(AssessmentStatus(AssessmentStatus::Fail{{text()}, optionalText()}),
+                       *rc::gen::arbitrary<bool>());
+  }
+  return {assessment, results};
+}
+
+MarletBookPageSnapshot page(const URL& url) {
+  const auto mode = *rc::gen::element(LiveViewMode::HiddenByDefault, LiveViewMode::VisibleByDefault);
+  const auto logging = *rc::gen::element(MarletLoggingMode::Normal, MarletLoggingMode::Off);
+  std::vector<MarletHint> hints;
+  for (int count = *rc::gen::inRange(0, 4); count > 0; --count) hints.push_back(hint());
+  return {text(),
+          optionalText(),
+          std::nullopt,
+          url.lastPathComponent(),
+          *utf16FromUTF8(text() + "🌊"),
+          resultInfo(),
+          std::nullopt,
+          std::nullopt,
+          std::nullopt,
+          mode,
+          *rc::gen::arbitrary<bool>(),
+          optionalText(),
+          logging,
+          hints};
+}
+
+std::string failure(const URL& url) {
+  try {
+    MarletBook::propertiesOfBookAtURL(url);
+    return "read";
+  } catch (const Error& error) {
+    return error.description();
+  }
+}
+
+}  // namespace
+
+TEST(LivePage, ReadOfAWriteIsThePage) {
+  const auto url = URL::file("/b/P.marletpage", true);
+  const auto former = HostEnvironment::current();
+  auto silent = former;
+  silent.diagnostics = [](std::string_view) {};
+  HostEnvironment::setCurrent(silent);
+  EXPECT_TRUE(rc::check("read . write = id", [&] {
+    const auto snapshot = page(url);
+    RC_ASSERT(MarletBookPageSnapshot(snapshot.fileWrapper(), url, std::nullopt) == snapshot);
+    RC_ASSERT(MarletBookPage(snapshot).snapshot() == snapshot);
+  }));
+  HostEnvironment::setCurrent(former);
+}
+
+TEST(LivePage, EditsDontShowInASnapshotAlreadyTaken) {
+  const MarletBookPageSnapshot original("N", {}, {}, "N.marletpage", u"one", {}, {}, {}, {}, {}, true, {}, {},
+                                        {});
+  const auto converted = original.convertToMutablePage();
+  auto& live = dynamic_cast<MarletBookPage&>(*converted);
+  const auto before = static_cast<const PageType&>(live).snapshot();
+  static_cast<const MarletPageType&>(live).contents().left()->get() += u" two";
+  live.resultInfo().trackInlineResultDataAt(3, 0);
+  live.setName("M");
+  EXPECT_TRUE(dynamic_cast<const MarletBookPageSnapshot&>(*before) == original);
+  EXPECT_EQ(before->name(), "N");
+  const auto after = live.snapshot();
+  EXPECT_EQ(after.name(), "M");
+  EXPECT_EQ(after.contents().right()->get(), u"one two");
+  EXPECT_EQ(after.resultInfo().inlineResults().size(), 1u);
+  EXPECT_FALSE(live.passed());
+  live.resultInfo().updateAssessmentInformation(AssessmentInformation(AssessmentStatus::Fail{}, true));
+  EXPECT_TRUE(live.passed());
+}
+
+TEST(LiveBook, SnapshotOfALiveBookIsTheBook) {
+  const MarletBookSnapshot snapshot(goodBook().wrapper(), baseURL);
+  MarletBook live(snapshot);
+  const auto again = live.snapshot();
+  EXPECT_EQ(again.manifest(), snapshot.manifest());
+  EXPECT_EQ(again.uniquifier, snapshot.uniquifier);
+  EXPECT_EQ(again.sourcesDirectoryURL, snapshot.sourcesDirectoryURL);
+  EXPECT_EQ(again.resourcesDirectoryURL, snapshot.resourcesDirectoryURL);
+  EXPECT_EQ(again.userResourcesDirectoryURL, snapshot.userResourcesDirectoryURL);
+  EXPECT_EQ(again.keyValueStore.contents(), snapshot.keyValueStore.contents());
+  ASSERT_EQ(again.chapters.size(), 2u);
+  EXPECT_EQ(again.chapters[0].manifest(), snapshot.chapters[0].manifest());
+  EXPECT_EQ(again.chapters[0].resourcesDirectoryURL, snapshot.chapters[0].resourcesDirectoryURL);
+  EXPECT_EQ(again.chapters[0].pages[0].pageDescription, "Page A");
+  EXPECT_EQ(again.chapters[0].pages[0].resultInfoSnapshot, snapshot.chapters[0].pages[0].resultInfoSnapshot);
+
+  live.chapters[0]->pages[0]->resultInfoSnapshot.reset();
+  live.chapters[1]->name = "Zwei";
+  EXPECT_TRUE(again.chapters[0].pages[0].resultInfoSnapshot);
+  EXPECT_EQ(live.snapshot().chapters[1].name, "Zwei");
+  live.chapters.clear();
+  EXPECT_EQ(*live.snapshot().manifest().dictionary()->find("Chapters"),
+            PropertyListValue(PropertyListValue::Array{}));
+}
+
+TEST(LiveBook, PropertiesOfABookThatNeedNotOpen) {
+  const TemporaryDirectory directory;
+  const auto read = [&](const Tree& tree) {
+    std::filesystem::remove_all(directory.path() / "B");
+    tree.writeTo(directory.path() / "B");
+    return failure(directory.url("B"));
+  };
+  const auto good = goodBook().withKey(book, "Version", 7).withKey(book, "ImageReference", 7);
+  EXPECT_EQ(read(good), "read");
+  const auto properties = MarletBook::propertiesOfBookAtURL(directory.url("B"));
+  EXPECT_EQ(properties.name, "Loops");
+  EXPECT_EQ(properties.bookDescription, "All of them");
+  EXPECT_EQ(properties.contentIdentifier, "org.example.loops");
+  EXPECT_EQ(properties.contentVersion, Version({1, 2}));
+  EXPECT_EQ(properties.imageReference, std::nullopt);
+  EXPECT_EQ(properties.resourcesDirectoryURL->path(), directory.url("B/Contents/Resources").path());
+
+  EXPECT_EQ(read(good.without(book)), "missingManifest");
+  EXPECT_EQ(read(good.with(book, PropertyListValue(PropertyListValue::Array{}))), "missingManifest");
+  EXPECT_EQ(read(good.withKey(book, "Name", 7).withKey(book, "ContentIdentifier", 7)), "missingName");
+  EXPECT_EQ(read(good.withKey(book, "ContentIdentifier", 7)), "missingContentIdentifier");
+  EXPECT_EQ(read(good.withKey(book, "ContentVersion", 1.5)), "missingContentVersion");
+  EXPECT_EQ(read(good.withKey(book, "ContentVersion", "1.x")), "invalidContentVersion(\"1.x\")");
+  read(good.without("Contents/Resources"));
+  EXPECT_FALSE(MarletBook::propertiesOfBookAtURL(directory.url("B")).resourcesDirectoryURL);
+}
+
+}  // namespace MarletFoundation::test

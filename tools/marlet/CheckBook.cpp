@@ -1,0 +1,90 @@
+#include "CheckBook.h"
+
+#include <set>
+
+#include "FatalProblem.h"
+#include "MarletFoundation/MarletFoundation.h"
+#include "PageWarnings.h"
+#include "TreePath.h"
+
+using namespace MarletFoundation;
+
+namespace {
+
+class BookCheck {
+ public:
+  explicit BookCheck(const Document& document)
+      : document_(document), book_(document.wrapper, document.url, pack_) {}
+
+  std::vector<Problem> run() && {
+    checkImage("book", "Contents", book_.imageReference);
+    std::set<std::string> listed;
+    for (const auto& chapter : book_.chapters) {
+      if (listed.insert(chapter.filename).second) checkChapter(chapter);
+    }
+    warnOfUnlisted("book.unlistedChapter", "chapter", "Contents/Chapters", listed);
+    return std::move(problems_);
+  }
+
+ private:
+  void checkChapter(const MarletChapterSnapshot& chapter) {
+    const auto directory = "Contents/Chapters/" + chapter.filename;
+    checkImage("chapter", directory, chapter.imageReference);
+    std::set<std::string> listed;
+    for (const auto& page : chapter.pages) {
+      if (listed.insert(page.filename).second) checkPage(chapter, page.filename, directory + "/Pages");
+    }
+    warnOfUnlisted("chapter.unlistedPage", "page", directory + "/Pages", listed);
+  }
+
+  void checkPage(const MarletChapterSnapshot& chapter, const std::string& filename,
+                 const std::string& pages) {
+    const auto directory = pages + "/" + filename;
+    try {
+      const auto page = snapshotForPageWithFilename(filename, chapter.filename, document_.url, &book_, pack_);
+      add(warningsOfPage(document_.wrapper, directory, *page));
+    } catch (const Error& error) {
+      problems_.push_back(problemOfPageLoad(error, directory));
+    } catch (const FatalProblem& fatal) {
+      problems_.push_back(problemOfFatalError(fatal.message));
+    }
+  }
+
+  void checkImage(const std::string& kind, const std::string& directory,
+                  const std::optional<std::string>& reference) {
+    add(warningsOfReference(document_.wrapper, directory, kind, "ImageReference", reference));
+  }
+
+  void warnOfUnlisted(const std::string& rule, const std::string& noun, const std::string& directory,
+                      const std::set<std::string>& listed) {
+    const auto node = nodeAt(document_.wrapper, directory);
+    const auto children = node ? node->fileWrappers() : std::nullopt;
+    if (!children) return;
+    for (const auto& [name, child] : *children) {
+      if (!child.isDirectory() || name.starts_with('.') || listed.contains(name)) continue;
+      problems_.push_back(warning(rule, "No manifest lists this " + noun + ", so no reader meets it.",
+                                  directory + "/" + name));
+    }
+  }
+
+  void add(std::vector<Problem> problems) {
+    problems_.insert(problems_.end(), problems.begin(), problems.end());
+  }
+
+  const Document& document_;
+  std::optional<DiffPackSnapshot> pack_;
+  MarletBookSnapshot book_;
+  std::vector<Problem> problems_;
+};
+
+}  // namespace
+
+std::vector<Problem> problemsOfBook(const Document& document) {
+  try {
+    return BookCheck(document).run();
+  } catch (const Error& error) {
+    return {problemOfBookLoad(error)};
+  } catch (const FatalProblem& fatal) {
+    return {problemOfFatalError(fatal.message)};
+  }
+}

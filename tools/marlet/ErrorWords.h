@@ -1,0 +1,11 @@
+#pragma once
+
+#include <string>
+
+#include "MarletFoundation/Platform/Error.h"
+
+/// What an error says in its own words, or, of one that has none, in those of its case:
+/// `InvalidLiveViewMode("x")` as `Invalid live view mode: "x"`.
+std::string wordsOf(const MarletFoundation::Error& error);
+/// The same with the error's recovery suggestion behind it.
+std::string wordsWithSuggestion(const MarletFoundation::Error& error);
