@@ -99,26 +99,30 @@ bool isLegalInLine(Case tag, const DocumentNode& node) {
 }
 
 template <class IsLegal>
-SourceTag::ParseResult walk(const std::vector<SourceTag::Located>& tags, const IsLegal& isLegal) {
+SourceTag::ParseResult walk(std::vector<SourceTag::Located> tags, const IsLegal& isLegal) {
   using TagError = SourceTag::ParseError;
   SourceTag::ParseResult result;
   const auto nodes = DocumentNode::nodes(tags);
+  auto end = tags.begin();
   for (std::size_t i = 0; i < nodes.size();) {
-    const auto& [range, tag] = tags[i];
-    const auto fail = [&, &range = range, &tag = tag](TagError::Case kind) {
-      result.errors.emplace_back(kind, range, tag);
+    const auto kind = tags[i].tag.kind();
+    const auto fail = [&](TagError::Case error) {
+      result.errors.emplace_back(error, tags[i].range, std::move(tags[i].tag));
       i = nodes[i].end;
     };
     if (!nodes[i].isComplete) {
       fail(TagError::Case::missingEndTag);
-    } else if (!isLegal(tag.kind(), nodes[i])) {
-      fail(role(tag.kind()).closes == Type::leaf ? TagError::Case::improperlyNestedTag
-                                                 : TagError::Case::missingStartTag);
+    } else if (!isLegal(kind, nodes[i])) {
+      fail(role(kind).closes == Type::leaf ? TagError::Case::improperlyNestedTag
+                                           : TagError::Case::missingStartTag);
     } else {
-      result.tags.push_back(tags[i]);
+      if (const auto tag = tags.begin() + static_cast<std::ptrdiff_t>(i); tag != end) *end = std::move(*tag);
+      ++end;
       ++i;
     }
   }
+  tags.erase(end, tags.end());
+  result.tags = std::move(tags);
   return result;
 }
 
@@ -144,13 +148,13 @@ std::vector<DocumentNode> DocumentNode::nodes(const std::vector<SourceTag::Locat
   return nodes;
 }
 
-SourceTag::ParseResult SourceTag::filterForOnlyValidTagsFor(const std::vector<Located>& tags) {
-  return walk(tags, isLegalInDocument);
+SourceTag::ParseResult SourceTag::filterForOnlyValidTagsFor(std::vector<Located> tags) {
+  return walk(std::move(tags), isLegalInDocument);
 }
 
 SourceTag::ParseResult validateInlineTagsFor(std::u16string_view line,
-                                             const std::vector<SourceTag::Located>& inlineTags) {
-  return walk(inlineTags, [&](Case tag, const DocumentNode& node) {
+                                             std::vector<SourceTag::Located> inlineTags) {
+  return walk(std::move(inlineTags), [&](Case tag, const DocumentNode& node) {
     if (SourceTag::isInlineTag(tag)) return isLegalInLine(tag, node);
     fatalError("Should not have received multiline tag while validating inline tags for line: " +
                utf8FromUTF16Lossy(line));

@@ -37,7 +37,7 @@ struct DocumentNode {
 
 /// The tags of one line that pair within it and stand in a legal place, and the errors of the others. A line
 /// tag among them is a fatal condition.
-SourceTag::ParseResult validateInlineTagsFor(std::u16string_view line,
-                                             const std::vector<SourceTag::Located>& inlineTags);
+MARLET_EXPORT SourceTag::ParseResult validateInlineTagsFor(std::u16string_view line,
+                                                           std::vector<SourceTag::Located> inlineTags);
 
 }  // namespace MarletFoundation

@@ -121,7 +121,7 @@ class MARLET_EXPORT SourceTag {
   static bool hasValidTags(std::u16string_view text);
   /// The tags, of those that a list in text order holds, that stand in a legal place, and the errors of the
   /// others.
-  static ParseResult filterForOnlyValidTagsFor(const std::vector<Located>& tags);
+  static ParseResult filterForOnlyValidTagsFor(std::vector<Located> tags);
 
   /// What an editor marks: line tags without those of copy destinations.
   static std::vector<Located> parseStringForLineTagsInSourceEditor(std::u16string_view text);

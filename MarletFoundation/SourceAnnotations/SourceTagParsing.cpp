@@ -23,7 +23,7 @@ SourceTag::ParseResult SourceTag::parseStringForTags(std::u16string_view text) {
 
 SourceTag::ParseResult SourceTag::parseStringForValidTags(std::u16string_view text) {
   auto scanned = parseStringForTags(text);
-  auto valid = filterForOnlyValidTagsFor(scanned.tags);
+  auto valid = filterForOnlyValidTagsFor(std::move(scanned.tags));
   std::move(valid.errors.begin(), valid.errors.end(), std::back_inserter(scanned.errors));
   return {std::move(valid.tags), std::move(scanned.errors)};
 }

@@ -202,7 +202,7 @@ void parseLineForInlineTags(const LineUnit& unit, SourceTag::ParseResult& result
       tags.push_back({range, {std::get<SourceTag::Payload>(std::move(parsed))}});
     }
   }
-  auto valid = validateInlineTagsFor(text, tags);
+  auto valid = validateInlineTagsFor(text, std::move(tags));
   std::move(valid.tags.begin(), valid.tags.end(), std::back_inserter(result.tags));
   std::move(valid.errors.begin(), valid.errors.end(), std::back_inserter(result.errors));
 }
@@ -221,13 +221,13 @@ LineUnit LineUnit::around(std::u16string_view text, std::size_t at) {
 
 void scanUnit(const LineUnit& unit, SourceTag::ParseResult& result) {
   const auto first = std::find_if_not(unit.text.begin(), unit.text.end(), isIndentation);
-  const auto lineTag = parseLineAsLineTag(unit, static_cast<std::size_t>(first - unit.text.begin()));
+  auto lineTag = parseLineAsLineTag(unit, static_cast<std::size_t>(first - unit.text.begin()));
   if (!lineTag) {
     parseLineForInlineTags(unit, result);
-  } else if (const auto* error = std::get_if<TagError>(&*lineTag)) {
-    result.errors.push_back(*error);
+  } else if (auto* error = std::get_if<TagError>(&*lineTag)) {
+    result.errors.push_back(std::move(*error));
   } else {
-    result.tags.push_back(std::get<SourceTag::Located>(*lineTag));
+    result.tags.push_back(std::get<SourceTag::Located>(std::move(*lineTag)));
   }
 }
 

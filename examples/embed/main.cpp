@@ -1,8 +1,10 @@
-// A host in small: opens a book, says how far its learner has come, and shows a page's text as the learner
-// sees it.
+// A host in small: opens a book, says how far its learner has come and which files they edited; or, for the
+// author, opens a page, writes a line under it and saves the book.
 #include <MarletFoundation/MarletFoundation.h>
 
 #include <iostream>
+
+#include "Saving.h"
 
 using namespace MarletFoundation;
 
@@ -27,11 +29,20 @@ void printEditedPages(const DiffPackSnapshot& edits) {
   }
 }
 
+void appendLine(const URL& bookURL, const std::string& chapterFilename, const std::string& pageFilename) {
+  const MarletBook book{MarletBookSnapshot(FileWrapper(bookURL), bookURL)};
+  const auto pageURL =
+      bookURL.appendingPathComponent("Contents/Chapters/" + chapterFilename + "/Pages/" + pageFilename, true);
+  const MarletBookPage page{MarletBookPageSnapshot(FileWrapper(pageURL), pageURL, std::nullopt)};
+  page.text() += u"// The end.\n";
+  embed::save(book.snapshot(), chapterFilename, page.snapshot(), bookURL);
+}
+
 }  // namespace
 
 int main(int argc, char** argv) {
-  if (argc != 2) {
-    std::cerr << "usage: embed BOOK\n";
+  if (argc != 2 && argc != 4) {
+    std::cerr << "usage: embed BOOK [CHAPTER PAGE]\n";
     return 2;
   }
   // A host registers the errors that it wants explained in words, and says where diagnostics go.
@@ -43,6 +54,7 @@ int main(int argc, char** argv) {
 
   try {
     const auto url = URL::file(argv[1], true);
+    if (argc == 4) appendLine(url, argv[2], argv[3]);
     std::optional<DiffPackSnapshot> edits;
     const MarletBookSnapshot book(FileWrapper(url), url, edits);
     std::cout << book.name << " " << book.contentVersion.versionString() << "\n";

@@ -4,7 +4,9 @@
 
 #include "FatalProblem.h"
 #include "MarletFoundation/MarletFoundation.h"
+#include "MarletFoundation/Platform/Text.h"
 #include "PageWarnings.h"
+#include "SourceCheck.h"
 #include "TreePath.h"
 
 using namespace MarletFoundation;
@@ -22,6 +24,7 @@ class BookCheck {
     for (const auto& chapter : book_.chapters) {
       if (listed.insert(chapter.filename).second) checkChapter(chapter);
     }
+    add(sources_.copyDestinations());
     warnOfUnlisted("book.unlistedChapter", "chapter", "Contents/Chapters", listed);
     return std::move(problems_);
   }
@@ -32,22 +35,34 @@ class BookCheck {
     checkImage("chapter", directory, chapter.imageReference);
     std::set<std::string> listed;
     for (const auto& page : chapter.pages) {
-      if (listed.insert(page.filename).second) checkPage(chapter, page.filename, directory + "/Pages");
+      if (listed.insert(page.filename).second) checkPage(chapter, page, directory + "/Pages");
     }
     warnOfUnlisted("chapter.unlistedPage", "page", directory + "/Pages", listed);
   }
 
-  void checkPage(const MarletChapterSnapshot& chapter, const std::string& filename,
+  void checkPage(const MarletChapterSnapshot& chapter, const BookPagePlaceholderSnapshot& placeholder,
                  const std::string& pages) {
-    const auto directory = pages + "/" + filename;
+    const auto directory = pages + "/" + placeholder.filename;
     try {
-      const auto page = snapshotForPageWithFilename(filename, chapter.filename, document_.url, &book_, pack_);
+      const auto page =
+          snapshotForPageWithFilename(placeholder.filename, chapter.filename, document_.url, &book_, pack_);
       add(warningsOfPage(document_.wrapper, directory, *page));
+      if (const auto* code = dynamic_cast<const MarletPageSnapshotType*>(page.get()))
+        checkSource(directory, *page, *code);
     } catch (const Error& error) {
       problems_.push_back(problemOfPageLoad(error, directory));
     } catch (const FatalProblem& fatal) {
       problems_.push_back(problemOfFatalError(fatal.message));
     }
+  }
+
+  void checkSource(const std::string& directory, const BookPageSnapshotType& page,
+                   const MarletPageSnapshotType& code) {
+    const auto file = nodeAt(document_.wrapper, directory + "/Contents.swift");
+    const auto data = file ? file->regularFileContents() : std::nullopt;
+    const auto filename = page.filename();
+    add(sources_.check(directory, {filename, filename.substr(0, filename.rfind('.')), page.name()},
+                       data ? utf16FromUTF8(data->view()) : std::nullopt, code.text()));
   }
 
   void checkImage(const std::string& kind, const std::string& directory,
@@ -74,6 +89,7 @@ class BookCheck {
   const Document& document_;
   std::optional<DiffPackSnapshot> pack_;
   MarletBookSnapshot book_;
+  SourceCheck sources_;
   std::vector<Problem> problems_;
 };
 

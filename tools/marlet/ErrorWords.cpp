@@ -1,14 +1,33 @@
 #include "ErrorWords.h"
 
+#include <map>
+
 #include "MarletFoundation/MarletFoundation.h"
 
 using namespace MarletFoundation;
 
 namespace {
 
+/// Names of cases that say too little as a sentence.
+const std::map<std::string_view, std::string_view> wordsOfCases{
+    {"MissingContentsFile", "There is no \"Contents.swift\""},
+    {"InvalidContentsFile", "The source is not valid UTF-8"},
+    {"ImageReferenceWithoutResources", "There is an \"ImageReference\", but no \"Resources\" directory"},
+    {"HintContentMissing", "A hint has neither \"Content\" nor \"FileReference\""},
+    {"HintContentReferenceWithoutResources",
+     "A hint has a \"FileReference\", but there is no \"Resources\" directory"},
+    {"HintContentReferenceMissingFile", "A hint's \"FileReference\" names no file in \"Resources\""},
+    {"InvalidHintContentFile", "The file of a hint is not valid UTF-8"},
+    {"MissingCutsceneAssetForLocalReference", "\"CutsceneReference\" names nothing that can be reached"},
+    {"CutsceneAssetReferencesWithoutResources",
+     "There is a \"CutsceneReference\", but no \"Resources\" directory"},
+};
+
 bool isCapital(char letter) { return letter >= 'A' && letter <= 'Z'; }
 
 std::string wordsOfCase(std::string_view name) {
+  if (const auto known = wordsOfCases.find(name); known != wordsOfCases.end())
+    return std::string(known->second);
   std::string words;
   for (const char letter : name) {
     if (isCapital(letter) && !words.empty()) words += ' ';
