@@ -116,10 +116,17 @@ class TreeWriter {
   }
 
   std::shared_ptr<DiskDirectory> originalDirectory(const Job& job, const std::string& name) {
+    return originalKind(job, name) == S_IFDIR ? DiskDirectory::child(job.original, SharedString(name))
+                                              : nullptr;
+  }
+
+  /// The kind of what the replaced document has at the same place; 0 when there is nothing.
+  mode_t originalKind(const Job& job, const std::string& name) {
     struct stat status;
-    if (!job.original || job.original->status(name.c_str(), status) != 0 || !S_ISDIR(status.st_mode))
-      return nullptr;
-    return DiskDirectory::child(job.original, SharedString(name));
+    if (!job.original) return 0;
+    if (job.original->status(name.c_str(), status) == 0) return status.st_mode & S_IFMT;
+    if (errno != ENOENT) fail(errno, *job.target, name);
+    return 0;
   }
 
   /// Lets the new document share a file that is as it was with the document it replaces.
@@ -171,12 +178,12 @@ class TreeWriter {
     }
   }
 
-  static Descriptor openOriginal(const Job& job, const std::string& name) {
-    struct stat status;
-    if (!job.original || job.original->status(name.c_str(), status) != 0 || !S_ISREG(status.st_mode)) {
-      return Descriptor();
-    }
-    return job.original->open(name.c_str());
+  /// The file whose attributes a new one takes over, if there is one that we may read.
+  Descriptor openOriginal(const Job& job, const std::string& name) {
+    if (originalKind(job, name) != S_IFREG) return Descriptor();
+    auto original = job.original->open(name.c_str());
+    if (!original && errno != EACCES) fail(errno, *job.target, name);
+    return original;
   }
 
   void copyLink(DiskDirectory& target, const std::string& name, FileNode& link) {

@@ -28,7 +28,7 @@ class Application {
       error_ = failure.sentence;
     } catch (const Error& error) {
       status = ExitStatus::negative;
-      error_ = path_ + ": " + inWords(error);
+      error_ = path_ + ": " + wordsWithSuggestion(error);
     }
     if (options_.asJSON) {
       printJSON();

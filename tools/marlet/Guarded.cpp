@@ -1,16 +1,9 @@
 #include "Guarded.h"
 
-#include "ErrorWords.h"
 #include "FatalProblem.h"
 #include "JSON.h"
-#include "MarletFoundation/Platform/ErrorObject.h"
 
 using namespace MarletFoundation;
-
-std::string inWords(const Error& error) {
-  const auto suggestion = ErrorObject(error).localizedRecoverySuggestion();
-  return wordsOf(error) + (suggestion ? ": " + *suggestion : "");
-}
 
 ExitStatus guarded(const std::string& path, const Terminal& terminal,
                    const std::function<ExitStatus()>& work) {
@@ -22,7 +15,7 @@ ExitStatus guarded(const std::string& path, const Terminal& terminal,
     status = failure.status;
     sentence = failure.sentence;
   } catch (const Error& error) {
-    sentence = path + ": " + inWords(error);
+    sentence = path + ": " + wordsWithSuggestion(error);
   } catch (const FatalProblem& fatal) {
     sentence = path + ": " + fatal.message;
   } catch (const NotRepresentable& reason) {

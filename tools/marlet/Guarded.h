@@ -3,8 +3,8 @@
 #include <functional>
 #include <string>
 
+#include "ErrorWords.h"
 #include "ExitStatus.h"
-#include "MarletFoundation/Platform/Error.h"
 #include "Terminal.h"
 
 /// What ends a command: a sentence and a status.
@@ -12,9 +12,6 @@ struct CommandFailure {
   ExitStatus status;
   std::string sentence;
 };
-
-/// An error's words for the user, with its suggestion.
-std::string inWords(const MarletFoundation::Error& error);
 
 /// Runs a command's work, and complains about what it throws; a library error or a fatal condition of the
 /// document at `path` ends in `ExitStatus::negative`.
@@ -27,6 +24,6 @@ auto orFailWith(ExitStatus status, const std::string& path, Work work) {
   try {
     return work();
   } catch (const MarletFoundation::Error& error) {
-    throw CommandFailure{status, path + ": " + inWords(error)};
+    throw CommandFailure{status, path + ": " + wordsWithSuggestion(error)};
   }
 }

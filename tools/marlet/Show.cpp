@@ -99,7 +99,7 @@ ExitStatus show(const std::string& path, bool asJSON, const Terminal& terminal) 
     }
     return ExitStatus::good;
   } catch (const Error& error) {
-    terminal.complain(printable(path + ": " + inWords(error)));
+    terminal.complain(printable(path + ": " + wordsWithSuggestion(error)));
   } catch (const FatalProblem& fatal) {
     terminal.complain(printable(path + ": " + fatal.message));
   } catch (const NotRepresentable& reason) {

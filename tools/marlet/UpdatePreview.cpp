@@ -6,6 +6,7 @@
 #include "MarletDiff/ContentMerge.h"
 
 #include "MarletFoundation/Platform/Text.h"
+#include "TreePath.h"
 
 using namespace MarletFoundation;
 using nlohmann::ordered_json;
@@ -14,14 +15,6 @@ namespace {
 
 using MarletDiff::FileDiffDescriptor;
 using Edit = UpdatePreview::Edit;
-
-bool isInContents(const Book& book, const std::string& path) {
-  std::optional<FileWrapper> node = book.document.wrapper.child("Contents");
-  for (const auto name : split(path, '/')) {
-    if (node && !name.empty()) node = node->child(name);
-  }
-  return node.has_value();
-}
 
 /// What a conflict's error tells; nothing for any other error of a merge.
 std::optional<UpdatePreview::Conflict> conflictOf(const ErrorObject& error, std::u16string_view text) {
@@ -68,7 +61,8 @@ Edit previewOf(const Book& book, const FileDiffDescriptor& userEdit, const DiffP
 UpdatePreview::UpdatePreview(const Book& book, const DiffPackSnapshot& update) {
   for (const auto& entry : update.updates) {
     const bool isRemoved = std::holds_alternative<FileDiffDescriptor::Removed>(entry.change);
-    files.push_back({entry.filePath(), kindName(entry), isRemoved && isInContents(book, entry.filePath())});
+    files.push_back({entry.filePath(), kindName(entry),
+                     isRemoved && nodeAt(book.document.wrapper, "Contents/" + entry.filePath())});
   }
   if (!book.userEdits) return;
   for (const auto& userEdit : book.userEdits->updates) edits.push_back(previewOf(book, userEdit, update));
