@@ -16,13 +16,15 @@ SourceEditorRange SourceEditorUTF16RangeConverter::sourceEditorRangeFromRange(co
   return {start, end};
 }
 
-OffsetRange SourceEditorUTF16RangeConverter::rangeFromSourceEditorRange(const SourceEditorRange& range) const {
+OffsetRange SourceEditorUTF16RangeConverter::rangeFromSourceEditorRange(
+    const SourceEditorRange& range) const {
   const auto text = buffer();
   const auto lower = text->indexFromPosition(range.start);
   return {lower, text->indexFromPosition(range.end)};
 }
 
-SourceEditorPosition SourceEditorUTF16RangeConverter::sourceEditorPositionFromIndex(std::int64_t index) const {
+SourceEditorPosition SourceEditorUTF16RangeConverter::sourceEditorPositionFromIndex(
+    std::int64_t index) const {
   return buffer()->positionFromIndex(index, lastLine_);
 }
 

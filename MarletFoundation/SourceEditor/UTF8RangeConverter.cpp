@@ -55,8 +55,7 @@ ConvertedIndex advanced(const InlineBuffer& text, ConvertedIndex at, std::int64_
     if (text.endIndex - at.utf16Index > blockUnits) {
       const auto* units = text.units + at.utf16Index;
       if (isASCII(units)) {
-        const auto count =
-            std::min({blockUnits, utf8Limit - at.utf8Index, utf16Limit - at.utf16Index});
+        const auto count = std::min({blockUnits, utf8Limit - at.utf8Index, utf16Limit - at.utf16Index});
         at.utf8Index += count;
         at.utf16Index += count;
         continue;
