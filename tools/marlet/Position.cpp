@@ -4,6 +4,7 @@
 
 #include "Guarded.h"
 #include "JSON.h"
+#include "MarletFoundation/MarletFoundation.h"
 #include "MarletFoundation/Platform/Text.h"
 
 using namespace MarletFoundation;
