@@ -10,6 +10,7 @@
 #include "MarletFoundation/MarletFoundation.h"
 #include "New.h"
 #include "Page.h"
+#include "Position.h"
 #include "PropertyListCommand.h"
 #include "Show.h"
 #include "TagsCommand.h"
@@ -183,6 +184,37 @@ int run(int argc, char** argv) {
   editsCommand->add_option("BOOK", path, "The book")->required();
   editsCommand->add_flag("--json", asJSON, "List as JSON");
   editsCommand->callback([&] { status = listEdits(path, asJSON, terminal); });
+
+  std::vector<std::string> utf8Offsets, utf16Offsets, linesAndColumns;
+  auto* positionCommand = app.add_subcommand("position", "Show places of a text in all schemes of offsets");
+  positionCommand->add_option("FILE", path, "A text in UTF-8")->required();
+  const auto addPlaces = [&](const char* flag, std::vector<std::string>& values, const char* type,
+                             const char* help, AskedPlace::Scheme scheme) {
+    return positionCommand->add_option(flag, values, help)
+        ->type_name(type)
+        ->allow_extra_args(false)
+        ->check([scheme, type](const std::string& value) {
+          return isWellFormed({scheme, value}) ? std::string() : value + " is no " + type;
+        });
+  };
+  using Scheme = AskedPlace::Scheme;
+  auto* utf8Option = addPlaces("--utf8", utf8Offsets, "N", "An offset in bytes, from 0", Scheme::utf8);
+  auto* utf16Option =
+      addPlaces("--utf16", utf16Offsets, "N", "An offset in UTF-16 units, from 0", Scheme::utf16);
+  auto* atOption = addPlaces("--at", linesAndColumns, "LINE:COLUMN",
+                             "A line and a column in UTF-16 units, from 1", Scheme::lineAndColumn);
+  positionCommand->add_flag("--json", asJSON, "Show as JSON");
+  positionCommand->callback([&] {
+    std::vector<AskedPlace> places;
+    auto utf8 = utf8Offsets.begin(), utf16 = utf16Offsets.begin(), at = linesAndColumns.begin();
+    for (const auto* option : positionCommand->parse_order()) {
+      if (option == utf8Option) places.push_back({Scheme::utf8, *utf8++});
+      if (option == utf16Option) places.push_back({Scheme::utf16, *utf16++});
+      if (option == atOption) places.push_back({Scheme::lineAndColumn, *at++});
+    }
+    if (places.empty()) throw CLI::RequiredError("--utf8, --utf16 or --at");
+    status = showPositions(path, places, asJSON, terminal);
+  });
 
   app.parse_complete_callback([&] { setUpLibrary(terminal); });
   try {

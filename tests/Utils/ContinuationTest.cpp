@@ -1,0 +1,97 @@
+#include "MarletFoundation/Utils/Continuation.h"
+
+#include <gtest/gtest.h>
+
+#include <thread>
+
+#include "MarletFoundation/Platform/Host.h"
+#include "MarletFoundation/SourceEditor/CodeCompletion.h"
+#include "MarletFoundation/Utils/ContinuationScheduler.h"
+#include "MarletFoundation/Utils/TimeoutContinuation.h"
+
+namespace MarletFoundation::test {
+namespace {
+
+using Work = Continuation<Unit>;
+
+TEST(Continuation, ChainsAndStopsAtTheFirstFailure) {
+  std::string ran;
+  const auto step = [&](char name) {
+    return Continuation<int>([&ran, name] {
+      ran += name;
+      return int{name};
+    });
+  };
+  const auto failing = Continuation<int>::fail().flatMap([&](int) { return step('x'); });
+  EXPECT_EQ(failing.run(), std::nullopt);
+  EXPECT_EQ(sequence<int>({step('a'), Continuation<int>::fail(), step('c')}).run(), std::nullopt);
+  EXPECT_EQ(ran, "a");
+  EXPECT_EQ(sequence<int>({step('p'), step('q')}).run(), (std::vector<int>{'p', 'q'}));
+  EXPECT_EQ(sequence<int>({}).run(), std::vector<int>());
+  EXPECT_TRUE(sequence_<int>({}).run());
+}
+
+TEST(Continuation, SchedulerRunsTheLastOfAName) {
+  std::string ran;
+  ContinuationScheduler scheduler(true);
+  scheduler.scheduleContinuationWithName("one", [&] { ran += 'a'; });
+  scheduler.scheduleContinuationWithName("one", [&] {
+    ran += 'b';
+    scheduler.scheduleContinuationWithName("one", [&] { ran += 'c'; });
+  });
+  EXPECT_EQ(ran, "");
+  EXPECT_TRUE(runMainQueueUntil([&] { return ran == "bc"; }, 10));
+}
+
+TEST(Continuation, TimeoutFiresOnceAfterTheLastReset) {
+  int fired = 0;
+  TimeoutContinuation timeout(0.05, [&] { ++fired; });
+  timeout.resetTimeout();
+  timeout.cancel();
+  runMainQueueUntil([] { return false; }, 0.1);
+  EXPECT_EQ(fired, 0);
+  timeout.resetTimeout();
+  timeout.resetTimeout();
+  EXPECT_TRUE(runMainQueueUntil([&] { return fired == 1; }, 10));
+  runMainQueueUntil([] { return false; }, 0.1);
+  EXPECT_EQ(fired, 1);
+  std::make_unique<TimeoutContinuation>(0.01, [&] { ++fired; })->resetTimeout();
+  runMainQueueUntil([] { return false; }, 0.1);
+  EXPECT_EQ(fired, 1);
+}
+
+struct Editor final : SourceEditorCodeCompletionDelegate {
+  std::string heard;
+  std::int64_t maxCompletions() const override { return 7; }
+  Work suggestionsOffered(const SourceEditorCodeCompletionSuggestions& suggestions, const std::string& token,
+                          bool definitive) override {
+    heard +=
+        token + std::to_string(suggestions.size()) + (definitive ? "!" : "?") + (isMainThread() ? "m" : "");
+    return Work([this] { return heard += ".", Unit(); });
+  }
+  Work completionUnavailable(const std::string& token) override {
+    heard += token + "-";
+    return Work::nothing();
+  }
+};
+
+TEST(CodeCompletionResponder, AnswersOnTheMainThreadAndIsSilentWhenTheRequesterIsGone) {
+  auto editor = std::make_shared<Editor>();
+  const SourceEditorCodeCompletionResponder responder("T", editor);
+  EXPECT_EQ(responder.maxCompletions(), 7);
+  responder.offerSuggestions(SourceEditorCodeCompletionSuggestions(9));
+  std::thread([&] {
+    responder.offerSuggestions(SourceEditorCodeCompletionSuggestions(2), true).run();
+    responder.completionUnavailable().run();
+  }).join();
+  EXPECT_EQ(editor->heard, "");
+  EXPECT_TRUE(runMainQueueUntil([&] { return editor->heard.ends_with('-'); }, 10));
+  EXPECT_EQ(editor->heard, "T2!m.T-");
+  editor.reset();
+  EXPECT_EQ(responder.maxCompletions(), 0);
+  EXPECT_TRUE(responder.completionUnavailable().run());
+  runMainQueueUntil([] { return false; }, 0.02);
+}
+
+}  // namespace
+}  // namespace MarletFoundation::test
