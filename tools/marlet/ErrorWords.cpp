@@ -49,3 +49,8 @@ std::string wordsOf(const Error& error) {
   if (payload->error) words += ": " + wordsOf(*payload->error);
   return words;
 }
+
+std::string wordsWithSuggestion(const Error& error) {
+  const auto suggestion = ErrorObject(error).localizedRecoverySuggestion();
+  return wordsOf(error) + (suggestion ? ": " + *suggestion : "");
+}

@@ -7,3 +7,5 @@
 /// What an error says in its own words, or, of one that has none, in those of its case:
 /// `InvalidLiveViewMode("x")` as `Invalid live view mode: "x"`.
 std::string wordsOf(const MarletFoundation::Error& error);
+/// The same, followed by the recovery suggestion where there is one.
+std::string wordsWithSuggestion(const MarletFoundation::Error& error);
