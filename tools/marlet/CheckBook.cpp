@@ -51,17 +51,23 @@ class BookCheck {
         checkSource(directory, *page, *code);
     } catch (const Error& error) {
       problems_.push_back(problemOfPageLoad(error, directory));
+      sources_.pass(referencesTo(placeholder.filename, placeholder.name));
     } catch (const FatalProblem& fatal) {
       problems_.push_back(problemOfFatalError(fatal.message));
+      sources_.pass(referencesTo(placeholder.filename, placeholder.name));
     }
+  }
+
+  /// What sources may call a page: its directory, with or without the extension, or its name.
+  static std::vector<std::string> referencesTo(const std::string& filename, const std::string& name) {
+    return {filename, filename.substr(0, filename.rfind('.')), name};
   }
 
   void checkSource(const std::string& directory, const BookPageSnapshotType& page,
                    const MarletPageSnapshotType& code) {
     const auto file = nodeAt(document_.wrapper, directory + "/Contents.swift");
     const auto data = file ? file->regularFileContents() : std::nullopt;
-    const auto filename = page.filename();
-    add(sources_.check(directory, {filename, filename.substr(0, filename.rfind('.')), page.name()},
+    add(sources_.check(directory, referencesTo(page.filename(), page.name()),
                        data ? utf16FromUTF8(data->view()) : std::nullopt, code.text()));
   }
 

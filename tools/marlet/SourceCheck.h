@@ -17,6 +17,8 @@ class SourceCheck {
   /// other pages may call it.
   std::vector<Problem> check(const std::string& directory, const std::vector<std::string>& references,
                              const std::optional<std::u16string>& authored, const std::u16string& learners);
+  /// A page that can't be read: nobody knows what it offers, so its copy sources are not missed.
+  void pass(const std::vector<std::string>& references);
   /// The copy destinations of all pages that can't be filled from any of them.
   std::vector<Problem> copyDestinations() const;
 
@@ -29,5 +31,6 @@ class SourceCheck {
   CopySourceLookup find(std::string_view page, std::string_view identifier) const;
 
   std::map<std::string, std::set<std::string>, std::less<>> copySources_;  // by reference
+  std::set<std::string, std::less<>> unread_;
   std::vector<Source> withDestinations_;
 };
