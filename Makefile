@@ -43,7 +43,7 @@ embed: marlet
 	scripts/test-install
 
 format:
-	clang-format -i $(sources)
+	@clang-format -i $(sources)
 
 check-format:
-	clang-format --dry-run -Werror $(sources)
+	@clang-format --dry-run -Werror $(sources)
