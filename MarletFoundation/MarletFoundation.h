@@ -30,6 +30,7 @@
 #include "MarletFoundation/Marlet/MarletBook.h"
 #include "MarletFoundation/Marlet/MarletBookPage.h"
 #include "MarletFoundation/Marlet/MarletResultInfo.h"
+#include "MarletFoundation/PathUtilities/DocumentNames.h"
 #include "MarletFoundation/PathUtilities/PathUniquifier.h"
 #include "MarletFoundation/PathUtilities/URLExtensions.h"
 #include "MarletFoundation/Platform/DispatchQueue.h"
