@@ -24,7 +24,7 @@ test:
 asan tsan:
 	scripts/install-dependencies --develop
 	$(call configure,$@)
-	cmake --build --preset $@
+	cmake --build --preset $@ --target marlet_tests
 	build/$@/bin/marlet_tests --gtest_brief=1
 
 bench:
@@ -35,8 +35,8 @@ bench:
 
 fuzz:
 	scripts/install-dependencies --develop
-	$(call configure,fuzz)
-	cmake --build --preset fuzz
+	$(call configure,asan)
+	cmake --build --preset asan --target fuzzers
 	fuzz/run $(FUZZ_SECONDS)
 
 embed: marlet
