@@ -76,6 +76,9 @@ class BinaryReader {
 };
 
 void BinaryReader::read() {
+  // Reading hops from the end to the table to the objects: a small list comes into the cache at once.
+  for (std::size_t i = 0; i < std::min<std::size_t>(bytes_.size(), 2048); i += 64)
+    __builtin_prefetch(bytes_.data() + i);
   readTrailer();
   nodesLeft_ = 4 * bytes_.size() + 1024;
   textLeft_ = 16 * bytes_.size() + 65536;
