@@ -35,7 +35,7 @@ class MARLET_EXPORT MarletParser final : public XMLParser::Delegate {
       : fileWrapper_(std::move(fileWrapper)), baseURL_(std::move(baseURL)) {}
 
   /// Throws the `ErrorObject` of the first failure: of `MarletSerializationErrorDomain`, or the XML parser's
-  /// own. A `sections` element without any `code` is a fatal error. Sources of more than 2^30
+  /// own. A `sections` element without any `code` is a fatal error. Sources of more than 2^28
   /// UTF-16 units together are refused as one that can't be read.
   Document parse();
 
@@ -90,7 +90,7 @@ class MARLET_EXPORT MarletParser final : public XMLParser::Delegate {
   std::vector<ParserState> stateStack_;
   std::optional<ErrorObject> parseError_;
   /// A manifest may name one large source thousands of times; so what is read is counted.
-  std::size_t sourceUnitsLeft_ = std::size_t{1} << 30;
+  std::size_t sourceUnitsLeft_ = std::size_t{1} << 28;
 };
 
 }  // namespace MarletFoundation
