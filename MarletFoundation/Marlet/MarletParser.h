@@ -41,6 +41,8 @@ class MARLET_EXPORT MarletParser final : public XMLParser::Delegate {
 
   /// Whether the document is of version 4 or less; nothing before the root element has been seen.
   std::optional<bool> isOldStyleMarlet() const { return isOldStyleMarlet_; }
+  /// Whether the one page was assembled from sections.
+  bool didJoinSections() const { return singlePageMarletContents_.has_value(); }
   std::int64_t majorVersion() const { return majorVersion_; }
   std::int64_t minorVersion() const { return minorVersion_; }
 

@@ -4,6 +4,7 @@
 #include <iostream>
 
 #include "CheckBook.h"
+#include "CheckMarlet.h"
 #include "Document.h"
 #include "JSON.h"
 #include "MarletFoundation/MarletFoundation.h"
@@ -24,13 +25,6 @@ struct Report {
   }
 };
 
-Problem problem(std::string rule, std::string description) {
-  Problem result;
-  result.rule = std::move(rule);
-  result.description = std::move(description);
-  return result;
-}
-
 Report report(const std::string& path) {
   Report report{path, "unknown", true, {}};
   try {
@@ -42,11 +36,12 @@ Report report(const std::string& path) {
         break;
       case DocumentKind::classic:
         report.kind = "classic";
-        report.problems = {
-            problem("classic.unsupported", "Classic documents are not checked by this version.")};
+        report.problems = problemsOfMarlet(document);
         break;
       case DocumentKind::unknown:
-        report.problems = {problem("document.unknownKind", "This is neither a book nor a classic document.")};
+        report.problems.emplace_back();
+        report.problems[0].rule = "document.unknownKind";
+        report.problems[0].description = "This is neither a book nor a classic document.";
         break;
     }
   } catch (const Error& error) {
