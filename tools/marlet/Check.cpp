@@ -6,6 +6,7 @@
 #include "CheckBook.h"
 #include "CheckMarlet.h"
 #include "Document.h"
+#include "ErrorWords.h"
 #include "JSON.h"
 #include "MarletFoundation/MarletFoundation.h"
 
@@ -65,7 +66,7 @@ void print(const Report& report, const Problem& problem, const Terminal& termina
   if (problem.line) place += ":" + std::to_string(*problem.line);
   if (problem.line && problem.column) place += ":" + std::to_string(*problem.column);
   auto text = problem.description;
-  if (problem.recoverySuggestion) text += ": " + *problem.recoverySuggestion;
+  if (problem.recoverySuggestion) text += suggested(text, *problem.recoverySuggestion);
   const auto style = problem.severity == "error" ? Terminal::Style::red : Terminal::Style::yellow;
   std::cout << terminal.styled(Terminal::Style::bold, printable(place) + ":") << " "
             << terminal.styled(style, problem.severity + ":") << " " << printable(text) << " "

@@ -33,9 +33,7 @@ void requireReadable(const MarletSnapshot& marlet) {
 FileWrapper currentForm(const MarletSnapshot& marlet, const std::string& path, const URL& url) {
   const auto isUnnamed = [](const MarletPageSnapshot& page) { return !page.name(); };
   if (!marlet.isSinglePage() && std::any_of(marlet.pages.begin(), marlet.pages.end(), isUnnamed))
-    refuse(path,
-           "The page has no name, which only a document without a \"Pages\" directory, or one whose "
-           "\"Sources\" and \"Resources\" are the page's, can be written with.");
+    refuse(path, "Its page has no name, but where sources or resources are shared every page needs one.");
   auto tree = marlet.fileWrapper();
   const MarletSnapshot mustOpen(tree, url);
   return tree;
@@ -66,7 +64,7 @@ ExitStatus convert(const std::string& path, const std::string& output, bool forc
         std::to_string(manifest.majorVersion()) + "." + std::to_string(manifest.minorVersion());
     terminal.note(printable("read " + path + ": version " + version + ", " +
                             (manifest.didJoinSections() ? "its sections joined in one page"
-                                                          : counted(marlet.pages.size(), "page"))));
+                                                        : counted(marlet.pages.size(), "page"))));
     writeTree(makesBook ? bookOfMarlet(marlet, path, url) : currentForm(marlet, path, url), url);
     const std::string form = makesBook ? "a book" : marlet.isSinglePage() ? "version 5.0" : "version 6.0";
     terminal.note(printable("wrote " + output + ": " + form + ", " + counted(marlet.pages.size(), "page")));
