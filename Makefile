@@ -39,7 +39,10 @@ fuzz:
 	cmake --build --preset asan --target fuzzers
 	fuzz/run $(FUZZ_SECONDS)
 
-embed: marlet
+embed:
+	scripts/install-dependencies
+	$(call configure,debug)
+	cmake --build --preset debug
 	scripts/test-install
 
 format:

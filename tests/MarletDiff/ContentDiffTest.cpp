@@ -159,7 +159,7 @@ TEST(ContentDiff, StaysBetweenMarkers) {
 /// Texts that a search for the fewest hunks would take hours over.
 TEST(ContentDiff, FarApartTextsCostNoMoreThanTheirLength) {
   std::u16string numbers, others, ab, ba, flags(600'000, u'\0');
-  for (int i = 0; i < 300'000; ++i) {
+  for (std::int64_t i = 0; i < 300'000; ++i) {
     const auto number = std::to_string(i);
     const std::u16string digits(number.begin(), number.end());
     numbers += digits + u"\n";
