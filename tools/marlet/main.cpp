@@ -4,6 +4,7 @@
 
 #include "ApplyCommand.h"
 #include "Check.h"
+#include "Convert.h"
 #include "EditCommand.h"
 #include "FatalProblem.h"
 #include "LearnerText.h"
@@ -25,6 +26,7 @@ namespace {
 void setUpLibrary(const Terminal& terminal) {
   registerUserVisibleError<MarletBookSnapshot::SerializationError>();
   registerUserVisibleError<MarletChapterSnapshot::SerializationError>();
+  registerUserVisibleError<MarletSnapshot::SerializationError>();
   registerUserVisibleError<AssessmentInformation::SerializationError>();
   registerUserVisibleError<AssessmentStatus::SerializationError>();
   auto environment = HostEnvironment::defaults();
@@ -64,8 +66,8 @@ int run(int argc, char** argv) {
 
   std::string path;
   auto* showCommand =
-      app.add_subcommand("show", "Show a book's table of contents, with marks at the passed pages");
-  showCommand->add_option("PATH", path, "The book")->required();
+      app.add_subcommand("show", "Show a document's table of contents, with marks at the passed pages");
+  showCommand->add_option("PATH", path, "The document")->required();
   showCommand->add_flag("--json", asJSON, "Show as JSON");
   showCommand->callback([&] { status = show(path, asJSON, terminal); });
 
@@ -116,6 +118,16 @@ int run(int argc, char** argv) {
       status = makeBook(path, bookName, identifier, terminal);
     }
   });
+
+  std::string converted;
+  bool force = false;
+  auto* convertCommand =
+      app.add_subcommand("convert", "Write a classic document in its current form, or make a book of it");
+  convertCommand->add_option("DOCUMENT", path, "The classic document, of any version")->required();
+  convertCommand->add_option("-o,--output", converted, "What to write: OUT.marlet or OUT.marletbook")
+      ->required();
+  convertCommand->add_flag("--force", force, "Replace what lies there");
+  convertCommand->callback([&] { status = convert(path, converted, force, terminal); });
 
   auto form = PropertyListOutput::xml;
   std::string output = "-";
