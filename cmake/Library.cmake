@@ -8,6 +8,12 @@ add_library(MarletDiff OBJECT ${MARLET_DIFF_SOURCES})
 target_include_directories(MarletDiff PRIVATE ${CMAKE_SOURCE_DIR})
 target_link_libraries(MarletDiff PRIVATE marlet_options ICU::uc)
 
+# So is the archive copier, and only it sees libarchive.
+file(GLOB ARC_COPIER_SOURCES CONFIGURE_DEPENDS ${CMAKE_SOURCE_DIR}/ArcCopier/*.cpp)
+add_library(ArcCopier OBJECT ${ARC_COPIER_SOURCES})
+target_include_directories(ArcCopier PRIVATE ${CMAKE_SOURCE_DIR})
+target_link_libraries(ArcCopier PRIVATE marlet_options LibArchive::LibArchive)
+
 add_library(MarletFoundation SHARED ${MARLET_SOURCES})
 add_library(MarletFoundation::MarletFoundation ALIAS MarletFoundation)
 set_target_properties(MarletFoundation PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${PROJECT_VERSION_MAJOR})
@@ -20,5 +26,6 @@ target_compile_definitions(
 # The library's own calls of what it exports go straight there.
 target_compile_options(MarletFoundation PRIVATE -fno-semantic-interposition)
 target_link_options(MarletFoundation PRIVATE -Wl,-Bsymbolic-functions)
-target_link_libraries(MarletFoundation PRIVATE $<BUILD_INTERFACE:marlet_options> $<BUILD_INTERFACE:MarletDiff> ICU::i18n ICU::uc
+target_link_libraries(MarletFoundation PRIVATE $<BUILD_INTERFACE:marlet_options> $<BUILD_INTERFACE:MarletDiff>
+                                               $<BUILD_INTERFACE:ArcCopier> LibArchive::LibArchive ICU::i18n ICU::uc
                                                LibXml2::LibXml2 OpenSSL::Crypto uriparser::uriparser Threads::Threads)

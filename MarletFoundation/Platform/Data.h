@@ -3,6 +3,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <span>
 #include <string>
 #include <string_view>
@@ -11,6 +12,8 @@
 #include "MarletFoundation/Platform/Export.h"
 
 namespace MarletFoundation {
+
+class URL;
 
 /// Immutable bytes. Copies and slices share one buffer and keep it alive.
 class MARLET_EXPORT Data {
@@ -30,6 +33,12 @@ class MARLET_EXPORT Data {
 
   /// The `count` bytes from `offset` on, sharing the buffer. Both must lie within the data.
   Data slice(std::size_t offset, std::size_t count) const { return {owner_, bytes_.subspan(offset, count)}; }
+
+  /// The 20-byte SHA-1 digest of the bytes. To tell contents apart, not for security.
+  Data mlf_SHA1Digest() const;
+  /// The digest of a file's contents, which are mapped (`FileManager::mapFile`), or nothing if it can't be
+  /// read.
+  static std::optional<Data> mlf_SHA1DigestForURL(const URL& url);
 
   bool operator==(const Data& other) const { return view() == other.view(); }
 

@@ -1,8 +1,10 @@
 #pragma once
 
+#include <functional>
 #include <optional>
 
 #include "MarletFoundation/Platform/Data.h"
+#include "MarletFoundation/Platform/ErrorObject.h"
 #include "MarletFoundation/Platform/URL.h"
 
 /// Questions to the file system and whole-file reads and writes. Failures are thrown as `ErrorObject`s of the
@@ -34,5 +36,18 @@ MARLET_EXPORT Data readFile(const URL& url);
 /// and extended attributes of a replaced file stay; a symbolic link stays and what it points to is replaced.
 /// Only regular files are (EISDIR, EINVAL). Leaves nothing behind when it throws.
 MARLET_EXPORT void writeFileAtomically(const URL& url, const Data& contents);
+
+/// The bytes of a regular file, mapped instead of read in: for one pass over a file of any size. They are the
+/// file's and not a copy: what another process writes shows, and a process that looks at bytes which the file
+/// has lost in between is stopped (SIGBUS). Refuses what `readFile` refuses, but for size.
+MARLET_EXPORT Data mapFile(const URL& url);
+
+/// Takes a file or whole directory, of any size, from its place at once, and removes it later on the
+/// background queue. Throws when it can't be moved away, and then nothing has happened. Until it is removed it
+/// lies in the system's temporary directory, as its name, "-" and a unique string, or, where that is on
+/// another file system, beside its old place under the same name with a dot in front. `completion` is called
+/// on the background queue, with what stood against the removal or nothing.
+MARLET_EXPORT void asynchronouslyRemoveItem(
+    const URL& url, std::function<void(const std::optional<ErrorObject>&)> completion = {});
 
 }  // namespace MarletFoundation::FileManager

@@ -5,6 +5,7 @@
 #include "ApplyCommand.h"
 #include "Check.h"
 #include "Convert.h"
+#include "DigestCommand.h"
 #include "EditCommand.h"
 #include "FatalProblem.h"
 #include "LearnerText.h"
@@ -16,6 +17,7 @@
 #include "Show.h"
 #include "TagsCommand.h"
 #include "TextCommand.h"
+#include "Unzip.h"
 
 using namespace MarletFoundation;
 
@@ -227,6 +229,18 @@ int run(int argc, char** argv) {
     if (places.empty()) throw CLI::RequiredError("--utf8, --utf16 or --at");
     status = showPositions(path, places, asJSON, terminal);
   });
+
+  std::string directory;
+  auto* unzipCommand = app.add_subcommand("unzip", "Expand a zip archive, whoever made it, into a directory");
+  unzipCommand->add_option("ARCHIVE", path, "The archive")->required();
+  unzipCommand->add_option("DIR", directory, "The directory, which is made when missing")->required();
+  unzipCommand->callback([&] { status = unzip(path, directory, terminal); });
+
+  bool isSHA1 = false;
+  auto* digestCommand = app.add_subcommand("digest", "Print MD5 digests of files, as md5sum prints them");
+  digestCommand->add_option("FILE", paths, "The files")->required();
+  digestCommand->add_flag("--sha1", isSHA1, "SHA-1 digests, as sha1sum prints them");
+  digestCommand->callback([&] { status = printDigests(paths, isSHA1, terminal); });
 
   app.parse_complete_callback([&] { setUpLibrary(terminal); });
   try {

@@ -1,0 +1,20 @@
+#pragma once
+
+#include <vector>
+
+#include "ArcCopier/EntryPath.h"
+#include "ArcCopier/ZipDirectory.h"
+
+namespace ArcCopierImplementation {
+
+/// What is to become of one entry.
+struct PlannedItem {
+  const ZipEntry* entry;
+  /// With what stands against extracting the entry, as far as the directory shows it.
+  EntryPath path;
+};
+
+/// The entries in the directory's order. Of several for one place the first one has it.
+std::vector<PlannedItem> plan(const ZipDirectory& directory);
+
+}  // namespace ArcCopierImplementation

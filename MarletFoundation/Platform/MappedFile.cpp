@@ -1,0 +1,23 @@
+#include <sys/mman.h>
+
+#include "MarletFoundation/Platform/Descriptor.h"
+#include "MarletFoundation/Platform/FileManager.h"
+
+namespace MarletFoundation::FileManager {
+
+Data mapFile(const URL& url) {
+  const auto path = systemPath(url);
+  const Descriptor file(retrying([&] { return ::open(path.c_str(), ReadingFlags); }));
+  struct stat status;
+  if (!file || ::fstat(file.get(), &status) != 0) throwPosix(errno, path);
+  if (!S_ISREG(status.st_mode)) throwPosix(S_ISDIR(status.st_mode) ? EISDIR : EINVAL, path);
+  if (status.st_size == 0) return {};
+  const auto size = static_cast<std::size_t>(status.st_size);
+  void* bytes = ::mmap(nullptr, size, PROT_READ, MAP_SHARED, file.get(), 0);
+  if (bytes == MAP_FAILED) throwPosix(errno, path);
+  ::madvise(bytes, size, MADV_SEQUENTIAL);
+  const std::shared_ptr<const void> owner(bytes, [size](void* mapped) { ::munmap(mapped, size); });
+  return {owner, {static_cast<const std::uint8_t*>(bytes), size}};
+}
+
+}  // namespace MarletFoundation::FileManager

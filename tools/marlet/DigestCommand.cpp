@@ -1,0 +1,51 @@
+#include "DigestCommand.h"
+
+#include <iostream>
+
+#include "MarletFoundation/MarletFoundation.h"
+#include "MarletFoundation/Platform/Digest.h"
+
+using namespace MarletFoundation;
+
+namespace {
+
+std::string digest(const URL& file, bool isSHA1) {
+  if (!isSHA1) return Checksum::MD5ChecksumForFile(file);
+  return hexadecimal(FileManager::mapFile(file).mlf_SHA1Digest().bytes());
+}
+
+/// A line whose name holds a backslash or an end of line begins with a backslash, and has them as escapes.
+std::string line(const std::string& digest, const std::string& name) {
+  std::string escaped;
+  for (const char c : name) {
+    switch (c) {
+      case '\\':
+        escaped += "\\\\";
+        break;
+      case '\n':
+        escaped += "\\n";
+        break;
+      case '\r':
+        escaped += "\\r";
+        break;
+      default:
+        escaped += c;
+    }
+  }
+  return (escaped == name ? "" : "\\") + digest + "  " + escaped + "\n";
+}
+
+}  // namespace
+
+ExitStatus printDigests(const std::vector<std::string>& paths, bool isSHA1, const Terminal& terminal) {
+  auto status = ExitStatus::good;
+  for (const auto& path : paths) {
+    try {
+      std::cout << line(digest(URL::file(path), isSHA1), path);
+    } catch (const Error& error) {
+      terminal.complain(printable(path + ": " + ErrorObject(error).localizedDescription()));
+      status = ExitStatus::unreadablePath;
+    }
+  }
+  return status;
+}
