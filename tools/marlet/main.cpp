@@ -16,6 +16,7 @@
 #include "PropertyListCommand.h"
 #include "Show.h"
 #include "TagsCommand.h"
+#include "Targets.h"
 #include "TextCommand.h"
 #include "Unzip.h"
 
@@ -241,6 +242,10 @@ int run(int argc, char** argv) {
   digestCommand->add_option("FILE", paths, "The files")->required();
   digestCommand->add_flag("--sha1", isSHA1, "SHA-1 digests, as sha1sum prints them");
   digestCommand->callback([&] { status = printDigests(paths, isSHA1, terminal); });
+
+  auto* targetsCommand = app.add_subcommand("targets", "List the platforms that documents can be made for");
+  targetsCommand->add_flag("--json", asJSON, "List as JSON");
+  targetsCommand->callback([&] { status = listTargets(asJSON, terminal); });
 
   app.parse_complete_callback([&] { setUpLibrary(terminal); });
   try {
