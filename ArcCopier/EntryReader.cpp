@@ -77,7 +77,10 @@ Problem EntryReader::read(std::string_view& block) {
   const void* bytes = nullptr;
   std::size_t size = 0;
   la_int64_t offset = 0;
-  const auto status = archive_read_data_block(archive_.get(), &bytes, &size, &offset);
+  int status = ARCHIVE_OK;
+  do {
+    status = archive_read_data_block(archive_.get(), &bytes, &size, &offset);
+  } while (status == ARCHIVE_OK && size == 0);
   if (status != ARCHIVE_OK && status != ARCHIVE_EOF) return damage();
   isAtEnd_ = status == ARCHIVE_EOF;
   block = isAtEnd_ ? std::string_view() : std::string_view(static_cast<const char*>(bytes), size);
