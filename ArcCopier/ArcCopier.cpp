@@ -4,6 +4,7 @@
 #include <cstring>
 #include <new>
 #include <string_view>
+#include <system_error>
 
 #include "ArcCopier/Copier.h"
 #include "ArcCopier/Copy.h"
@@ -45,7 +46,9 @@ CopyEnd copy(ArcCopier& copier, const char* source, const char* destination) {
   } catch (const CopyEnd& end) {
     return end;
   } catch (const std::bad_alloc&) {
-    return refused(ArcCopierBadArchive, ENOMEM, std::strerror(ENOMEM));
+    return refused(ArcCopierBadDestination, ENOMEM, std::strerror(ENOMEM));
+  } catch (const std::system_error& error) {  // no thread can be made
+    return refused(ArcCopierBadDestination, error.code().value(), std::strerror(error.code().value()));
   }
 }
 

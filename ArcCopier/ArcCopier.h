@@ -36,7 +36,7 @@ enum ArcCopierResult {
   ArcCopierSomeFilesFailed = 1,
   /// The archive can't be read or trusted; nothing was written.
   ArcCopierBadArchive = 2,
-  /// The destination can't be made or written to.
+  /// The destination can't be made or written to, or there is not enough memory.
   ArcCopierBadDestination = 3,
   /// The archive holds more than the limits allow.
   ArcCopierLimitExceeded = 4,
@@ -85,7 +85,7 @@ ARC_COPIER_EXPORT void ArcCopierFree(ArcCopierRef copier);
 ARC_COPIER_EXPORT void ArcCopierSetUserData(ArcCopierRef copier, void* userData);
 ARC_COPIER_EXPORT void* ArcCopierUserData(ArcCopierRef copier);
 
-/// Called when an item's extraction begins, a directory's too.
+/// Called when an item's extraction begins, a directory's too; whether it succeeds shows later.
 ARC_COPIER_EXPORT void ArcCopierSetCopyFileStartedHandler(ArcCopierRef copier, ArcCopierFileHandler handler);
 /// Called when an item stands whole under its name.
 ARC_COPIER_EXPORT void ArcCopierSetCopyFileFinishedHandler(ArcCopierRef copier, ArcCopierFileHandler handler);

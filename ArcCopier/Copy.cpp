@@ -30,17 +30,22 @@ bool isDestinationsEnd(int error) {
 
 }  // namespace
 
-Copy::Copy(ArcCopier& copier, int archive)
-    : copier_(copier), archive_(archive), directory_(archive, copier.limits.entries), reader_(archive) {}
+Copy::Copy(ArcCopier& copier, int archive) : copier_(copier), directory_(archive, copier.limits.entries) {
+  directory_.checkLocalHeaders();
+  items_ = plan(directory_);
+  std::vector<const ZipEntry*> readable;
+  for (const auto& item : items_) {
+    if (!item.path.problem && !item.path.isDirectory) readable.push_back(item.entry);
+  }
+  reader_.emplace(archive, std::move(readable));
+}
 
 int Copy::run(const char* destination) {
-  directory_.checkLocalHeaders();
-  const auto items = plan(directory_);
   if (const int error = destination_.open(destination)) {
     copier_.call(copier_.fatalError, destination, error, std::strerror(error));
     throw CopyEnd{ArcCopierBadDestination, error};
   }
-  for (const auto& item : items) {
+  for (const auto& item : items_) {
     if (copier_.isCancelled) throw CopyEnd{ArcCopierCancelled, ECANCELED};
     copy(item);
   }
@@ -50,7 +55,6 @@ int Copy::run(const char* destination) {
 void Copy::copy(const PlannedItem& item) {
   const auto& path = item.path;
   if (path.problem) return failed(item, path.problem);
-  if (!path.isDirectory && destination_.exists(path.normalized)) return failedToWrite(item, EEXIST);
   stopUnlessContinued(copier_.call(copier_.started, path.shown.c_str()));
   if (!path.isDirectory) return copyFile(item);
   const int error =
@@ -60,23 +64,26 @@ void Copy::copy(const PlannedItem& item) {
 }
 
 void Copy::copyFile(const PlannedItem& item) {
-  const char* shown = item.path.shown.c_str();
-  if (const auto problem = reader_.open(*item.entry)) return failed(item, problem);
+  auto chunk = reader_->next(item.entry);
+  if (chunk.problem) return failed(item, chunk.problem);
+  // Of a large file it is better known before that there is no place for it.
+  if (!chunk.isLast && destination_.exists(item.path.normalized)) return failedToWrite(item, EEXIST);
+  const auto naming = chunk.isLast ? Destination::Naming::atOnce : Destination::Naming::whenFinished;
   Destination::File file;
-  if (const int error = destination_.makeFile(item.path.normalized, permissions(item), file))
+  if (const int error = destination_.makeFile(item.path.normalized, permissions(item), naming, file))
     return failedToWrite(item, error);
   std::uint64_t copied = 0;
   while (true) {
-    std::string_view block;
-    if (const auto problem = reader_.read(block)) return failed(item, problem);
-    if (block.empty()) break;
-    countBytes(item, block.size());
-    if (const int error = file.write(block)) return failedToWrite(item, error);
-    copied += block.size();
-    stopUnlessContinued(copier_.call(copier_.update, shown, copied));
+    countBytes(item, chunk.bytes.size());
+    if (const int error = file.write(chunk.bytes)) return failedToWrite(item, error);
+    copied += chunk.bytes.size();
+    stopUnlessContinued(copier_.call(copier_.update, item.path.shown.c_str(), copied));
+    if (chunk.isLast) break;
+    chunk = reader_->next(item.entry);
+    if (chunk.problem) return failed(item, chunk.problem);
   }
   if (const int error = file.finish()) return failedToWrite(item, error);
-  stopUnlessContinued(copier_.call(copier_.finished, shown));
+  stopUnlessContinued(copier_.call(copier_.finished, item.path.shown.c_str()));
 }
 
 void Copy::countBytes(const PlannedItem& item, std::size_t size) {

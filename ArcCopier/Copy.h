@@ -1,9 +1,12 @@
 #pragma once
 
+#include <optional>
+#include <vector>
+
 #include "ArcCopier/ArcCopier.h"
 #include "ArcCopier/Destination.h"
-#include "ArcCopier/EntryReader.h"
 #include "ArcCopier/Plan.h"
+#include "ArcCopier/ReadAhead.h"
 
 namespace ArcCopierImplementation {
 
@@ -16,11 +19,11 @@ struct CopyEnd {
 /// One run of a copier over one archive.
 class Copy {
  public:
-  /// `archive` is open for reading.
+  /// Reads the directory of an archive that is open for reading, and throws a `Refusal` if it can't be trusted.
   Copy(ArcCopier& copier, int archive);
 
-  /// Throws a `Refusal` before anything was written, or a `CopyEnd`. Gives back the errno of the first file
-  /// error or conflict, 0 if there was none.
+  /// Writes. Gives back the errno of the first file error or conflict, 0 if there was none, or throws a
+  /// `CopyEnd`.
   int run(const char* destination);
 
  private:
@@ -32,10 +35,10 @@ class Copy {
   void stopUnlessContinued(int answer);
 
   ArcCopier& copier_;
-  const int archive_;
   ZipDirectory directory_;
   Destination destination_;
-  EntryReader reader_;
+  std::vector<PlannedItem> items_;
+  std::optional<ReadAhead> reader_;
   std::uint64_t bytes_ = 0;  // of all files so far
   int firstError_ = 0;
 };

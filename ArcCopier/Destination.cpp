@@ -63,14 +63,14 @@ int Destination::makeDirectory(const std::string& path, mode_t mode) {
   return Descriptor(openName(parent_.get(), name)) ? 0 : EEXIST;
 }
 
-int Destination::makeFile(const std::string& path, mode_t mode, File& file) {
+int Destination::makeFile(const std::string& path, mode_t mode, Naming naming, File& file) {
   if (const int error = openParent(path, file.name_, true)) return error;
+  const auto& name = naming == Naming::atOnce ? file.name_ : passingName_;
   const int flags = O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC;
-  file.descriptor_ =
-      Descriptor(retrying([&] { return ::openat(parent_.get(), passingName_.c_str(), flags, mode); }));
+  file.descriptor_ = Descriptor(retrying([&] { return ::openat(parent_.get(), name.c_str(), flags, mode); }));
   if (!file.descriptor_) return errno;
   file.directory_ = parent_.get();
-  file.passingName_ = passingName_;
+  file.currentName_ = name;
   return 0;
 }
 
@@ -104,7 +104,7 @@ int Destination::openDirectory(const std::string& path, bool makingIt, Descripto
 }
 
 Destination::File::~File() {
-  if (!passingName_.empty()) ::unlinkat(directory_, passingName_.c_str(), 0);
+  if (!currentName_.empty()) ::unlinkat(directory_, currentName_.c_str(), 0);
 }
 
 int Destination::File::write(std::string_view bytes) {
@@ -114,9 +114,11 @@ int Destination::File::write(std::string_view bytes) {
 int Destination::File::finish() {
   // Some file systems tell only now that what was written didn't reach the disk.
   if (::close(descriptor_.release()) != 0 && errno != EINTR) return errno;
-  const int error = renameToFreeName(directory_, passingName_.c_str(), name_.c_str());
-  if (error == 0) passingName_.clear();
-  return error;
+  if (currentName_ != name_) {
+    if (const int error = renameToFreeName(directory_, currentName_.c_str(), name_.c_str())) return error;
+  }
+  currentName_.clear();
+  return 0;
 }
 
 }  // namespace ArcCopierImplementation

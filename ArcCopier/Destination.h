@@ -23,7 +23,7 @@ class Destination {
   /// Makes a directory with those above it; one that is there already will do, but EEXIST for anything else.
   int makeDirectory(const std::string& path, mode_t mode);
 
-  /// A file that is being written under a passing name; removed unless it was finished.
+  /// A file that is being written; removed unless it was finished.
   class File {
    public:
     File() = default;
@@ -32,18 +32,21 @@ class Destination {
     File& operator=(const File&) = delete;
 
     int write(std::string_view bytes);
-    /// Gives the file its name; EEXIST when something bears it already.
+    /// Ends the file, and gives it its name; EEXIST when something bears it already.
     int finish();
 
    private:
     friend class Destination;
     int directory_ = -1;  // the destination's
-    std::string passingName_;
     std::string name_;
+    std::string currentName_;  // empty once the file is to stay
     Descriptor descriptor_;
   };
-  /// Begins a file, and makes the directories above it when missing. One at a time.
-  int makeFile(const std::string& path, mode_t mode, File& file);
+  enum class Naming { atOnce, whenFinished };
+  /// Begins a file, and makes the directories above it when missing. One at a time. EEXIST when something
+  /// bears its name already, which may show only at its end. Until then it has a passing name, unless it is
+  /// to have its own at once, as is right for what is written in one go and known to be whole.
+  int makeFile(const std::string& path, mode_t mode, Naming naming, File& file);
 
  private:
   /// The directory of a path, opened, and made when missing; it stays open for the files beside it.

@@ -1,7 +1,6 @@
 #include "ArcCopier/EntryReader.h"
 
 #include <archive.h>
-#include <unistd.h>
 
 #include <algorithm>
 #include <cerrno>
@@ -14,9 +13,7 @@ namespace {
 
 constexpr std::uint16_t Stored = 0;
 constexpr std::uint16_t Deflated = 8;
-constexpr std::size_t BufferSize = 128 << 10;
-/// With the zip64 field, which is always there.
-constexpr std::size_t MadeHeaderSize = LocalHeaderSize + 20;
+constexpr std::size_t WindowSize = 128 << 10;
 
 char* put(char* place, std::uint64_t value, std::size_t size) {
   for (std::size_t i = 0; i < size; ++i) *place++ = static_cast<char>(value >> 8 * i);
@@ -43,8 +40,7 @@ void makeHeader(char* place, const ZipEntry& entry) {
 
 }  // namespace
 
-EntryReader::EntryReader(int file)
-    : file_(file), buffer_(std::make_unique_for_overwrite<char[]>(BufferSize)) {}
+EntryReader::EntryReader(int file) : window_(file, WindowSize) {}
 
 void EntryReader::Close::operator()(archive* reader) const { archive_read_free(reader); }
 
@@ -77,7 +73,10 @@ Problem EntryReader::read(std::string_view& block) {
   const void* bytes = nullptr;
   std::size_t size = 0;
   la_int64_t offset = 0;
-  const auto status = archive_read_data_block(archive_.get(), &bytes, &size, &offset);
+  int status = ARCHIVE_OK;
+  do {
+    status = archive_read_data_block(archive_.get(), &bytes, &size, &offset);
+  } while (status == ARCHIVE_OK && size == 0);
   if (status != ARCHIVE_OK && status != ARCHIVE_EOF) return damage();
   isAtEnd_ = status == ARCHIVE_EOF;
   block = isAtEnd_ ? std::string_view() : std::string_view(static_cast<const char*>(bytes), size);
@@ -94,29 +93,23 @@ Problem EntryReader::damage() const {
 
 std::ptrdiff_t EntryReader::supply(archive* reader, void* self, const void** bytes) {
   auto& source = *static_cast<EntryReader*>(self);
-  std::size_t filled = 0;
   if (source.isHeaderDue_) {
-    makeHeader(source.buffer_.get(), source.entry_);
-    filled = MadeHeaderSize;
+    makeHeader(source.header_.data(), source.entry_);
     source.isHeaderDue_ = false;
+    *bytes = source.header_.data();
+    return static_cast<std::ptrdiff_t>(source.header_.size());
   }
-  const auto wanted =
-      std::min<std::uint64_t>(BufferSize - filled, source.entry_.compressedSize - source.supplied_);
-  const auto target = filled + static_cast<std::size_t>(wanted);
-  while (filled < target) {
-    const auto count = ::pread(source.file_, source.buffer_.get() + filled, target - filled,
-                               static_cast<off_t>(source.entry_.dataOffset + source.supplied_));
-    if (count < 0 && errno == EINTR) continue;
-    if (count < 0) {
-      archive_set_error(reader, EIO, "the archive can't be read");
-      return ARCHIVE_FATAL;
-    }
-    if (count == 0) break;
-    filled += static_cast<std::size_t>(count);
-    source.supplied_ += static_cast<std::uint64_t>(count);
+  const auto rest = source.entry_.compressedSize - source.supplied_;
+  if (rest == 0) return 0;
+  std::string_view block;
+  if (source.window_.read(source.entry_.dataOffset + source.supplied_, 1, block) != 0) {
+    archive_set_error(reader, EIO, "the archive can't be read");
+    return ARCHIVE_FATAL;
   }
-  *bytes = source.buffer_.get();
-  return static_cast<std::ptrdiff_t>(filled);
+  block = block.substr(0, static_cast<std::size_t>(std::min<std::uint64_t>(block.size(), rest)));
+  source.supplied_ += block.size();
+  *bytes = block.data();
+  return static_cast<std::ptrdiff_t>(block.size());
 }
 
 }  // namespace ArcCopierImplementation

@@ -1,10 +1,12 @@
 #pragma once
 
+#include <array>
 #include <cstdint>
 #include <memory>
 #include <string_view>
 
 #include "ArcCopier/EntryPath.h"
+#include "ArcCopier/Window.h"
 #include "ArcCopier/ZipDirectory.h"
 
 struct archive;
@@ -36,9 +38,12 @@ class EntryReader {
   static std::ptrdiff_t supply(archive* reader, void* self, const void** bytes);
   Problem damage() const;
 
-  const int file_;
+  /// A local header with its zip64 field.
+  static constexpr std::size_t HeaderSize = 30 + 20;
+
+  Window window_;
+  std::array<char, HeaderSize> header_;
   std::unique_ptr<archive, Close> archive_;
-  std::unique_ptr<char[]> buffer_;
   ZipEntry entry_{};
   bool isHeaderDue_ = false;
   bool isAtEnd_ = true;

@@ -59,8 +59,8 @@ std::vector<PlannedItem> plan(const ZipDirectory& directory) {
   items.reserve(directory.entries().size());  // the places refer to the paths
   Places places;
   for (const auto& entry : directory.entries()) {
-    auto& item = items.emplace_back(&entry, entryPath(entry.name, (entry.flags & UTF8Flag) != 0));
-    auto& path = item.path;
+    items.push_back({&entry, entryPath(entry.name, (entry.flags & UTF8Flag) != 0)});
+    auto& path = items.back().path;
     path.isDirectory = path.isDirectory || S_ISDIR(entry.mode);
     if (!path.problem) path.problem = problemOfType(entry, path.isDirectory);
     if (!path.problem) path.problem = EntryReader::problem(entry);

@@ -1,7 +1,6 @@
 #include "ArcCopier/ZipDirectory.h"
 
 #include <sys/stat.h>
-#include <unistd.h>
 
 #include <algorithm>
 #include <array>
@@ -19,21 +18,18 @@ constexpr std::uint16_t DataDescriptorFlag = 1u << 3;
 constexpr std::uint16_t MeaningfulFlags = EncryptedFlags | DataDescriptorFlag | 1u << 11;
 /// Checksum and both sizes, the least that a data descriptor has.
 constexpr std::uint64_t SmallestDescriptor = 12;
-constexpr std::uint64_t LargestDirectory = std::uint64_t{256} << 20;
+/// Local headers of small files lie within a few of these.
+constexpr std::size_t WindowSize = 8 << 10;
+constexpr std::uint64_t LargestDirectory = std::uint64_t{64} << 20;
 
 [[noreturn]] void refuse(const char* reason, int error = EBADMSG) { throw Refusal{error, reason}; }
 
-/// Fills the buffer with so many bytes from an offset on.
-void readAt(int file, std::uint64_t offset, std::size_t size, std::string& buffer) {
-  buffer.resize(size);
-  for (std::size_t filled = 0; filled < size;) {
-    const auto count =
-        ::pread(file, buffer.data() + filled, size - filled, static_cast<off_t>(offset + filled));
-    if (count < 0 && errno == EINTR) continue;
-    if (count < 0) refuse("it can't be read", errno);
-    if (count == 0) refuse("it is cut off");
-    filled += static_cast<std::size_t>(count);
-  }
+/// So many bytes from an offset on, which stay until the next read.
+std::string_view readAt(Window& window, std::uint64_t offset, std::size_t size) {
+  std::string_view bytes;
+  if (const int error = window.read(offset, size, bytes)) refuse("it can't be read", error);
+  if (bytes.size() < size) refuse("it is cut off");
+  return bytes.substr(0, size);
 }
 
 /// Puts the values of a zip64 field in place of those that the record left to it. `values` are the record's
@@ -74,7 +70,7 @@ struct ZipDirectory::End {
   std::uint64_t directorySize, directoryOffset;
 };
 
-ZipDirectory::ZipDirectory(int file, std::uint64_t entryLimit) : file_(file) {
+ZipDirectory::ZipDirectory(int file, std::uint64_t entryLimit) : window_(file, WindowSize) {
   struct stat status;
   if (::fstat(file, &status) != 0) refuse("it can't be read", errno);
   if (!S_ISREG(status.st_mode)) refuse("it is no regular file", S_ISDIR(status.st_mode) ? EISDIR : EINVAL);
@@ -90,16 +86,15 @@ ZipDirectory::ZipDirectory(int file, std::uint64_t entryLimit) : file_(file) {
   if (end.entries > end.directorySize / DirectoryEntrySize)
     refuse("its directory has fewer entries than it says");
   directoryOffset_ = end.directoryOffset;
-  readAt(file_, directoryOffset_, static_cast<std::size_t>(end.directorySize), bytes_);
+  bytes_ = readAt(window_, directoryOffset_, static_cast<std::size_t>(end.directorySize));
   readEntries(end.entries);
 }
 
 /// The end record is the one whose comment reaches to the end of the file.
-ZipDirectory::End ZipDirectory::findEnd() const {
+ZipDirectory::End ZipDirectory::findEnd() {
   const auto size = static_cast<std::size_t>(std::min<std::uint64_t>(archiveSize_, EndSize + 0xFFFF));
   if (size < EndSize) refuse("it is no zip archive, or cut off");
-  std::string tail;
-  readAt(file_, archiveSize_ - size, size, tail);
+  const auto tail = readAt(window_, archiveSize_ - size, size);
   std::optional<std::size_t> found;
   for (std::size_t i = size - EndSize + 1; i-- > 0;) {
     if (tail[i] != 'P' || number32(tail, i) != EndSignature) continue;
@@ -108,22 +103,21 @@ ZipDirectory::End ZipDirectory::findEnd() const {
     found = i;
   }
   if (!found) refuse("it is no zip archive, or cut off");
-  const auto record = std::string_view(tail).substr(*found);
+  const auto record = tail.substr(*found);
   return {archiveSize_ - size + *found, number16(record, 4),  number16(record, 6), number16(record, 8),
           number16(record, 10),         number32(record, 12), number32(record, 16)};
 }
 
 /// The values of the zip64 end record where there is one.
-ZipDirectory::End ZipDirectory::zip64End(const End& end) const {
+ZipDirectory::End ZipDirectory::zip64End(const End& end) {
   if (end.position < Zip64LocatorSize + Zip64EndSize) return end;
   const auto locatorPosition = end.position - Zip64LocatorSize;
-  std::string bytes;
-  readAt(file_, locatorPosition, Zip64LocatorSize, bytes);
+  auto bytes = readAt(window_, locatorPosition, Zip64LocatorSize);
   if (number32(bytes, 0) != Zip64LocatorSignature) return end;
   const auto position = number64(bytes, 8);
   if (number32(bytes, 4) != 0 || number32(bytes, 16) > 1) refuse("it is one of several volumes");
   if (position > locatorPosition - Zip64EndSize) refuse("its zip64 end doesn't lie where it should");
-  readAt(file_, position, Zip64EndSize, bytes);
+  bytes = readAt(window_, position, Zip64EndSize);
   if (number32(bytes, 0) != Zip64EndSignature || number64(bytes, 4) != locatorPosition - position - 12)
     refuse("its zip64 end doesn't lie where it should");
   const End large{position,
@@ -172,8 +166,7 @@ void ZipDirectory::readEntries(std::uint64_t count) {
 }
 
 void ZipDirectory::checkLocalHeaders() {
-  std::string buffer;
-  for (auto& entry : entries_) entry.dataOffset = checkedDataOffset(entry, buffer);
+  for (auto& entry : entries_) entry.dataOffset = checkedDataOffset(entry);
 
   std::vector<const ZipEntry*> byOffset;
   byOffset.reserve(entries_.size());
@@ -192,26 +185,26 @@ void ZipDirectory::checkLocalHeaders() {
   }
 }
 
-std::uint64_t ZipDirectory::checkedDataOffset(const ZipEntry& entry, std::string& buffer) const {
+std::uint64_t ZipDirectory::checkedDataOffset(const ZipEntry& entry) {
   const auto headSize = LocalHeaderSize + entry.name.size();
   if (entry.headerOffset > directoryOffset_ || headSize > directoryOffset_ - entry.headerOffset)
     refuse("its entries reach into its directory, or it is cut off");
-  readAt(file_, entry.headerOffset, headSize, buffer);
-  if (number32(buffer, 0) != LocalHeaderSignature) refuse("a local header is missing");
-  const std::size_t extraSize = number16(buffer, 28);
-  const bool sameMeaning = ((number16(buffer, 6) ^ entry.flags) & MeaningfulFlags) == 0 &&
-                           number16(buffer, 8) == entry.method && number16(buffer, 26) == entry.name.size() &&
-                           std::string_view(buffer).substr(LocalHeaderSize) == entry.name;
+  const auto header = readAt(window_, entry.headerOffset, headSize);
+  if (number32(header, 0) != LocalHeaderSignature) refuse("a local header is missing");
+  const std::size_t extraSize = number16(header, 28);
+  const bool sameMeaning = ((number16(header, 6) ^ entry.flags) & MeaningfulFlags) == 0 &&
+                           number16(header, 8) == entry.method && number16(header, 26) == entry.name.size() &&
+                           header.substr(LocalHeaderSize) == entry.name;
   if (!sameMeaning) refuse("a local header differs from the directory");
-  const auto checksum = number32(buffer, 14);
-  std::uint64_t compressedSize = number32(buffer, 18);
-  std::uint64_t size = number32(buffer, 22);
+  const auto checksum = number32(header, 14);
+  std::uint64_t compressedSize = number32(header, 18);
+  std::uint64_t size = number32(header, 22);
   const auto dataOffset = entry.headerOffset + headSize + extraSize;
   if (dataOffset > directoryOffset_) refuse("its entries reach into its directory, or it is cut off");
   if (size == In64 || compressedSize == In64) {
-    readAt(file_, entry.headerOffset + headSize, extraSize, buffer);
+    const auto extra = readAt(window_, entry.headerOffset + headSize, extraSize);
     const std::array values{&size, &compressedSize};
-    applyZip64(buffer, values);
+    applyZip64(extra, values);
   }
   // What was not known when the header was written follows the data.
   const auto agrees = [&](std::uint64_t local, std::uint64_t central) {

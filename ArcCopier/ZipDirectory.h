@@ -5,6 +5,8 @@
 #include <string_view>
 #include <vector>
 
+#include "ArcCopier/Window.h"
+
 namespace ArcCopierImplementation {
 
 /// Why an archive is refused as a whole: an errno, and a sentence without a full stop.
@@ -55,12 +57,12 @@ class ZipDirectory {
 
  private:
   struct End;
-  End findEnd() const;
-  End zip64End(const End& end) const;
+  End findEnd();
+  End zip64End(const End& end);
   void readEntries(std::uint64_t count);
-  std::uint64_t checkedDataOffset(const ZipEntry& entry, std::string& buffer) const;
+  std::uint64_t checkedDataOffset(const ZipEntry& entry);
 
-  const int file_;
+  Window window_;
   std::uint64_t archiveSize_;
   std::uint64_t directoryOffset_;
   std::string bytes_;

@@ -6,17 +6,19 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <chrono>
 #include <cstdlib>
 #include <filesystem>
 #include <iostream>
 
-double processorTimeOf(const std::vector<std::string>& command) {
+ProcessTime timeOf(const std::vector<std::string>& command) {
   std::vector<char*> arguments;
   for (const auto& argument : command) arguments.push_back(const_cast<char*>(argument.c_str()));
   arguments.push_back(nullptr);
   posix_spawn_file_actions_t actions;
   ::posix_spawn_file_actions_init(&actions);
   ::posix_spawn_file_actions_addopen(&actions, STDOUT_FILENO, "/dev/null", O_WRONLY, 0);
+  const auto start = std::chrono::steady_clock::now();
   pid_t process = 0;
   const int failure = ::posix_spawnp(&process, arguments[0], &actions, nullptr, arguments.data(), environ);
   ::posix_spawn_file_actions_destroy(&actions);
@@ -26,10 +28,11 @@ double processorTimeOf(const std::vector<std::string>& command) {
     std::cerr << command.front() << " failed\n";
     std::exit(1);
   }
+  const std::chrono::duration<double> elapsed = std::chrono::steady_clock::now() - start;
   const auto seconds = [](const timeval& time) {
     return static_cast<double>(time.tv_sec) + 1e-6 * static_cast<double>(time.tv_usec);
   };
-  return seconds(usage.ru_utime) + seconds(usage.ru_stime);
+  return {elapsed.count(), seconds(usage.ru_utime) + seconds(usage.ru_stime)};
 }
 
 std::string marletProgram() {

@@ -3,9 +3,15 @@
 #include <string>
 #include <vector>
 
-/// Runs a program to its end with its output thrown away, and gives back the seconds of processor time that it
-/// took, its start included. Ends this process when the program fails.
-double processorTimeOf(const std::vector<std::string>& command);
+/// Seconds: by the clock, and of processors.
+struct ProcessTime {
+  double elapsed;
+  double processor;
+};
+
+/// Runs a program to its end with its output thrown away, and gives back what that took, its start included.
+/// Ends this process when the program fails.
+ProcessTime timeOf(const std::vector<std::string>& command);
 
 /// The path of `marlet` as it was built beside this program.
 std::string marletProgram();
