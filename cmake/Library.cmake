@@ -8,6 +8,12 @@ add_library(MarletDiff OBJECT ${MARLET_DIFF_SOURCES})
 target_include_directories(MarletDiff PRIVATE ${CMAKE_SOURCE_DIR})
 target_link_libraries(MarletDiff PRIVATE marlet_options ICU::uc)
 
+# So is the telemetry client, which stands on the platform and the value layer.
+file(GLOB TELVANE_REPORTING_SOURCES CONFIGURE_DEPENDS ${CMAKE_SOURCE_DIR}/TelvaneReporting/*.cpp)
+add_library(TelvaneReporting OBJECT ${TELVANE_REPORTING_SOURCES})
+target_include_directories(TelvaneReporting PRIVATE ${CMAKE_SOURCE_DIR})
+target_link_libraries(TelvaneReporting PRIVATE marlet_options)
+
 # So is the archive copier, and only it sees libarchive.
 file(GLOB ARC_COPIER_SOURCES CONFIGURE_DEPENDS ${CMAKE_SOURCE_DIR}/ArcCopier/*.cpp)
 add_library(ArcCopier OBJECT ${ARC_COPIER_SOURCES})
@@ -27,5 +33,6 @@ target_compile_definitions(
 target_compile_options(MarletFoundation PRIVATE -fno-semantic-interposition)
 target_link_options(MarletFoundation PRIVATE -Wl,-Bsymbolic-functions)
 target_link_libraries(MarletFoundation PRIVATE $<BUILD_INTERFACE:marlet_options> $<BUILD_INTERFACE:MarletDiff>
-                                               $<BUILD_INTERFACE:ArcCopier> LibArchive::LibArchive ICU::i18n ICU::uc
+                                               $<BUILD_INTERFACE:ArcCopier> $<BUILD_INTERFACE:TelvaneReporting>
+                                               $<BUILD_INTERFACE:nlohmann_json::nlohmann_json> LibArchive::LibArchive ICU::i18n ICU::uc
                                                LibXml2::LibXml2 OpenSSL::Crypto uriparser::uriparser Threads::Threads)

@@ -90,6 +90,15 @@ const PropertyListValue::Array& requiredArray(const PropertyListDictionary& mani
   return *value->array();
 }
 
+/// The URL of a child that is there, whatever it holds. A link counts as absent: it may lead out of the
+/// document.
+inline std::optional<URL> urlOfChild(const FileWrapper& parent, const URL& parentURL, std::string_view name,
+                                     bool isDirectory) {
+  const auto child = parent.child(name);
+  if (!child || !(child->isDirectory() || child->isRegularFile())) return std::nullopt;
+  return parentURL.appendingPathComponent(name, isDirectory);
+}
+
 /// The URL of an optional child directory.
 template <class ErrorType>
 std::optional<URL> optionalDirectory(const FileWrapper& parent, const URL& parentURL, std::string_view name,

@@ -1,5 +1,6 @@
 #include "MarletFoundation/Data/PropertyListSerializable.h"
 #include "MarletFoundation/Marlet/MarletBookPageSnapshot.h"
+#include "MarletFoundation/Marlet/PageDirectory.h"
 #include "MarletFoundation/Marlet/PageHints.h"
 #include "MarletFoundation/Platform/FatalError.h"
 #include "MarletFoundation/Platform/Text.h"
@@ -23,21 +24,14 @@ PropertyListValue MarletBookPageSnapshot::manifest() const {
 FileWrapper MarletBookPageSnapshot::fileWrapper() const {
   FileWrapper::Children children;
   const auto add = [&](const char* name, FileWrapper child) { children.emplace(name, std::move(child)); };
-  const auto addIfReadable = [&](const char* name, const std::optional<URL>& url) {
-    if (!url) return;
-    try {
-      add(name, FileWrapper(*url));
-    } catch (const Error&) {
-    }
-  };
   add("Manifest.plist",
       FileWrapper::regularFile(PropertyListSerialization::write(manifest(), PropertyListFormat::binary)));
   auto source = utf8FromUTF16(text_);
   if (!source) fatalError("A page's text must be valid UTF-16 to be written!");
   add("Contents.swift", FileWrapper::regularFile(Data(*std::move(source))));
-  addIfReadable("Sources", sourcesDirectoryURL_);
-  addIfReadable("Resources", resourcesDirectoryURL_);
-  addIfReadable("LiveView.swift", liveViewSourceFileURL_);
+  addIfReadable(children, "Sources", sourcesDirectoryURL_);
+  addIfReadable(children, "Resources", resourcesDirectoryURL_);
+  addIfReadable(children, "LiveView.swift", liveViewSourceFileURL_);
   static constexpr auto format = MarletResultInfoSnapshot::Format::ResultInfo;
   if (resultInfo_.needsSerialization(format))
     add("ResultInfo.plist", FileWrapper::regularFile(resultInfo_.data(format)));

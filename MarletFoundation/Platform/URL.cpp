@@ -311,6 +311,16 @@ URL URL::resolvingSymlinksInPath() const {
   }
 }
 
+std::optional<std::string> URL::securityScope() const {
+  return securityScope_ ? std::optional(*securityScope_) : std::nullopt;
+}
+
+URL URL::attachingSecurityScope(std::string token) const {
+  auto url = *this;
+  url.securityScope_ = std::make_shared<const std::string>(std::move(token));
+  return url;
+}
+
 bool URL::operator==(const URL& other) const { return (*this <=> other) == 0; }
 
 std::strong_ordering URL::operator<=>(const URL& other) const {

@@ -55,6 +55,11 @@ class MARLET_EXPORT URL {
   /// With the symbolic links of its longest existing leading part resolved.
   URL resolvingSymlinksInPath() const;
 
+  /// The grant that this URL carries (`SecurityScope`), or nothing. It isn't part of what a URL is: URLs are equal
+  /// without it, and those made from this one don't have it.
+  std::optional<std::string> securityScope() const;
+  URL attachingSecurityScope(std::string token) const;
+
   /// Base included: URLs that resolve alike but are held differently are not equal.
   bool operator==(const URL& other) const;
   std::strong_ordering operator<=>(const URL& other) const;
@@ -67,6 +72,7 @@ class MARLET_EXPORT URL {
   bool isFile_ = true;
   bool isDirectory_ = false;
   std::shared_ptr<const URL> base_;
+  std::shared_ptr<const std::string> securityScope_;
 };
 
 }  // namespace MarletFoundation

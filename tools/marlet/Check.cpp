@@ -4,7 +4,9 @@
 #include <iostream>
 
 #include "CheckBook.h"
+#include "CheckMarlet.h"
 #include "Document.h"
+#include "ErrorWords.h"
 #include "JSON.h"
 #include "MarletFoundation/MarletFoundation.h"
 
@@ -24,13 +26,6 @@ struct Report {
   }
 };
 
-Problem problem(std::string rule, std::string description) {
-  Problem result;
-  result.rule = std::move(rule);
-  result.description = std::move(description);
-  return result;
-}
-
 Report report(const std::string& path) {
   Report report{path, "unknown", true, {}};
   try {
@@ -42,11 +37,12 @@ Report report(const std::string& path) {
         break;
       case DocumentKind::classic:
         report.kind = "classic";
-        report.problems = {
-            problem("classic.unsupported", "Classic documents are not checked by this version.")};
+        report.problems = problemsOfMarlet(document);
         break;
       case DocumentKind::unknown:
-        report.problems = {problem("document.unknownKind", "This is neither a book nor a classic document.")};
+        report.problems.emplace_back();
+        report.problems[0].rule = "document.unknownKind";
+        report.problems[0].description = "This is neither a book nor a classic document.";
         break;
     }
   } catch (const Error& error) {
@@ -70,7 +66,7 @@ void print(const Report& report, const Problem& problem, const Terminal& termina
   if (problem.line) place += ":" + std::to_string(*problem.line);
   if (problem.line && problem.column) place += ":" + std::to_string(*problem.column);
   auto text = problem.description;
-  if (problem.recoverySuggestion) text += ": " + *problem.recoverySuggestion;
+  if (problem.recoverySuggestion) text += suggested(text, *problem.recoverySuggestion);
   const auto style = problem.severity == "error" ? Terminal::Style::red : Terminal::Style::yellow;
   std::cout << terminal.styled(Terminal::Style::bold, printable(place) + ":") << " "
             << terminal.styled(style, problem.severity + ":") << " " << printable(text) << " "

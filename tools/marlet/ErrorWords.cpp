@@ -52,5 +52,11 @@ std::string wordsOf(const Error& error) {
 
 std::string wordsWithSuggestion(const Error& error) {
   const auto suggestion = ErrorObject(error).localizedRecoverySuggestion();
-  return wordsOf(error) + (suggestion ? ": " + *suggestion : "");
+  auto words = wordsOf(error);
+  if (suggestion) words += suggested(words, *suggestion);
+  return words;
+}
+
+std::string suggested(std::string_view words, const std::string& suggestion) {
+  return (words.ends_with('.') ? " " : ": ") + suggestion;
 }

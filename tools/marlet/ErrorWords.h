@@ -1,6 +1,7 @@
 #pragma once
 
 #include <string>
+#include <string_view>
 
 #include "MarletFoundation/Platform/Error.h"
 
@@ -9,3 +10,5 @@
 std::string wordsOf(const MarletFoundation::Error& error);
 /// The same, followed by the recovery suggestion where there is one.
 std::string wordsWithSuggestion(const MarletFoundation::Error& error);
+/// The suggestion as it follows those words.
+std::string suggested(std::string_view words, const std::string& suggestion);

@@ -1,15 +1,14 @@
 #include "New.h"
 
 #include <algorithm>
-#include <filesystem>
 
 #include "Document.h"
 #include "Guarded.h"
 #include "MarletFoundation/MarletFoundation.h"
 #include "MarletFoundation/Platform/Host.h"
-#include "MarletFoundation/Platform/Text.h"
 #include "NewItems.h"
 #include "TreePath.h"
+#include "Writing.h"
 
 using namespace MarletFoundation;
 
@@ -23,20 +22,6 @@ ExitStatus making(const std::string& what, const Terminal& terminal, Make make) 
     terminal.note("made " + printable(what));
     return ExitStatus::good;
   });
-}
-
-void write(const FileWrapper& tree, const URL& url) {
-  orFailWith(ExitStatus::failedWrite, url.path(), [&] { tree.write(url); });
-}
-
-[[noreturn]] void refuseToOverwrite(const std::string& name) {
-  throw CommandFailure{ExitStatus::failedWrite, name + ": There is something of that name already."};
-}
-
-/// A name from the command line that is to name a directory.
-void requireFilename(const std::string& name) {
-  if (name.empty() || name.starts_with('.') || name.find('/') != std::string::npos || !isValidUTF8(name))
-    throw CommandFailure{ExitStatus::wrongUsage, name + ": This can't be the name of a directory."};
 }
 
 Document openBook(const std::string& path) {
@@ -59,11 +44,9 @@ ExitStatus makeBook(const std::string& path, const std::optional<std::string>& n
     requireFilename(filename);
     if (url.pathExtension() != "marletbook")
       throw CommandFailure{ExitStatus::wrongUsage, path + ": A book's name ends in \".marletbook\"."};
-    std::error_code unknown;
-    if (std::filesystem::symlink_status(url.path(), unknown).type() != std::filesystem::file_type::not_found)
-      refuseToOverwrite(path);
+    requireNothingAt(path);
     const auto stem = filename.substr(0, filename.rfind('.'));
-    write(newBook(filename, name.value_or(stem), identifier ? *identifier : randomUUIDString()), url);
+    writeTree(newBook(filename, name.value_or(stem), identifier ? *identifier : randomUUIDString()), url);
   });
 }
 
@@ -74,7 +57,7 @@ ExitStatus makeChapter(const std::string& book, const std::string& name, const T
     const MarletBookSnapshot mustOpen(document.wrapper, document.url);
     auto contents = *document.wrapper.child("Contents");
     addTo(contents, "Chapters", newChapter(name, name));
-    write(document.wrapper, document.url);
+    writeTree(document.wrapper, document.url);
   });
 }
 
@@ -91,6 +74,6 @@ ExitStatus makePage(const std::string& book, const std::string& chapter, const s
     addTo(
         directory, "Pages",
         isCutscene ? newCutscenePage(name + ".cutscenepage", name) : newCodePage(name + ".marletpage", name));
-    write(document.wrapper, document.url);
+    writeTree(document.wrapper, document.url);
   });
 }

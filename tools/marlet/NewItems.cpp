@@ -13,11 +13,11 @@ void add(FileWrapper& parent, const std::string& name, FileWrapper child) {
   parent.addFileWrapper(std::move(child));
 }
 
-FileWrapper xml(const PropertyListValue& value) {
+}  // namespace
+
+FileWrapper xmlFile(const PropertyListValue& value) {
   return FileWrapper::regularFile(PropertyListSerialization::write(value, PropertyListFormat::xml));
 }
-
-}  // namespace
 
 FileWrapper newBook(const std::string& filename, const std::string& name, const std::string& identifier) {
   const MarletBookSnapshot book(name, filename, std::nullopt, identifier, Version({1, 0}), std::nullopt,
@@ -26,7 +26,7 @@ FileWrapper newBook(const std::string& filename, const std::string& name, const 
   if (!book.target) throw ErrorObject::posix(ENOENT, "Targets");
   auto contents = FileWrapper::directory();
   auto chapters = FileWrapper::directory();
-  add(contents, "Manifest.plist", xml(book.manifest()));
+  add(contents, "Manifest.plist", xmlFile(book.manifest()));
   auto chapter = newChapter("Start", "Start");
   auto pages = *chapter.child("Pages");
   addListed(chapter, "Pages", pages, newCodePage("Hello.marletpage", "Hello"));
@@ -41,7 +41,7 @@ FileWrapper newChapter(const std::string& filename, const std::string& name) {
   const MarletChapterSnapshot chapter(name, filename, std::nullopt, std::nullopt, std::nullopt, std::nullopt,
                                       {});
   auto directory = FileWrapper::directory();
-  add(directory, "Manifest.plist", xml(chapter.manifest()));
+  add(directory, "Manifest.plist", xmlFile(chapter.manifest()));
   add(directory, "Pages", FileWrapper::directory());
   directory.setPreferredFilename(filename);
   return directory;
@@ -75,5 +75,5 @@ void addListed(FileWrapper& parent, const std::string& key, FileWrapper& directo
   auto& entries = std::get<PropertyListDictionary>(manifest.payload);
   std::get<PropertyListValue::Array>(entries[key].payload).emplace_back(*item.preferredFilename());
   directory.addFileWrapper(std::move(item));
-  add(parent, "Manifest.plist", xml(manifest));
+  add(parent, "Manifest.plist", xmlFile(manifest));
 }

@@ -2,6 +2,7 @@
 
 #include <string>
 
+#include "MarletFoundation/Data/PropertyListValue.h"
 #include "MarletFoundation/Platform/FileWrapper.h"
 
 /// What `marlet new` writes: trees in memory. Book and chapter manifests are XML, so that an update of the
@@ -11,6 +12,8 @@ MarletFoundation::FileWrapper newBook(const std::string& filename, const std::st
 MarletFoundation::FileWrapper newChapter(const std::string& filename, const std::string& name);
 MarletFoundation::FileWrapper newCodePage(const std::string& filename, const std::string& name);
 MarletFoundation::FileWrapper newCutscenePage(const std::string& filename, const std::string& name);
+
+MarletFoundation::FileWrapper xmlFile(const MarletFoundation::PropertyListValue& value);
 
 /// Puts `item` into `directory` and at the end of the array at `key` in the manifest of `parent`. The
 /// manifest's other keys stay.

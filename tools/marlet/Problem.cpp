@@ -36,6 +36,10 @@ Problem problemOfPageLoad(const Error& error, const std::string& directory) {
   return placed(placeInPage(directory, error), error);
 }
 
+Problem problemOfMarletLoad(const Error& error, const std::string& file) {
+  return placed(placeInMarlet(error, file), error);
+}
+
 Problem warning(std::string rule, std::string description, std::string file) {
   Problem problem;
   problem.severity = "warning";

@@ -28,6 +28,8 @@ struct Problem {
 Problem problemOfBookLoad(const MarletFoundation::Error& error);
 /// The finding that the failure of a page's load amounts to; `directory` is the page's, relative to the book.
 Problem problemOfPageLoad(const MarletFoundation::Error& error, const std::string& directory);
+/// The finding that the failure of a classic document's load amounts to, in `file` where the error doesn't tell.
+Problem problemOfMarletLoad(const MarletFoundation::Error& error, const std::string& file);
 /// What a load lets pass.
 Problem warning(std::string rule, std::string description, std::string file);
 /// A path at which there is nothing to look at.

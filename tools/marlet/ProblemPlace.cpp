@@ -114,3 +114,12 @@ ProblemPlace placeInBook(const Error& error) { return placeBeneath("", error); }
 ProblemPlace placeInPage(const std::string& directory, const Error& error) {
   return placeBeneath(directory, error);
 }
+
+ProblemPlace placeInMarlet(const Error& error, const std::string& file) {
+  if (error.domain() == MarletSnapshot::SerializationError::errorDomain())
+    return {"classic." + std::string(error.caseName()),
+            error.caseName() == "notADirectory" ? std::nullopt : std::optional(file),
+            {}};
+  if (error.domain() == XMLParserErrorDomain) return {"classic.invalidXML", file, lineOf(error)};
+  return {"classic.invalid", file, {}};
+}

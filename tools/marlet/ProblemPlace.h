@@ -6,7 +6,7 @@
 
 #include "MarletFoundation/Platform/Error.h"
 
-/// Where in a book an error lies, and under which rule it is filed: both follow the innermost error.
+/// Where in a document an error lies, and under which rule it is filed: both follow the innermost error.
 struct ProblemPlace {
   std::string rule;
   std::optional<std::string> file;
@@ -17,3 +17,5 @@ struct ProblemPlace {
 ProblemPlace placeInBook(const MarletFoundation::Error& error);
 /// Of an error that was met while the page at `directory`, relative to the book, was loaded.
 ProblemPlace placeInPage(const std::string& directory, const MarletFoundation::Error& error);
+/// Of an error that was met while a classic document was loaded, in `file` where the error doesn't tell.
+ProblemPlace placeInMarlet(const MarletFoundation::Error& error, const std::string& file);

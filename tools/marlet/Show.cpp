@@ -7,6 +7,7 @@
 #include "Guarded.h"
 #include "JSON.h"
 #include "MarletFoundation/MarletFoundation.h"
+#include "ShowMarlet.h"
 
 using namespace MarletFoundation;
 using nlohmann::ordered_json;
@@ -86,11 +87,15 @@ ExitStatus show(const std::string& path, bool asJSON, const Terminal& terminal) 
     terminal.complain(printable(path) + ": " + ErrorObject(error).localizedDescription());
     return ExitStatus::unreadablePath;
   }
-  if (document->kind != DocumentKind::book) {
-    terminal.complain(printable(path) + ": this version shows books only.");
+  if (document->kind == DocumentKind::unknown) {
+    terminal.complain(printable(path) + ": this is neither a book nor a classic document.");
     return ExitStatus::negative;
   }
   try {
+    if (document->kind == DocumentKind::classic) {
+      showMarlet(*document, asJSON, terminal);
+      return ExitStatus::good;
+    }
     const MarletBookSnapshot book(document->wrapper, document->url);
     if (asJSON) {
       std::cout << dumped(json(book)) << "\n";

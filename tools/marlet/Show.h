@@ -5,5 +5,5 @@
 #include "ExitStatus.h"
 #include "Terminal.h"
 
-/// `marlet show`: a book's table of contents.
+/// `marlet show`: a document's table of contents.
 ExitStatus show(const std::string& path, bool asJSON, const Terminal& terminal);

@@ -4,6 +4,7 @@
 
 #include "ApplyCommand.h"
 #include "Check.h"
+#include "Convert.h"
 #include "DigestCommand.h"
 #include "EditCommand.h"
 #include "FatalProblem.h"
@@ -15,6 +16,7 @@
 #include "PropertyListCommand.h"
 #include "Show.h"
 #include "TagsCommand.h"
+#include "Targets.h"
 #include "TextCommand.h"
 #include "Unzip.h"
 
@@ -27,6 +29,7 @@ namespace {
 void setUpLibrary(const Terminal& terminal) {
   registerUserVisibleError<MarletBookSnapshot::SerializationError>();
   registerUserVisibleError<MarletChapterSnapshot::SerializationError>();
+  registerUserVisibleError<MarletSnapshot::SerializationError>();
   registerUserVisibleError<AssessmentInformation::SerializationError>();
   registerUserVisibleError<AssessmentStatus::SerializationError>();
   auto environment = HostEnvironment::defaults();
@@ -66,8 +69,8 @@ int run(int argc, char** argv) {
 
   std::string path;
   auto* showCommand =
-      app.add_subcommand("show", "Show a book's table of contents, with marks at the passed pages");
-  showCommand->add_option("PATH", path, "The book")->required();
+      app.add_subcommand("show", "Show a document's table of contents, with marks at the passed pages");
+  showCommand->add_option("PATH", path, "The document")->required();
   showCommand->add_flag("--json", asJSON, "Show as JSON");
   showCommand->callback([&] { status = show(path, asJSON, terminal); });
 
@@ -118,6 +121,16 @@ int run(int argc, char** argv) {
       status = makeBook(path, bookName, identifier, terminal);
     }
   });
+
+  std::string converted;
+  bool force = false;
+  auto* convertCommand =
+      app.add_subcommand("convert", "Write a classic document in its current form, or make a book of it");
+  convertCommand->add_option("DOCUMENT", path, "The classic document, of any version")->required();
+  convertCommand->add_option("-o,--output", converted, "What to write: OUT.marlet or OUT.marletbook")
+      ->required();
+  convertCommand->add_flag("--force", force, "Replace what lies there");
+  convertCommand->callback([&] { status = convert(path, converted, force, terminal); });
 
   auto form = PropertyListOutput::xml;
   std::string output = "-";
@@ -229,6 +242,10 @@ int run(int argc, char** argv) {
   digestCommand->add_option("FILE", paths, "The files")->required();
   digestCommand->add_flag("--sha1", isSHA1, "SHA-1 digests, as sha1sum prints them");
   digestCommand->callback([&] { status = printDigests(paths, isSHA1, terminal); });
+
+  auto* targetsCommand = app.add_subcommand("targets", "List the platforms that documents can be made for");
+  targetsCommand->add_flag("--json", asJSON, "List as JSON");
+  targetsCommand->callback([&] { status = listTargets(asJSON, terminal); });
 
   app.parse_complete_callback([&] { setUpLibrary(terminal); });
   try {

@@ -1,0 +1,3 @@
+for turn in 1...4 {
+    print("turn \(turn)")
+}

@@ -1,0 +1,2 @@
+// Pip is new at the lighthouse. Say hello.
+greet("Pip")

@@ -1,0 +1,1 @@
+public func greet(_ name: String) { print("Hello, \(name)!") }

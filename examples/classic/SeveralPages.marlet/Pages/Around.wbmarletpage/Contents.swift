@@ -1,0 +1,4 @@
+while true {
+    // The lamp goes round, and you stop it.
+    break
+}

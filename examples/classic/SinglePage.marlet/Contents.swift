@@ -1,0 +1,2 @@
+// One page needs no list.
+blink(times: 3)

@@ -1,0 +1,3 @@
+public func blink(times: Int) {
+    for _ in 1...times { print("*") }
+}

@@ -1,0 +1,2 @@
+// Pip counts the steps of the lighthouse.
+let steps = 12

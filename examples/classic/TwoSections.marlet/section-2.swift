@@ -1,0 +1,3 @@
+for step in 1...steps {
+    print("step \(step)")
+}

@@ -1,0 +1,121 @@
+#include "MarletFoundation/DerivedData/DerivedDataManager.h"
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <fstream>
+
+#include "MarletFoundation/Data/PropertyListSerializable.h"
+#include "MarletFoundation/Environment/Target.h"
+#include "MarletFoundation/Platform/FileManager.h"
+#include "MarletFoundation/Platform/HostEnvironment.h"
+#include "MarletFoundation/Version/MarletFoundationVersion.h"
+#include "support/Fatal.h"
+#include "support/Tree.h"
+
+namespace MarletFoundation::test {
+namespace {
+
+namespace fs = std::filesystem;
+
+class DerivedData : public testing::Test {
+ protected:
+  DerivedData() {
+    environment_ = HostEnvironment::defaults();
+    environment_.applicationSupportDirectory = directory_.url("support");
+    environment_.groupContainer = [this](std::string_view name) { return directory_.url(name); };
+    HostEnvironment::setCurrent(environment_);
+  }
+  ~DerivedData() override { HostEnvironment::setCurrent(HostEnvironment::defaults()); }
+
+  URL info() const { return directory_.url("group.CompilerDerivedData/DerivedData/DerivedDataInfo.plist"); }
+  void leaveTraces(const DerivedDataManager& manager) {
+    for (const auto* url : {&manager.derivedDataURL, &manager.privateDerivedDataURL, &manager.moduleCacheURL,
+                            &manager.codeCompletionCacheURL})
+      std::ofstream(fs::path(url->path()) / "trace") << "x";
+  }
+  int traces(const DerivedDataManager& manager) {
+    int count = 0;
+    for (const auto* url : {&manager.derivedDataURL, &manager.privateDerivedDataURL, &manager.moduleCacheURL,
+                            &manager.codeCompletionCacheURL})
+      count += fs::exists(fs::path(url->path()) / "trace");
+    return count;
+  }
+
+  const TemporaryDirectory directory_;
+  HostEnvironment environment_;
+};
+
+TEST_F(DerivedData, IsWipedWhereAnotherVersionMadeIt) {
+  const DerivedDataManager first;
+  EXPECT_EQ(first.moduleCacheURL.path(),
+            directory_.url("group.CompilerDerivedData/Library/Caches/ModuleCache").path());
+  EXPECT_EQ(first.privateDerivedDataURL.path(), directory_.url("support/PrivateDerivedData").path());
+  const auto good = *PropertyListSerialization::read(FileManager::readFile(info())).dictionary();
+  EXPECT_EQ(good,
+            (PropertyListDictionary{{"MarletFoundationVersion", MarletFoundationVersionString},
+                                    {"SDKRoot", Target::targetWithIdentifier("slateos")->SDKRoot.path()}}));
+
+  const auto with = [&](std::string_view key, std::optional<PropertyListValue> value) {
+    auto changed = good;
+    if (value) changed[key] = *value;
+    if (!value) changed.erase(key);
+    return PropertyListSerialization::write(changed, PropertyListFormat::xml);
+  };
+  const std::tuple<const char*, Data, bool> cases[] = {
+      {"same", with("Other", 1), false},
+      {"no list", Data(std::string("no list")), true},
+      {"no dictionary", PropertyListSerialization::write(1, PropertyListFormat::xml), true},
+      {"no version", with("MarletFoundationVersion", std::nullopt), true},
+      {"version no string", with("MarletFoundationVersion", 1), true},
+      {"other version", with("MarletFoundationVersion", std::string(MarletFoundationVersionString) + " "),
+       true},
+      {"no root", with("SDKRoot", std::nullopt), true},
+      {"other root", with("SDKRoot", "/elsewhere"), true},
+  };
+  for (const auto& [name, contents, isWiped] : cases) {
+    leaveTraces(first);
+    FileManager::writeFileAtomically(info(), contents);
+    const DerivedDataManager manager;
+    EXPECT_EQ(traces(manager), isWiped ? 0 : 4) << name;
+    EXPECT_EQ(FileManager::readFile(info()) == contents, !isWiped) << name;
+    for (const auto* url : {&manager.moduleCacheURL, &manager.privateDerivedDataURL})
+      EXPECT_TRUE(FileManager::isDirectory(*url)) << name;
+  }
+  fs::remove(info().path());
+  leaveTraces(first);
+  const DerivedDataManager manager;
+  EXPECT_EQ(traces(manager), 0);
+  EXPECT_TRUE(FileManager::fileExists(info()));
+}
+
+TEST_F(DerivedData, DirectoriesOfADocument) {
+  const DerivedDataManager manager;
+  const auto base = directory_.path() / "group.CompilerDerivedData/DerivedData";
+  const auto path = [&](const char* name) {
+    return directory_.url("group.CompilerDerivedData/DerivedData/" + std::string(name)).path();
+  };
+  EXPECT_EQ(manager.derivedDataDirectoryURLForMarletWithName("Foo", "abc", false).path(), path("Foo-abc"));
+  EXPECT_FALSE(fs::exists(base / "Foo-abc"));
+  EXPECT_EQ(manager.buildDirectoryURLForMarletWithName("Foo", "abc").path(), path("Foo-abc/Build"));
+  EXPECT_TRUE(fs::is_directory(base / "Foo-abc/Build"));
+  EXPECT_EQ(manager.resourcesBundlesDirectoryURLForMarletWithName("Foo", "abc").path(),
+            path("Foo-abc/ResourcesBundles"));
+  EXPECT_EQ(manager.buildDirectoryURLForMarletWithName("Foo", "abc", true, false).path(),
+            directory_.url("support/PrivateDerivedData/Foo-abc/Build").path());
+  EXPECT_EQ(manager.derivedDataDirectoryURLForMarletWithName("../../..", "x", false).path(),
+            path(".._.._..-x"));
+  std::ofstream(base / "Bar-x") << "in the way";
+  EXPECT_EQ(manager.buildDirectoryURLForMarletWithName("Bar", "x").path(), path("Bar-x/Build"));
+}
+
+TEST_F(DerivedData, WithoutAContainerIsFatal) {
+  environment_.groupContainer = [](std::string_view) { return std::nullopt; };
+  HostEnvironment::setCurrent(environment_);
+  EXPECT_EQ(fatalMessage([] { DerivedDataManager manager; }),
+            "Unable to get the dervied data container URL; is the calling process a member of the "
+            "'group.CompilerDerivedData' app group?");
+}
+
+}  // namespace
+}  // namespace MarletFoundation::test

@@ -1,0 +1,130 @@
+#include "MarletFoundation/Logging/ActivityTracer.h"
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <fstream>
+#include <regex>
+#include <sstream>
+
+#include "MarletFoundation/Logging/UserDefaultBoolKey.h"
+#include "MarletFoundation/Platform/HostEnvironment.h"
+#include "support/Tree.h"
+
+namespace MarletFoundation::test {
+namespace {
+
+using Event = ActivityTracingEvent;
+
+class ActivityTracerTest : public testing::Test {
+ protected:
+  ActivityTracerTest() {
+    auto environment = HostEnvironment::defaults();
+    environment.applicationSupportDirectory = directory_.url("support");
+    environment.systemLog = [this](std::string_view entry) { logged_ += std::string(entry) + "\n"; };
+    environment.userDefault = [](std::string_view key) {
+      return key == "Known" ? std::optional<std::int64_t>(1) : std::nullopt;
+    };
+    HostEnvironment::setCurrent(environment);
+  }
+  ~ActivityTracerTest() override { HostEnvironment::setCurrent(HostEnvironment::defaults()); }
+
+  std::vector<std::string> lines(const char* name) const {
+    std::ifstream file(directory_.path() / "support" / name);
+    std::vector<std::string> lines;
+    for (std::string line; std::getline(file, line);) lines.push_back(line);
+    return lines;
+  }
+  void finish() const {
+    // What a block queues runs behind it.
+    for (int round = 0; round < 3; ++round) tracer_->loggingQueue.sync([] {});
+  }
+
+  const TemporaryDirectory directory_;
+  std::string logged_;
+  const std::shared_ptr<ActivityTracer> tracer_ = std::make_shared<ActivityTracer>();
+};
+
+TEST_F(ActivityTracerTest, WritesALineForEachEvent) {
+  tracer_->traceEvent("Opened",
+                      {{"page", std::make_shared<StringObject>("One")}, {"count", NumberObject::integer(2)}});
+  tracer_->traceEvent("Failed", {{"when", std::make_shared<DateObject>(Date{})}});
+  tracer_->traceEvent("Bare", {});
+  finish();
+  const auto log = lines("activity.log");
+  const char* expected[] = {R"(Opened \{"count":2,"page":"One"\})", "Failed <Error Serializing JSON>",
+                            R"(Bare \{\})"};
+  ASSERT_EQ(log.size(), 3u);
+  for (std::size_t i = 0; i < 3; ++i) {
+    const std::regex form(std::string(R"(\[\d{4}-\d\d-\d\d \d\d:\d\d:\d\d \+0000\] )") + expected[i]);
+    EXPECT_TRUE(std::regex_match(log[i], form)) << log[i];
+  }
+}
+
+TEST_F(ActivityTracerTest, SpoolsTypedEvents) {
+  tracer_->traceTelvaneEvent({Event::Category::page, Event::EventType::suggestionTapped, {}});
+  tracer_->traceTelvaneEvent(
+      {Event::Category::keyboard, Event::EventType::hidden, {{"bad", std::make_shared<DateObject>(Date{})}}});
+  tracer_->traceTelvaneEvent(
+      {Event::Category::document, Event::EventType::reset, {{"n", NumberObject::real(1.5)}}});
+  finish();
+  const auto messages = lines("TelvaneReporting/Messages.jsonl");
+  ASSERT_EQ(messages.size(), 3u);
+  EXPECT_EQ(messages[0].find("{\"session\":{\"batchEvent\""), 0u) << messages[0];
+  EXPECT_EQ(messages[1], R"({"category":1,"type":10,"payload":{}})");
+  EXPECT_EQ(messages[2], R"({"category":2,"type":3,"payload":{"n":1.5}})");
+  EXPECT_EQ(logged_, "Telvane Error, dropping log message\n");
+  EXPECT_TRUE(tracer_->reporterEnabled());
+}
+
+TEST_F(ActivityTracerTest, TriesAgainWhereNoReporterCouldBeSetUp) {
+  const auto support = directory_.path() / "support";
+  std::ofstream(support) << "in the way";
+  tracer_->traceTelvaneEvent({Event::Category::page, Event::EventType::opened, {}});
+  finish();
+  EXPECT_EQ(logged_, "Telvane Error, dropping log message\nError setting up Telvane!\n");
+  EXPECT_FALSE(tracer_->reporterEnabled());
+  std::filesystem::remove(support);
+  tracer_->traceTelvaneEvent({Event::Category::page, Event::EventType::closed, {}});
+  finish();
+  EXPECT_EQ(lines("TelvaneReporting/Messages.jsonl").size(), 2u);
+}
+
+TEST_F(ActivityTracerTest, SpoolStaysBounded) {
+  MLFReporting reporting;
+  reporting.startConfiguration(
+      [](const std::vector<std::string>& results) { EXPECT_FALSE(results.empty()); });
+  for (int i = 0; i < 5; ++i) reporting.sendMessage(1, 1, StringObject(std::string(300000, 'x')));
+  const auto spool = directory_.path() / "support/TelvaneReporting";
+  EXPECT_LE(std::filesystem::file_size(spool / "Messages.jsonl"), 1u << 20);
+  EXPECT_LE(std::filesystem::file_size(spool / "Messages.old.jsonl"), 1u << 20);
+  EXPECT_EQ(
+      lines("TelvaneReporting/Messages.jsonl").size() + lines("TelvaneReporting/Messages.old.jsonl").size(),
+      6u);
+}
+
+TEST_F(ActivityTracerTest, IdentifiersPersistUntilRegenerated) {
+  const auto first = MLFReporting::persistentIdentifierForDNU("a");
+  EXPECT_EQ(MLFReporting::persistentIdentifierForDNU("a"), first);
+  EXPECT_NE(MLFReporting::persistentIdentifierForDNU("b"), first);
+  const auto second = MLFReporting::regeneratePersistentIdentifierForDNU("a");
+  EXPECT_NE(second, first);
+  EXPECT_EQ(MLFReporting::persistentIdentifierForDNU("a"), second);
+}
+
+TEST_F(ActivityTracerTest, RawValuesAndDefaults) {
+  EXPECT_FALSE(Event::categoryFromRawValue(0));
+  EXPECT_EQ(Event::categoryFromRawValue(3), Event::Category::keyboard);
+  EXPECT_FALSE(Event::categoryFromRawValue(4));
+  EXPECT_FALSE(Event::eventTypeFromRawValue(0));
+  EXPECT_EQ(Event::eventTypeFromRawValue(6), Event::EventType::hintAccessed);
+  EXPECT_FALSE(Event::eventTypeFromRawValue(11));
+
+  EXPECT_TRUE(UserDefaultBoolKey("Known", false).isEnabled);
+  EXPECT_TRUE(UserDefaultBoolKey("Unknown", true).isEnabled);
+  UserDefaults::registerDefault("Unknown", false);
+  EXPECT_FALSE(UserDefaults::boolean("Unknown"));
+}
+
+}  // namespace
+}  // namespace MarletFoundation::test

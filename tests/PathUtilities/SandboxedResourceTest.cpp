@@ -1,0 +1,156 @@
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+#include <sys/wait.h>
+
+#include <filesystem>
+#include <fstream>
+
+#include "MarletFoundation/Data/PropertyListSerializable.h"
+#include "MarletFoundation/PathUtilities/ExtendedAttributeAccess.h"
+#include "MarletFoundation/PathUtilities/MLFSandboxedResource.h"
+#include "MarletFoundation/Platform/ErrorObject.h"
+#include "MarletFoundation/Platform/FileManager.h"
+#include "MarletFoundation/Platform/HostEnvironment.h"
+#include "MarletFoundation/Platform/SecurityScope.h"
+#include "support/Tree.h"
+
+namespace MarletFoundation::test {
+namespace {
+
+namespace fs = std::filesystem;
+
+class SandboxedResource : public testing::Test {
+ protected:
+  SandboxedResource() {
+    useSupport("support");
+    std::ofstream(directory_.path() / "page") << "text";
+    fs::create_symlink("page", directory_.path() / "link");
+  }
+  ~SandboxedResource() override { HostEnvironment::setCurrent(HostEnvironment::defaults()); }
+
+  void useSupport(const char* name) {
+    auto environment = HostEnvironment::defaults();
+    environment.applicationSupportDirectory = directory_.url(name);
+    HostEnvironment::setCurrent(environment);
+  }
+  /// Exit status of another process that opens what the property list holds.
+  int openElsewhere(const PropertyListValue& object) const {
+    const auto list = directory_.url("list");
+    FileManager::writeFileAtomically(list,
+                                     PropertyListSerialization::write(object, PropertyListFormat::binary));
+    const auto command = "XDG_DATA_HOME='" + (directory_.path() / "support").string() + "' '" +
+                         OPEN_SANDBOXED_RESOURCE + "' '" + list.path() + "'";
+    return WEXITSTATUS(std::system(command.c_str()));
+  }
+
+  const TemporaryDirectory directory_;
+  const URL page_ = directory_.url("page");
+};
+
+TEST_F(SandboxedResource, GivesAccessAsLongAsItLives) {
+  const MLFSandboxedResource issued(page_);
+  EXPECT_FALSE(issued.accessingSecurityScopedResource);
+  EXPECT_EQ(issued.sandboxExtensionToken.view().back(), '\0');
+  {
+    const MLFSandboxedResource first(issued.propertyListObject()), second(issued.propertyListObject());
+    EXPECT_EQ(first.resourceURL, page_);
+    EXPECT_TRUE(second.accessingSecurityScopedResource);
+    EXPECT_EQ(SecurityScope::accessCount(page_), 2u);
+    const auto copy = first.copy();
+    EXPECT_EQ(copy->sandboxExtensionToken, issued.sandboxExtensionToken);
+    EXPECT_FALSE(copy->accessingSecurityScopedResource);
+  }
+  EXPECT_EQ(SecurityScope::accessCount(page_), 0u);
+  struct stat status;
+  ASSERT_EQ(::stat((directory_.path() / "support/MarletFoundation/SandboxSecret").c_str(), &status), 0);
+  EXPECT_EQ(status.st_mode & 0777, 0600u);
+}
+
+TEST_F(SandboxedResource, OpensInAnotherProcessUnlessForged) {
+  std::ofstream(directory_.path() / "other") << "text";
+  const auto good = MLFSandboxedResource(page_).propertyListObject();
+  EXPECT_EQ(openElsewhere(good), 0);
+
+  const auto with = [&](std::string_view key, PropertyListValue value) {
+    auto changed = *good.dictionary();
+    changed[key] = std::move(value);
+    return PropertyListValue(std::move(changed));
+  };
+  const auto token = std::string(good.dictionary()->find("sandboxExtensionToken")->data()->view());
+  const auto replaced = [&](std::string_view what, std::string_view by) {
+    auto changed = token;
+    return Data(changed.replace(changed.find(what), what.size(), by));
+  };
+  const std::pair<const char*, PropertyListValue> refused[] = {
+      {"another file", with("resourceURL", directory_.url("other").absoluteString())},
+      {"widened path", with("sandboxExtensionToken", replaced("/page", "/"))},
+      {"widened access", with("sandboxExtensionToken", replaced(";read;", ";write;"))},
+      {"flipped digit", with("sandboxExtensionToken",
+                             Data(token.substr(0, 30) + (token[30] == '0' ? "1" : "0") + token.substr(31)))},
+      {"no NUL", with("sandboxExtensionToken", Data(token.substr(0, token.size() - 1)))},
+      {"no token", with("sandboxExtensionToken", Data())},
+      {"no dictionary", "text"},
+  };
+  for (const auto& [name, object] : refused) {
+    EXPECT_EQ(openElsewhere(object), 1) << name;
+    const MLFSandboxedResource resource(object);
+    EXPECT_FALSE(resource.resourceURL) << name;
+    EXPECT_EQ(resource.copy(), nullptr);
+  }
+
+  fs::remove(directory_.path() / "page");
+  EXPECT_EQ(openElsewhere(good), 1) << "gone";
+  fs::create_symlink("other", directory_.path() / "page");
+  EXPECT_EQ(openElsewhere(good), 1) << "a link now";
+  fs::remove(directory_.path() / "page");
+  std::ofstream(directory_.path() / "page") << "text";
+  useSupport("of another user");
+  EXPECT_FALSE(MLFSandboxedResource(good).resourceURL) << "another secret";
+}
+
+TEST_F(SandboxedResource, IsRefusedForLinksAndWhatIsNotThere) {
+  const auto failure = [&](const char* name) {
+    try {
+      MLFSandboxedResource resource(directory_.url(name));
+    } catch (const ErrorObject& error) {
+      return error;
+    }
+    return ErrorObject("none", 0);
+  };
+  const auto link = failure("link");
+  EXPECT_EQ(link.localizedDescription(), "Unable to create sandbox extension for symlink");
+  EXPECT_EQ(link.localizedFailureReason(),
+            "Sandbox extensions cannot be issued for symlinks for security purposes.");
+  const auto missing = failure("missing");
+  EXPECT_EQ(missing.domain(), MarletFoundationErrorDomain);
+  EXPECT_EQ(missing.localizedDescription(), "Unable to determine if file is a symlink");
+  EXPECT_EQ(missing.underlyingError()->code(), ENOENT);
+  fs::create_directories(directory_.path() / "support/MarletFoundation/SandboxSecret");
+  const auto noSecret = failure("page");
+  EXPECT_EQ(noSecret.domain(), PosixErrorDomain);
+  EXPECT_EQ(noSecret.localizedDescription(),
+            "Cannot issue a sandbox extension for file \"" + page_.path() + "\": Operation not permitted");
+}
+
+TEST_F(SandboxedResource, ExtendedAttributesAreKeptByNameAndFlags) {
+  const MLFExtendedAttributeName name{"mark"}, flagged{"mark", MLFExtendedAttributeFlags::noExport};
+  EXPECT_FALSE(extendedAttributeExists(page_, name));
+  EXPECT_EQ(extendedAttributeValue(page_, name), std::nullopt);
+  if (!setExtendedAttribute(page_, name, "schön")) GTEST_SKIP() << "no attributes in this file system";
+  EXPECT_EQ(extendedAttributeValue(page_, name), "schön");
+  EXPECT_FALSE(extendedAttributeExists(page_, flagged));
+  EXPECT_TRUE(setBooleanExtendedAttributeValue(page_, flagged));
+  EXPECT_EQ(extendedAttributeValue(page_, flagged), "1");
+  EXPECT_TRUE(setExtendedAttribute(page_, name, ""));
+  EXPECT_EQ(extendedAttributeValue(page_, name), "");
+  setExtendedAttribute(page_, name, "\xFF");
+  EXPECT_TRUE(extendedAttributeExists(page_, name));
+  EXPECT_EQ(extendedAttributeValue(page_, name), std::nullopt);
+  removeExtendedAttribute(page_, name);
+  EXPECT_FALSE(extendedAttributeExists(page_, name));
+  EXPECT_FALSE(setExtendedAttribute(page_, {""}, "x"));
+  EXPECT_FALSE(setExtendedAttribute(page_, {std::string(300, 'x')}, "x"));
+}
+
+}  // namespace
+}  // namespace MarletFoundation::test
