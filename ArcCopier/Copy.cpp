@@ -66,7 +66,7 @@ void Copy::copy(const PlannedItem& item) {
 void Copy::copyFile(const PlannedItem& item) {
   auto chunk = reader_->next(item.entry);
   if (chunk.problem) return failed(item, chunk.problem);
-  // Of a large file it is better known before that there is no place for it.
+  // For a large file it pays to know beforehand that its place is taken.
   if (!chunk.isLast && destination_.exists(item.path.normalized)) return failedToWrite(item, EEXIST);
   const auto naming = chunk.isLast ? Destination::Naming::atOnce : Destination::Naming::whenFinished;
   Destination::File file;
@@ -92,8 +92,9 @@ void Copy::countBytes(const PlannedItem& item, std::size_t size) {
   const char* reason = nullptr;
   if (bytes_ > limits.totalBytes) reason = "the archive's files are too large";
   if (bytes_ > RatioThreshold &&
-      bytes_ / std::max<std::uint64_t>(limits.expansionRatio, 1) > directory_.archiveSize())
+      bytes_ / std::max<std::uint64_t>(limits.expansionRatio, 1) > directory_.archiveSize()) {
     reason = "the archive expands too much";
+  }
   if (!reason) return;
   copier_.call(copier_.fatalFileError, item.path.shown.c_str(), EFBIG, reason);
   throw CopyEnd{ArcCopierLimitExceeded, EFBIG};
