@@ -50,7 +50,7 @@
 #include "MarletFoundation/SourceAnnotations/EditableRanges.h"
 #include "MarletFoundation/SourceAnnotations/EditorPlaceholder.h"
 #include "MarletFoundation/SourceAnnotations/SourceTag.h"
-#include "MarletFoundation/SourceEditor/CodeCompletion.h"
+#include "MarletFoundation/SourceEditor/CodeCompletionResponder.h"
 #include "MarletFoundation/SourceEditor/CodeStructure.h"
 #include "MarletFoundation/SourceEditor/CodeTokenType.h"
 #include "MarletFoundation/SourceEditor/Issue.h"

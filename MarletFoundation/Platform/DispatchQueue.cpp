@@ -44,7 +44,7 @@ std::any DispatchQueue::currentValue(const void* key) {
   return {};
 }
 
-bool runMainQueueUntil(const std::function<bool()>& predicate, double timeout) {
+bool runUntil(const std::function<bool()>& predicate, double timeout) {
   return MainQueue::shared()->pumpUntil(predicate, DispatchTimer::after(timeout));
 }
 

@@ -34,7 +34,7 @@ enum class DispatchQuality { userInteractive, userInitiated, defaultQuality, uti
 /// - A concurrent queue starts plain blocks in that order and lets them overlap. A barrier block waits for
 ///   all blocks before it, runs alone, and holds back all blocks after it, synchronous ones too.
 /// - A global queue starts blocks in order, as threads are free. It is shared, so barriers are plain blocks.
-/// - The main queue is serial, and its blocks run on the thread that pumps it (`runMainQueueUntil`).
+/// - The main queue is serial, and its blocks run on the thread that pumps it (`runUntil`).
 ///
 /// Synchronous blocks of all but the main queue run on the caller's thread; when the queue is free, they cost
 /// no switch of threads and no allocation. Asynchronous ones run on threads of a small shared pool that grows
@@ -147,6 +147,6 @@ class MARLET_EXPORT DispatchQueue {
 /// a second while there is none, so it may look at what other threads do. Called on the main thread only, by
 /// a host without an event loop of its own, or from inside one; a block of the main queue may call it too,
 /// and then runs the blocks behind itself.
-MARLET_EXPORT bool runMainQueueUntil(const std::function<bool()>& predicate, double timeout);
+MARLET_EXPORT bool runUntil(const std::function<bool()>& predicate, double timeout);
 
 }  // namespace MarletFoundation

@@ -34,7 +34,7 @@ class Continuation {
   static Continuation background(std::function<Continuation()> f) requires std::same_as<T, Unit> {
     return onQueue(DispatchQueue::global(), std::move(f));
   }
-  /// The same on the main queue, whose blocks run as the host pumps them (`runMainQueueUntil`).
+  /// The same on the main queue, whose blocks run as the host pumps them (`runUntil`).
   static Continuation mainAsync(std::function<Continuation()> f) requires std::same_as<T, Unit> {
     return onQueue(DispatchQueue::main(), std::move(f));
   }

@@ -123,17 +123,17 @@ TEST(DispatchQueue, MainQueueRunsOnThePumpingThread) {
     EXPECT_THROW(main.sync([] { throw std::logic_error("x"); }), std::logic_error);
     result = main.sync([&] { return asyncRan && std::this_thread::get_id() == mainThread ? 7 : -1; });
   });
-  EXPECT_TRUE(runMainQueueUntil([&] { return result != 0; }, 5));
+  EXPECT_TRUE(runUntil([&] { return result != 0; }, 5));
   other.join();
   EXPECT_EQ(result, 7);
 
-  EXPECT_FALSE(runMainQueueUntil([] { return false; }, 0.01));
+  EXPECT_FALSE(runUntil([] { return false; }, 0.01));
   main.async([] { throw std::logic_error("oops"); });
-  EXPECT_EQ(fatalMessage([] { runMainQueueUntil([] { return false; }, 1); }),
+  EXPECT_EQ(fatalMessage([] { runUntil([] { return false; }, 1); }),
             "an asynchronous block ended in an error: oops");
   bool usable = false;
   main.asyncAfter(0.001, [&] { usable = true; });
-  EXPECT_TRUE(runMainQueueUntil([&] { return usable; }, 5));
+  EXPECT_TRUE(runUntil([&] { return usable; }, 5));
 }
 
 TEST(DispatchQueue, ValuesFollowTheTargetOfTheInnermostQueue) {

@@ -5,7 +5,7 @@
 #include <thread>
 
 #include "MarletFoundation/Platform/Host.h"
-#include "MarletFoundation/SourceEditor/CodeCompletion.h"
+#include "MarletFoundation/SourceEditor/CodeCompletionResponder.h"
 #include "MarletFoundation/Utils/ContinuationScheduler.h"
 #include "MarletFoundation/Utils/TimeoutContinuation.h"
 
@@ -40,7 +40,7 @@ TEST(Continuation, SchedulerRunsTheLastOfAName) {
     scheduler.scheduleContinuationWithName("one", [&] { ran += 'c'; });
   });
   EXPECT_EQ(ran, "");
-  EXPECT_TRUE(runMainQueueUntil([&] { return ran == "bc"; }, 10));
+  EXPECT_TRUE(runUntil([&] { return ran == "bc"; }, 10));
 }
 
 TEST(Continuation, TimeoutFiresOnceAfterTheLastReset) {
@@ -48,15 +48,15 @@ TEST(Continuation, TimeoutFiresOnceAfterTheLastReset) {
   TimeoutContinuation timeout(0.05, [&] { ++fired; });
   timeout.resetTimeout();
   timeout.cancel();
-  runMainQueueUntil([] { return false; }, 0.1);
+  runUntil([] { return false; }, 0.1);
   EXPECT_EQ(fired, 0);
   timeout.resetTimeout();
   timeout.resetTimeout();
-  EXPECT_TRUE(runMainQueueUntil([&] { return fired == 1; }, 10));
-  runMainQueueUntil([] { return false; }, 0.1);
+  EXPECT_TRUE(runUntil([&] { return fired == 1; }, 10));
+  runUntil([] { return false; }, 0.1);
   EXPECT_EQ(fired, 1);
   std::make_unique<TimeoutContinuation>(0.01, [&] { ++fired; })->resetTimeout();
-  runMainQueueUntil([] { return false; }, 0.1);
+  runUntil([] { return false; }, 0.1);
   EXPECT_EQ(fired, 1);
 }
 
@@ -85,12 +85,12 @@ TEST(CodeCompletionResponder, AnswersOnTheMainThreadAndIsSilentWhenTheRequesterI
     responder.completionUnavailable().run();
   }).join();
   EXPECT_EQ(editor->heard, "");
-  EXPECT_TRUE(runMainQueueUntil([&] { return editor->heard.ends_with('-'); }, 10));
+  EXPECT_TRUE(runUntil([&] { return editor->heard.ends_with('-'); }, 10));
   EXPECT_EQ(editor->heard, "T2!m.T-");
   editor.reset();
   EXPECT_EQ(responder.maxCompletions(), 0);
   EXPECT_TRUE(responder.completionUnavailable().run());
-  runMainQueueUntil([] { return false; }, 0.02);
+  runUntil([] { return false; }, 0.02);
 }
 
 }  // namespace
