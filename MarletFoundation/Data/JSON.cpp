@@ -21,10 +21,10 @@ const auto& payloadOf(const JSON& json) {
 
 JSON convert(const PropertyListObject& object, int depth);
 
-JSON::Payload convertNumber(const NumberObject& number) {
-  if (number.typeCode() == "c") return number.boolValue();
-  if (number.typeCode() == "d" || number.typeCode() == "f") return number.doubleValue();
-  return number.integerValue();
+JSON convertNumber(const NumberObject& number) {
+  if (number.typeCode() == "c") return JSON(number.boolValue());
+  if (number.typeCode() == "d" || number.typeCode() == "f") return JSON(number.doubleValue());
+  return JSON(number.integerValue());
 }
 
 JSON::Dictionary convertDictionary(const DictionaryObject& dictionary, int depth) {
@@ -38,7 +38,7 @@ JSON::Dictionary convertDictionary(const DictionaryObject& dictionary, int depth
 }
 
 JSON convert(const PropertyListObject& object, int depth) {
-  if (const auto* number = dynamic_cast<const NumberObject*>(&object)) return JSON(convertNumber(*number));
+  if (const auto* number = dynamic_cast<const NumberObject*>(&object)) return convertNumber(*number);
   if (const auto* string = dynamic_cast<const StringObject*>(&object)) return JSON(string->value);
   if (dynamic_cast<const NullObject*>(&object)) return JSON();
   if (depth == JSONSerialization::DepthLimit) throw JSONError(JSONErrorCase::InvalidType);

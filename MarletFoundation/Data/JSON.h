@@ -25,7 +25,11 @@ struct MARLET_EXPORT JSON {
   Payload payload = std::monostate();
 
   JSON() = default;
-  explicit JSON(Payload itsPayload) : payload(std::move(itsPayload)) {}
+  /// The case that holds the value's type.
+  template <class Value>
+  requires(std::constructible_from<Payload, Value> &&
+           !std::same_as<std::remove_cvref_t<Value>, JSON>) explicit JSON(Value&& value)
+      : payload(std::forward<Value>(value)) {}
   /// Parses. Throws what `JSONSerialization::read` throws.
   explicit JSON(const Data& data);
   /// Converts a tree of objects. Throws `JSONError` `InvalidType` for kinds that JSON hasn't, keys that aren't

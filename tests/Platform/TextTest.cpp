@@ -38,8 +38,9 @@ TEST(Text, illFormedUTF8GivesNothing) {
        {"\x80", "\xC0\x80", "\xC1\xBF", "\xC3", "\xE0\x9F\xBF", "\xE2\x82", "\xED\xA0\x80", "\xED\xBF\xBF",
         "\xF0\x8F\xBF\xBF", "\xF0\x9F\x98", "\xF4\x90\x80\x80", "\xF5\x80\x80\x80", "\xFF", "\xE2\x28\xA1",
         "\xF0\x9F\x28\x80"}) {
-    for (const std::size_t before : {0, 7, 8, 9}) {
-      const auto padded = std::string(before, 'x') + text + "y";
+    // In the last bytes of a text and far from them, at the seams of what is looked at together.
+    for (const std::size_t before : {0, 7, 8, 31, 32, 33, 2047, 2048, 2049}) {
+      const auto padded = std::string(before, 'x') + text + std::string(before % 2 ? 1 : 64, 'y');
       EXPECT_EQ(utf16FromUTF8(padded), std::nullopt) << testing::PrintToString(padded);
       EXPECT_EQ(utf8PrefixLength(padded), before) << testing::PrintToString(padded);
     }
@@ -52,6 +53,36 @@ TEST(Text, unpairedSurrogatesAreReplacedForPrintingOnly) {
     EXPECT_EQ(utf8FromUTF16Lossy(text), "a\uFFFD");
   }
   EXPECT_EQ(utf8FromUTF16Lossy(u"\xDC00\xD800\xD83D\xDE00"), "\uFFFD\uFFFD\U0001F600");
+}
+
+TEST(Text, everyScalarValueBetweenRunsOfEveryLength) {
+  std::string bytes;
+  std::u16string units;
+  for (char32_t value = 1; value < 0x110000; ++value) {
+    if (value == 0xD800) value = 0xE000;
+    const auto trail = [value](int shift) { return static_cast<char>(0x80 + (value >> shift) % 64); };
+    if (value < 0x80) {
+      bytes += static_cast<char>(value);
+    } else if (value < 0x800) {
+      bytes += {static_cast<char>(0xC0 + value / 64), trail(0)};
+    } else if (value < 0x10000) {
+      bytes += {static_cast<char>(0xE0 + value / 4096), trail(6), trail(0)};
+    } else {
+      bytes += {static_cast<char>(0xF0 + (value >> 18)), trail(12), trail(6), trail(0)};
+    }
+    if (value < 0x10000) {
+      units += static_cast<char16_t>(value);
+    } else {
+      units += {static_cast<char16_t>(0xD800 + (value - 0x10000) / 1024),
+                static_cast<char16_t>(0xDC00 + value % 1024)};
+    }
+    const auto run = value % 7 ? 0 : value / 7 % 80;
+    bytes.append(run, 'r');
+    units.append(run, u'r');
+  }
+  EXPECT_TRUE(utf16FromUTF8(bytes) == units);
+  EXPECT_TRUE(utf8FromUTF16(units) == bytes);
+  EXPECT_TRUE(isValidUTF8(bytes));
 }
 
 RC_GTEST_PROP(Text, conversionsAreInverse, ()) {
