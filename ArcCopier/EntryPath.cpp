@@ -56,7 +56,7 @@ Problem problemOfName(std::string_view name) {
 EntryPath entryPath(std::string_view name, bool isMarkedUTF8) {
   EntryPath path{};
   path.shown = decoded(name, isMarkedUTF8, path.problem);
-  path.isDirectory = name.ends_with('/');
+  path.isDirectory = name.ends_with('/') || name.ends_with("/.") || name == ".";
   if (!path.problem) path.problem = problemOfName(path.shown);
   for (std::size_t i; (i = path.shown.find('\0')) != std::string::npos;) path.shown.replace(i, 1, "\uFFFD");
   while (path.shown.size() > 1 && path.shown.ends_with('/')) path.shown.pop_back();

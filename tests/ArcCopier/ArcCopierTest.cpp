@@ -87,6 +87,7 @@ TEST(ArcCopier, WhatIsThereStaysAndLinksAreNotFollowed) {
                              {.name = "dangling/", .mode = 040755}}));
   const auto outside = TemporaryDirectory();
   const auto destination = extraction.destination();
+  fs::create_directory(outside.path() / "deep");
   fs::create_directories(destination / "directory");
   fs::create_directories(destination / "other");
   std::ofstream(destination / "kept") << "old";
@@ -95,7 +96,8 @@ TEST(ArcCopier, WhatIsThereStaysAndLinksAreNotFollowed) {
   fs::create_symlink(outside.path() / "nothing", destination / "dangling");
   extraction.run();
   EXPECT_EQ(extraction.result, ArcCopierSomeFilesFailed);
-  EXPECT_TRUE(fs::is_empty(outside.path()));
+  EXPECT_TRUE(fs::is_empty(outside.path() / "deep"));
+  EXPECT_TRUE(fs::remove(outside.path() / "deep") && fs::is_empty(outside.path()));
   EXPECT_EQ(extraction.files(), (Files{{"dangling", "->"},
                                        {"directory", "/"},
                                        {"kept", "old"},
@@ -105,6 +107,14 @@ TEST(ArcCopier, WhatIsThereStaysAndLinksAreNotFollowed) {
                                        {"out", "->"}}));
   EXPECT_EQ(extraction.conflicts, (std::vector<std::string>{"kept", "directory", "link", "out", "dangling"}));
   EXPECT_EQ(extraction.problems.size(), 3u);
+}
+
+TEST(ArcCopier, WhatTurnsUpMeanwhileStaysToo) {
+  Extraction extraction(zip({zeros("large", 1 << 20)}));
+  extraction.meanwhile = [&] { std::ofstream(extraction.destination() / "large") << "theirs"; };
+  extraction.run();
+  EXPECT_EQ(extraction.conflicts, std::vector<std::string>{"large"});
+  EXPECT_EQ(extraction.files(), (Files{{"large", "theirs"}}));
 }
 
 TEST(ArcCopier, CancelledFilesLeaveNothing) {

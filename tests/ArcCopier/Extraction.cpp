@@ -37,6 +37,7 @@ void Extraction::run() {
     return 0;
   });
   ArcCopierSetCopyFileUpdateHandler(copier, [](ArcCopierRef c, const char*, std::uint64_t copied) {
+    of(c).meanwhile();
     if (of(c).cancelAt != 0 && copied >= of(c).cancelAt) ArcCopierCancel(c);
     return 0;
   });

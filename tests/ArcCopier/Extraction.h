@@ -1,5 +1,6 @@
 #pragma once
 
+#include <functional>
 #include <map>
 #include <string>
 #include <vector>
@@ -22,6 +23,8 @@ class Extraction {
   ArcCopierLimits limits;
   /// Cancels when so many bytes of one file are there.
   std::uint64_t cancelAt = 0;
+  /// Called after each block.
+  std::function<void()> meanwhile = [] {};
   bool stopsAtErrors = false;
   int result = -1;
   int error = 0;

@@ -134,6 +134,7 @@ std::vector<Faulty> faultyItems() {
       {typed(0020666), "it is a device or another special file"},
       {typed(0010666), "it is a device or another special file"},
       {{.name = "x/", .contents = "bytes"}, "it is a directory with contents", "x"},
+      {named("x/."), "it is a directory with contents"},
       {named("first/good"), "its name was there before"},
       {named("first//./good"), "its name was there before"},
       {named("first/good/below"), "it lies below what is a file"},
