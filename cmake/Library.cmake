@@ -39,6 +39,6 @@ target_link_libraries(MarletFoundation PRIVATE $<BUILD_INTERFACE:marlet_options>
 # Where tests are built, so that the builds of a check, which are many, take less time. Others compile each file by itself,
 # which shows includes that are missing.
 if(MARLET_BUILD_TESTS)
-  target_precompile_headers(MarletFoundation PRIVATE <algorithm> <filesystem> <functional> <map> <memory> <optional>
+  target_precompile_headers(MarletFoundation PRIVATE <algorithm> <functional> <map> <memory> <optional>
                             <string> <variant> <vector>)
 endif()

@@ -1,5 +1,6 @@
 #include "BookDiffCommand.h"
 
+#include <filesystem>
 #include <iostream>
 #include <set>
 
@@ -7,6 +8,7 @@
 #include "Hunks.h"
 #include "JSON.h"
 #include "MarletFoundation/MarletFoundation.h"
+#include "Writing.h"
 
 using namespace MarletFoundation;
 using nlohmann::ordered_json;
@@ -43,12 +45,31 @@ void requireNoCollision(const DiffPackSnapshot& pack) {
   }
 }
 
-void writePack(const DiffPackSnapshot& pack, const std::string& output) {
+/// A pack carries regular files only.
+void requireNoLinks(const DiffPackSnapshot& pack, const URL& updated) {
+  const auto contents = std::filesystem::path(updated.path()) / "Contents";
+  for (const auto& entry : pack.updates) {
+    const auto path = fileInPack(entry);
+    std::error_code unknown;
+    if (path && std::filesystem::is_symlink(contents / *path, unknown))
+      throw CommandFailure{ExitStatus::negative, *path + ": a pack can't carry a symbolic link."};
+  }
+}
+
+/// A former pack may be replaced, but nothing else.
+void requireNothingButAPackAt(const URL& url) {
+  const std::filesystem::path place = url.path();
+  if (!std::filesystem::exists(place / "Manifest.plist")) requireNothingAt(place);
+}
+
+void writePack(const DiffPackSnapshot& pack, const URL& updated, const std::string& output) {
   const auto url = URL::file(output, true).standardized();
   if (url.pathExtension() != "diffpack") {
     throw CommandFailure{ExitStatus::wrongUsage, output + ": a pack's name ends in .diffpack."};
   }
   requireNoCollision(pack);
+  requireNoLinks(pack, updated);
+  requireNothingButAPackAt(url);
   orFailWith(ExitStatus::failedWrite, output, [&] { pack.fileWrapper().write(url); });
 }
 
@@ -89,8 +110,9 @@ ExitStatus diffBooks(const std::string& original, const std::string& updated, co
       });
     };
     const auto originalUrl = urlOf(original);
-    const auto pack = makeUpdateDiffPack(originalUrl, urlOf(updated));
-    if (options.output) writePack(pack, *options.output);
+    const auto updatedUrl = urlOf(updated);
+    const auto pack = makeUpdateDiffPack(originalUrl, updatedUrl);
+    if (options.output) writePack(pack, updatedUrl, *options.output);
     if (options.asJSON) {
       std::cout << dumped(json(pack)) << "\n";
     } else if (!options.output || options.withHunks) {
