@@ -24,19 +24,12 @@ struct Book {
 /// Throws `CommandFailure` for a path that can't be read or is no book.
 Document openBookDocument(const std::string& path);
 
-/// What `use` makes of the book at the path. A book that another process replaces meanwhile is opened again,
-/// so that the answer is about the old one or the new one and no mixture; `use` may thus run more than once.
+/// What `use` makes of the book at the path; see `withSettled`.
 template <class Use>
 auto withBook(const std::string& path, Use use) {
-  constexpr int mostAttempts = 1000;
-  for (int attempt = 1;; ++attempt) {
-    const auto document = openBookDocument(path);
-    try {
-      const Book book(document);
-      auto result = use(book);
-      if (!document.wrapper.wasReplaced() || attempt == mostAttempts) return result;
-    } catch (...) {
-      if (!document.wrapper.wasReplaced() || attempt == mostAttempts) throw;
-    }
-  }
+  return withSettled([&] { return openBookDocument(path); },
+                     [&](const Document& document) {
+                       const Book book(document);
+                       return use(book);
+                     });
 }

@@ -16,8 +16,8 @@ namespace {
 
 struct Report {
   std::string path;
-  std::string kind = "unknown";
-  bool isReadable = true;
+  std::string kind;
+  bool isReadable;
   std::vector<Problem> problems;
 
   bool isOK() const {
@@ -26,30 +26,27 @@ struct Report {
   }
 };
 
-Report report(const std::string& path) {
-  Report report{path, "unknown", true, {}};
-  try {
-    const Document document(path);
-    switch (document.kind) {
-      case DocumentKind::book:
-        report.kind = "book";
-        report.problems = problemsOfBook(document);
-        break;
-      case DocumentKind::classic:
-        report.kind = "classic";
-        report.problems = problemsOfMarlet(document);
-        break;
-      case DocumentKind::unknown:
-        report.problems.emplace_back();
-        report.problems[0].rule = "document.unknownKind";
-        report.problems[0].description = "This is neither a book nor a classic document.";
-        break;
-    }
-  } catch (const Error& error) {
-    report.isReadable = false;
-    report.problems = {problemOfUnreadablePath(error)};
+Report reportOf(const Document& document) {
+  switch (document.kind) {
+    case DocumentKind::book:
+      return {document.path, "book", true, problemsOfBook(document)};
+    case DocumentKind::classic:
+      return {document.path, "classic", true, problemsOfMarlet(document)};
+    case DocumentKind::unknown:
+      break;
   }
-  return report;
+  Problem problem;
+  problem.rule = "document.unknownKind";
+  problem.description = "This is neither a book nor a classic document.";
+  return {document.path, "unknown", true, {problem}};
+}
+
+Report report(const std::string& path) {
+  try {
+    return withSettled([&] { return Document(path); }, reportOf);
+  } catch (const Error& error) {
+    return {path, "unknown", false, {problemOfUnreadablePath(error)}};
+  }
 }
 
 nlohmann::ordered_json json(const Report& report) {

@@ -16,3 +16,20 @@ struct Document {
   /// Throws the file error when the path can't be read at all.
   explicit Document(const std::string& path);
 };
+
+/// What `use` makes of the document that `open` opens. One that another process replaces meanwhile is opened
+/// again, so that the answer is about the old one or the new one and no mixture; `use` may thus run more than once.
+template <class Open, class Use>
+auto withSettled(Open open, Use use) {
+  constexpr int mostAttempts = 1000;
+  for (int attempt = 1;; ++attempt) {
+    const Document document = open();
+    const auto isSettled = [&] { return !document.wrapper.wasReplaced() || attempt == mostAttempts; };
+    try {
+      auto result = use(document);
+      if (isSettled()) return result;
+    } catch (...) {
+      if (isSettled()) throw;
+    }
+  }
+}

@@ -66,10 +66,14 @@ void printSummary(const BookPageSnapshotType& page, const Terminal& terminal) {
 ExitStatus showPage(const std::string& book, const std::string& chapter, const std::string& page,
                     PageOutput output, const Terminal& terminal) {
   return guarded(book + ": " + chapter + ": " + page, terminal, [&] {
-    const auto document = orFailWith(ExitStatus::unreadablePath, book, [&] { return Document(book); });
-    std::optional<DiffPackSnapshot> pack;
-    const MarletBookSnapshot snapshot(document.wrapper, document.url, pack);
-    const auto fetched = snapshotForPageWithFilename(page, chapter, document.url, &snapshot, pack);
+    const auto open = [&] {
+      return orFailWith(ExitStatus::unreadablePath, book, [&] { return Document(book); });
+    };
+    const auto fetched = withSettled(open, [&](const Document& document) {
+      std::optional<DiffPackSnapshot> pack;
+      const MarletBookSnapshot snapshot(document.wrapper, document.url, pack);
+      return snapshotForPageWithFilename(page, chapter, document.url, &snapshot, pack);
+    });
     const auto* code = dynamic_cast<const MarletPageSnapshotType*>(fetched.get());
     if (output == PageOutput::summary) {
       printSummary(*fetched, terminal);

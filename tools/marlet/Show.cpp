@@ -1,9 +1,9 @@
 #include "Show.h"
 
+#include <functional>
 #include <iostream>
 
 #include "Document.h"
-#include "FatalProblem.h"
 #include "Guarded.h"
 #include "JSON.h"
 #include "MarletFoundation/MarletFoundation.h"
@@ -77,38 +77,32 @@ void printTree(const MarletBookSnapshot& book, const Terminal& terminal) {
   }
 }
 
+void showBook(const MarletBookSnapshot& book, bool asJSON, const Terminal& terminal) {
+  if (asJSON) {
+    std::cout << dumped(json(book)) << "\n";
+  } else {
+    printTree(book, terminal);
+  }
+}
+
 }  // namespace
 
 ExitStatus show(const std::string& path, bool asJSON, const Terminal& terminal) {
-  std::optional<Document> document;
-  try {
-    document.emplace(path);
-  } catch (const Error& error) {
-    terminal.complain(printable(path) + ": " + ErrorObject(error).localizedDescription());
-    return ExitStatus::unreadablePath;
-  }
-  if (document->kind == DocumentKind::unknown) {
-    terminal.complain(printable(path) + ": this is neither a book nor a classic document.");
-    return ExitStatus::negative;
-  }
-  try {
-    if (document->kind == DocumentKind::classic) {
-      showMarlet(*document, asJSON, terminal);
-      return ExitStatus::good;
-    }
-    const MarletBookSnapshot book(document->wrapper, document->url);
-    if (asJSON) {
-      std::cout << dumped(json(book)) << "\n";
-    } else {
-      printTree(book, terminal);
-    }
+  return guarded(path, terminal, [&] {
+    const auto open = [&] {
+      return orFailWith(ExitStatus::unreadablePath, path, [&] { return Document(path); });
+    };
+    const auto print = withSettled(open, [&](const Document& document) -> std::function<void()> {
+      if (document.kind == DocumentKind::unknown)
+        throw CommandFailure{ExitStatus::negative, path + ": this is neither a book nor a classic document."};
+      if (document.kind == DocumentKind::classic) {
+        const auto marlet = std::make_shared<const MarletSnapshot>(document.wrapper, document.url);
+        return [=, &terminal] { showMarlet(*marlet, asJSON, terminal); };
+      }
+      const auto book = std::make_shared<const MarletBookSnapshot>(document.wrapper, document.url);
+      return [=, &terminal] { showBook(*book, asJSON, terminal); };
+    });
+    print();
     return ExitStatus::good;
-  } catch (const Error& error) {
-    terminal.complain(printable(path + ": " + wordsWithSuggestion(error)));
-  } catch (const FatalProblem& fatal) {
-    terminal.complain(printable(path + ": " + fatal.message));
-  } catch (const NotRepresentable& reason) {
-    terminal.complain(printable(path) + ": " + reason.what());
-  }
-  return ExitStatus::negative;
+  });
 }

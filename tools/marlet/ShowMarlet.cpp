@@ -3,7 +3,6 @@
 #include <iostream>
 
 #include "JSON.h"
-#include "MarletFoundation/MarletFoundation.h"
 
 using namespace MarletFoundation;
 using nlohmann::ordered_json;
@@ -42,8 +41,7 @@ void printTree(const MarletSnapshot& marlet, const Terminal& terminal) {
 
 }  // namespace
 
-void showMarlet(const Document& document, bool asJSON, const Terminal& terminal) {
-  const MarletSnapshot marlet(document.wrapper, document.url);
+void showMarlet(const MarletSnapshot& marlet, bool asJSON, const Terminal& terminal) {
   if (asJSON) {
     std::cout << dumped(json(marlet)) << "\n";
   } else {

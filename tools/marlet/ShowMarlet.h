@@ -1,7 +1,7 @@
 #pragma once
 
-#include "Document.h"
+#include "MarletFoundation/MarletFoundation.h"
 #include "Terminal.h"
 
-/// Prints a classic document's pages and what it shares among them. Throws what its load throws.
-void showMarlet(const Document& document, bool asJSON, const Terminal& terminal);
+/// Prints a classic document's pages and what it shares among them.
+void showMarlet(const MarletFoundation::MarletSnapshot& marlet, bool asJSON, const Terminal& terminal);
