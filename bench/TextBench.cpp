@@ -142,6 +142,7 @@ void convertOnceWithICU(benchmark::State& state, const std::string& (*text)()) {
   BENCHMARK_CAPTURE(peers, text, text)->Unit(benchmark::unit)
 COMPARE_IN(kMicrosecond, decodeOurs, decodeICU, ascii);
 COMPARE_IN(kMicrosecond, decodeOurs, decodeICU, mixed);
+COMPARE_IN(kMicrosecond, decodeOurs, decodeICU, accented);
 COMPARE_IN(kMicrosecond, encodeOurs, encodeICU, ascii);
 COMPARE_IN(kMicrosecond, encodeOurs, encodeICU, mixed);
 COMPARE_IN(kMillisecond, convertRanges, convertOnceWithICU, ascii);
