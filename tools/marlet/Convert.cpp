@@ -1,6 +1,7 @@
 #include "Convert.h"
 
 #include <algorithm>
+#include <set>
 
 #include "ConvertedBook.h"
 #include "Document.h"
@@ -39,6 +40,31 @@ FileWrapper currentForm(const MarletSnapshot& marlet, const std::string& path, c
   return tree;
 }
 
+/// What lies in the document without being part of it, and so isn't carried over: directories that its version has
+/// none of, and pages that its list doesn't name.
+std::vector<std::string> leftOut(const Document& document, const MarletSnapshot& marlet) {
+  std::vector<std::optional<URL>> carried{marlet.sharedSourcesDirectoryURL,
+                                          marlet.sharedResourcesDirectoryURL};
+  std::set<std::string> filenames;
+  for (const auto& page : marlet.pages) {
+    carried.insert(carried.end(), {page.sourcesDirectoryURL(), page.resourcesDirectoryURL()});
+    filenames.insert(page.filename());
+  }
+  std::vector<std::string> names;
+  for (const std::string name : {SourcesDirectoryName, ResourcesDirectoryName}) {
+    const auto url = document.url.appendingPathComponent(name, true);
+    if (document.wrapper.child(name) && std::find(carried.begin(), carried.end(), url) == carried.end())
+      names.push_back(name);
+  }
+  const auto pages = document.wrapper.child("Pages");
+  const auto children = pages ? pages->fileWrappers() : std::nullopt;
+  if (!children) return names;
+  for (const auto& [name, page] : *children) {
+    if (page.isDirectory() && !filenames.contains(name)) names.push_back("Pages/" + name);
+  }
+  return names;
+}
+
 std::string counted(std::size_t number, const std::string& noun) {
   return std::to_string(number) + " " + noun + (number == 1 ? "" : "s");
 }
@@ -65,6 +91,8 @@ ExitStatus convert(const std::string& path, const std::string& output, bool forc
     terminal.note(printable("read " + path + ": version " + version + ", " +
                             (manifest.didJoinSections() ? "its sections joined in one page"
                                                         : counted(marlet.pages.size(), "page"))));
+    for (const auto& name : leftOut(document, marlet))
+      terminal.complain(printable(path + ": left out, since it is no part of the document: " + name));
     writeTree(makesBook ? bookOfMarlet(marlet, path, url) : currentForm(marlet, path, url), url);
     const std::string form = makesBook ? "a book" : marlet.isSinglePage() ? "version 5.0" : "version 6.0";
     terminal.note(printable("wrote " + output + ": " + form + ", " + counted(marlet.pages.size(), "page")));

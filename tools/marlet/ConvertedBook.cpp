@@ -34,8 +34,9 @@ FileWrapper chapterOf(const MarletSnapshot& marlet) {
   Children pages;
   for (const auto& classic : marlet.pages) {
     const auto page = bookPage(classic, marlet.name);
+    // A list may name one page twice.
+    if (!pages.try_emplace(page.filename(), page.fileWrapper()).second) continue;
     placeholders.emplace_back(page.name(), page.filename(), std::nullopt, std::nullopt);
-    pages.insert_or_assign(page.filename(), page.fileWrapper());
   }
   const MarletChapterSnapshot chapter(marlet.name, chapterFilename, std::nullopt, std::nullopt, std::nullopt,
                                       std::nullopt, std::move(placeholders));
