@@ -51,10 +51,10 @@ std::vector<std::string> leftOut(const Document& document, const MarletSnapshot&
     filenames.insert(page.filename());
   }
   std::vector<std::string> names;
-  for (const std::string name : {SourcesDirectoryName, ResourcesDirectoryName}) {
+  for (const auto name : {SourcesDirectoryName, ResourcesDirectoryName}) {
     const auto url = document.url.appendingPathComponent(name, true);
     if (document.wrapper.child(name) && std::find(carried.begin(), carried.end(), url) == carried.end())
-      names.push_back(name);
+      names.emplace_back(name);
   }
   const auto pages = document.wrapper.child("Pages");
   const auto children = pages ? pages->fileWrappers() : std::nullopt;
