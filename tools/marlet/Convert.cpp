@@ -91,9 +91,10 @@ ExitStatus convert(const std::string& path, const std::string& output, bool forc
     terminal.note(printable("read " + path + ": version " + version + ", " +
                             (manifest.didJoinSections() ? "its sections joined in one page"
                                                         : counted(marlet.pages.size(), "page"))));
+    const auto tree = makesBook ? bookOfMarlet(marlet, path, url) : currentForm(marlet, path, url);
     for (const auto& name : leftOut(document, marlet))
       terminal.complain(printable(path + ": left out, since it is no part of the document: " + name));
-    writeTree(makesBook ? bookOfMarlet(marlet, path, url) : currentForm(marlet, path, url), url);
+    writeTree(tree, url);
     const std::string form = makesBook ? "a book" : marlet.isSinglePage() ? "version 5.0" : "version 6.0";
     terminal.note(printable("wrote " + output + ": " + form + ", " + counted(marlet.pages.size(), "page")));
     return ExitStatus::good;
