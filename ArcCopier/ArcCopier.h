@@ -19,9 +19,9 @@
 /// name, an entry below a file; encryption, a compression other than deflate, a wrong checksum or size.
 ///
 /// Nothing is written outside of the destination and no symbolic link below it is followed. What exists there
-/// already stays. A file gets its name only once it is known to be whole and its checksum to be right. Names are UTF-8, marked as
-/// such or not, else code page 437. Of the modes only the permissions count, under the process's umask; times
-/// are those of the extraction.
+/// already stays. A file gets its name only once it is known to be whole and its checksum to be right. Names are
+/// UTF-8, marked as such or not, else code page 437. Of the modes only the permissions count, under the process's
+/// umask; times are those of the extraction.
 #ifdef __cplusplus
 extern "C" {
 #endif

@@ -10,7 +10,8 @@ namespace MarletFoundation {
 namespace {
 
 void readLimit(std::string_view key, std::uint64_t& limit) {
-  const auto value = HostEnvironment::current().userDefault(key);
+  const auto& userDefault = HostEnvironment::current().userDefault;
+  const auto value = userDefault ? userDefault(key) : std::nullopt;
   if (value && *value > 0) limit = static_cast<std::uint64_t>(*value);
 }
 
