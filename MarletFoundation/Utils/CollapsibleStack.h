@@ -175,26 +175,26 @@ void CollapsibleStack<Element>::collapseEntries(
     const std::function<StackCollapsingDecision(const Element&, const Element*)>& iterator,
     const std::function<std::optional<Element>(const StackSlice<Element>&)>& replacer) {
   struct Run {
-    Entry* bottom;
-    Entry* top;
-    std::size_t count;
+    Entry* bottom = nullptr;
+    Entry* top = nullptr;
+    std::size_t count = 0;
   };
   std::vector<Run> runs;
-  std::optional<Run> open;
+  // The run that has begun, if it has a bottom.
+  Run open;
   for (auto* entry = onlyUncollapsed ? oldestUncollapsed() : bottom_; entry; entry = entry->nextEntry) {
     switch (iterator(entry->object, entry->nextEntry ? &entry->nextEntry->object : nullptr)) {
       case StackCollapsingDecision::MarkBegin:
-        open = Run{entry, nullptr, 1};
+        open = {entry, nullptr, 1};
         break;
       case StackCollapsingDecision::Continue:
-        if (open) ++open->count;
+        ++open.count;
         break;
       case StackCollapsingDecision::MarkEnd:
-        if (!open) break;
-        runs.push_back({open->bottom, entry, open->count + 1});
+        if (open.bottom) runs.push_back({open.bottom, entry, open.count + 1});
         [[fallthrough]];
       case StackCollapsingDecision::CancelGrouping:
-        open.reset();
+        open = {};
     }
   }
   for (const auto& run : runs) {

@@ -34,12 +34,13 @@ struct Naive {
       std::size_t begin, end;
     };
     std::vector<Run> runs;
-    std::optional<std::size_t> open;
+    constexpr auto none = static_cast<std::size_t>(-1);
+    auto open = none;
     for (auto i = onlyUncollapsed ? folded : 0; i < entries.size(); ++i) {
       const auto decision = decide(entries[i]);
       if (decision == Decision::MarkBegin) open = i;
-      if (decision == Decision::MarkEnd && open) runs.push_back({*open, i + 1});
-      if (decision == Decision::MarkEnd || decision == Decision::CancelGrouping) open.reset();
+      if (decision == Decision::MarkEnd && open != none) runs.push_back({open, i + 1});
+      if (decision == Decision::MarkEnd || decision == Decision::CancelGrouping) open = none;
     }
     std::ptrdiff_t shift = 0;
     for (const auto& run : runs) {
