@@ -22,9 +22,10 @@ const auto& payloadOf(const JSON& json) {
 JSON convert(const PropertyListObject& object, int depth);
 
 JSON convertNumber(const NumberObject& number) {
-  if (number.typeCode() == "c") return JSON(number.boolValue());
-  if (number.typeCode() == "d" || number.typeCode() == "f") return JSON(number.doubleValue());
-  return JSON(number.integerValue());
+  using JSONSerialization::NumberKind;
+  const auto kind = JSONSerialization::kindOf(number);
+  if (kind == NumberKind::boolean) return JSON(number.boolValue());
+  return kind == NumberKind::real ? JSON(number.doubleValue()) : JSON(number.integerValue());
 }
 
 JSON::Dictionary convertDictionary(const DictionaryObject& dictionary, int depth) {

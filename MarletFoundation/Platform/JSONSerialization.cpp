@@ -76,8 +76,9 @@ class Reader final : public nlohmann::json_sax<nlohmann::json> {
 Library treeOf(const PropertyListObject& object, int depth);
 
 Library treeOfNumber(const NumberObject& number) {
-  if (number.typeCode() == "c") return number.boolValue();
-  if (number.typeCode() != "d" && number.typeCode() != "f") return number.integerValue();
+  const auto kind = kindOf(number);
+  if (kind == NumberKind::boolean) return number.boolValue();
+  if (kind == NumberKind::integer) return number.integerValue();
   if (!std::isfinite(number.doubleValue())) fail("JSON has no form for numbers that aren't finite.");
   return number.doubleValue();
 }
@@ -107,6 +108,12 @@ Library treeOf(const PropertyListObject& object, int depth) {
 }
 
 }  // namespace
+
+NumberKind kindOf(const NumberObject& number) {
+  const auto& code = number.typeCode();
+  if (code == "c" || code == "C" || code == "B") return NumberKind::boolean;
+  return code == "d" || code == "f" ? NumberKind::real : NumberKind::integer;
+}
 
 PropertyListObjectPointer read(const Data& data) {
   Reader reader;

@@ -15,9 +15,13 @@ class MARLET_EXPORT NullObject final : public PropertyListObject {
   std::size_t hash() const override { return 0; }
 };
 
-/// Objects from and to JSON: strings, arrays, dictionaries, null, and numbers with the type codes "c" for a
-/// boolean, "q" for an integer and "d" for a real.
+/// Objects from and to JSON: strings, arrays, dictionaries, null, and numbers. Those that are read have the type
+/// codes "c" for a boolean, "q" for an integer and "d" for a real.
 namespace JSONSerialization {
+
+/// What a number is by its type code: "c", "C" and "B" tell a boolean, "f" and "d" a real, all others an integer.
+enum class NumberKind { boolean, integer, real };
+MARLET_EXPORT NumberKind kindOf(const NumberObject& number);
 
 /// The domain of what goes wrong here.
 inline constexpr std::string_view ErrorDomain = "MarletFoundation.JSONSerialization";

@@ -60,6 +60,8 @@ TEST(JSON, RefusesObjectsOfOtherKinds) {
   }
   EXPECT_THROW(JSONSerialization::write(*NumberObject::real(1.0 / 0.0)), ErrorObject);
   EXPECT_EQ(JSON(NumberObject("i", std::int64_t{7})), JSON(7));
+  EXPECT_EQ(JSON(NumberObject("B", std::int64_t{1})), JSON(true));
+  EXPECT_EQ(JSONSerialization::write(NumberObject("B", std::int64_t{1})), "true");
 }
 
 struct Half {

@@ -1,11 +1,13 @@
 #include <gtest/gtest.h>
 #include <rapidcheck.h>
 
+#include "MarletFoundation/Marlet/CutsceneBookPage.h"
 #include "MarletFoundation/Marlet/MarletBook.h"
 #include "MarletFoundation/Marlet/MarletBookPage.h"
 #include "MarletFoundation/Platform/HostEnvironment.h"
 #include "MarletFoundation/Platform/Text.h"
 #include "support/Documents.h"
+#include "support/Tree.h"
 
 namespace MarletFoundation::test {
 namespace {
@@ -20,11 +22,14 @@ std::optional<std::string> optionalText() {
   return *rc::gen::arbitrary<bool>() ? std::optional(text()) : std::nullopt;
 }
 
-MarletHint hint() {
+/// With resources, a hint may be the file that lies in them.
+MarletHint hint(bool hasResources) {
   const auto title = optionalText();
-  return {MarletHint::Contents{text()},
-          title ? MarletHint::PresentationType(MarletHint::HiddenWithSpoilerInstruction{*title})
-                : MarletHint::AlwaysVisible{}};
+  const auto inlined = MarletHint::ContentType(MarletHint::Contents{text()});
+  return {
+      hasResources && *rc::gen::arbitrary<bool>() ? MarletHint::FileReference{"Count.", "hint.md"} : inlined,
+      title ? MarletHint::PresentationType(MarletHint::HiddenWithSpoilerInstruction{*title})
+            : MarletHint::AlwaysVisible{}};
 }
 
 MarletResultInfoSnapshot resultInfo() {
@@ -39,20 +44,31 @@ MarletResultInfoSnapshot resultInfo() {
   return {assessment, results};
 }
 
+/// What a page's URLs lead to.
+const Tree pageFiles{{"Sources/Turtle.swift", "// steps"},
+                     {"Resources/hint.md", "Count."},
+                     {"Resources/scene.html", "<p>"},
+                     {"LiveView.swift", "// sea"}};
+
 MarletBookPageSnapshot page(const URL& url) {
+  const auto maybe = [&](const char* name, bool isDirectory) {
+    return *rc::gen::arbitrary<bool>() ? std::optional(url.appendingPathComponent(name, isDirectory))
+                                       : std::nullopt;
+  };
+  const auto resources = maybe("Resources", true);
   const auto mode = *rc::gen::element(LiveViewMode::HiddenByDefault, LiveViewMode::VisibleByDefault);
   const auto logging = *rc::gen::element(MarletLoggingMode::Normal, MarletLoggingMode::Off);
   std::vector<MarletHint> hints;
-  for (int count = *rc::gen::inRange(0, 4); count > 0; --count) hints.push_back(hint());
+  for (int count = *rc::gen::inRange(0, 4); count > 0; --count) hints.push_back(hint(resources.has_value()));
   return {text(),
           optionalText(),
-          std::nullopt,
+          resources ? optionalText() : std::nullopt,
           url.lastPathComponent(),
           *utf16FromUTF8(text() + "🌊"),
           resultInfo(),
-          std::nullopt,
-          std::nullopt,
-          std::nullopt,
+          maybe("Sources", true),
+          resources,
+          maybe("LiveView.swift", false),
           mode,
           *rc::gen::arbitrary<bool>(),
           optionalText(),
@@ -72,7 +88,9 @@ std::string failure(const URL& url) {
 }  // namespace
 
 TEST(LivePage, ReadOfAWriteIsThePage) {
-  const auto url = URL::file("/b/P.marletpage", true);
+  const TemporaryDirectory directory;
+  pageFiles.writeTo(directory.path());
+  const auto url = directory.url();
   const auto former = HostEnvironment::current();
   auto silent = former;
   silent.diagnostics = [](std::string_view) {};
@@ -83,6 +101,13 @@ TEST(LivePage, ReadOfAWriteIsThePage) {
     RC_ASSERT(MarletBookPage(snapshot).snapshot() == snapshot);
   }));
   HostEnvironment::setCurrent(former);
+  EXPECT_TRUE(rc::check("read . write = id, for cutscenes", [&] {
+    const CutsceneBookPageSnapshot snapshot(text(), url.lastPathComponent(), "scene.html", optionalText(),
+                                            optionalText(), url.appendingPathComponent("Resources", true),
+                                            optionalText());
+    RC_ASSERT(CutsceneBookPageSnapshot(snapshot.fileWrapper(), url) == snapshot);
+    RC_ASSERT(CutsceneBookPage(snapshot).snapshot() == snapshot);
+  }));
 }
 
 TEST(LivePage, EditsDontShowInASnapshotAlreadyTaken) {
