@@ -22,7 +22,9 @@ target_link_libraries(ArcCopier PRIVATE marlet_options LibArchive::LibArchive)
 
 add_library(MarletFoundation SHARED ${MARLET_SOURCES})
 add_library(MarletFoundation::MarletFoundation ALIAS MarletFoundation)
-set_target_properties(MarletFoundation PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${PROJECT_VERSION_MAJOR})
+# Before 1.0 the interface may change with each minor version.
+set(MARLET_SOVERSION ${PROJECT_VERSION_MAJOR}.${PROJECT_VERSION_MINOR})
+set_target_properties(MarletFoundation PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${MARLET_SOVERSION})
 target_include_directories(MarletFoundation PUBLIC $<BUILD_INTERFACE:${CMAKE_SOURCE_DIR}>
                                                    $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
 target_compile_features(MarletFoundation PUBLIC cxx_std_20)
