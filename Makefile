@@ -40,12 +40,13 @@ fuzz:
 	fuzz/run $(FUZZ_SECONDS)
 
 embed:
-	scripts/install-dependencies
+	scripts/install-dependencies --develop
 	$(call configure,debug)
 	cmake --build --preset debug
 	scripts/test-install
 
 package: marlet
+	scripts/install-dependencies --develop
 	cmake --build --preset release --target package
 	scripts/test-install build/release/*.deb
 
