@@ -2,11 +2,6 @@
 
 namespace {
 
-/// A command as the script keeps it: its words, each behind a blank.
-std::string key(const CommandRow& command) {
-  return command.words.empty() ? "" : " " + joined(command.words, " ");
-}
-
 std::string inQuotes(const std::string& text) { return "\"" + text + "\""; }
 
 /// Patterns that match an option where the script meets it, "COMMAND FLAG".
@@ -14,7 +9,7 @@ std::string flagPatterns(const CommandRow& command, const OptionRow& option) {
   std::string patterns;
   for (const auto& flag : option.flags) {
     if (!patterns.empty()) patterns += " | ";
-    patterns += (command.words.empty() ? "*" : "") + inQuotes(key(command) + " " + flag);
+    patterns += (command.words.empty() ? "*" : "") + inQuotes(command.key() + " " + flag);
   }
   return patterns;
 }
@@ -35,7 +30,7 @@ void printWalk(const std::vector<CommandRow>& table, std::ostream& out) {
   std::string commands;
   std::vector<std::string> values;
   for (const auto& command : table) {
-    if (!command.words.empty()) commands += (commands.empty() ? "" : " | ") + inQuotes(key(command));
+    if (!command.words.empty()) commands += (commands.empty() ? "" : " | ") + inQuotes(command.key());
     for (const auto& option : command.options)
       if (!option.operand.empty()) values.push_back(flagPatterns(command, option));
   }
@@ -60,7 +55,7 @@ void printFlags(const std::vector<CommandRow>& table, std::ostream& out) {
     std::vector<std::string> flags;
     for (const auto& option : optionsTaken(command, table))
       flags.insert(flags.end(), option.flags.begin(), option.flags.end());
-    out << "      " << inQuotes(key(command)) << ") _marlet_answer -W '" << joined(flags, " ") << "' ;;\n";
+    out << "      " << inQuotes(command.key()) << ") _marlet_answer -W '" << joined(flags, " ") << "' ;;\n";
   }
   out << "    esac\n    return\n  fi\n";
 }
@@ -73,8 +68,8 @@ void printOperands(const std::vector<CommandRow>& table, std::ostream& out) {
     auto operands = command.operands;
     if (operands.empty() && !names.empty()) operands.emplace_back();
     for (std::size_t i = 0; i < operands.size(); ++i) {
-      const auto place = operands[i].isRepeatable ? inQuotes(key(command) + ":") + "*"
-                                                  : inQuotes(key(command) + ":" + std::to_string(i));
+      const auto place = operands[i].isRepeatable ? inQuotes(command.key() + ":") + "*"
+                                                  : inQuotes(command.key() + ":" + std::to_string(i));
       out << "    " << place << ") " << answer(operands[i], i == 0 ? names : std::vector<std::string>())
           << " ;;\n";
     }

@@ -11,11 +11,6 @@ std::string inQuotes(std::string_view text) {
   return result + "'";
 }
 
-/// A command as the script keeps it: its words, each behind a blank.
-std::string key(const CommandRow& command) {
-  return command.words.empty() ? "" : " " + joined(command.words, " ");
-}
-
 /// The arguments of `complete` for what may stand in an option's or operand's place.
 std::string values(const OptionRow& row) {
   switch (row.kind) {
@@ -36,11 +31,11 @@ std::string values(const OptionRow& row) {
 void printPlace(const std::vector<CommandRow>& table, std::ostream& out) {
   std::vector<std::string> commands, flags;
   for (const auto& command : table) {
-    if (!command.words.empty()) commands.push_back(inQuotes(key(command)));
+    if (!command.words.empty()) commands.push_back(inQuotes(command.key()));
     for (const auto& option : command.options)
       for (const auto& flag : option.flags)
         if (!option.operand.empty())
-          flags.push_back(inQuotes((command.words.empty() ? "*" : key(command)) + " " + flag));
+          flags.push_back(inQuotes((command.words.empty() ? "*" : command.key()) + " " + flag));
   }
   out << "# Whether the line has come to a command, and to an operand of it where one is given.\n"
       << "function __marlet_at\n"
@@ -71,7 +66,7 @@ void printOperands(const CommandRow& command, std::ostream& out) {
   for (std::size_t i = 0; i < command.operands.size(); ++i) {
     const auto& operand = command.operands[i];
     if (operand.kind == OperandKind::text) continue;
-    auto place = "__marlet_at " + inQuotes(key(command));
+    auto place = "__marlet_at " + inQuotes(command.key());
     if (!operand.isRepeatable) place += " " + std::to_string(i);
     const auto offered = operand.kind == OperandKind::file ? " -F" : values(operand);
     out << "complete -c marlet -n \"" << place << "\"" << offered << "\n";
@@ -86,9 +81,9 @@ void printFishCompletion(const std::vector<CommandRow>& table, std::ostream& out
   out << "complete -c marlet -f\n";
   for (const auto& command : table) {
     // The program's own options are offered everywhere.
-    const auto condition = command.words.empty() ? "" : " -n \"__marlet_at " + inQuotes(key(command)) + "\"";
+    const auto condition = command.words.empty() ? "" : " -n \"__marlet_at " + inQuotes(command.key()) + "\"";
     for (const auto& [name, help] : command.subcommands)
-      out << "complete -c marlet -n \"__marlet_at " << inQuotes(key(command)) << " 0\" -a " << name << " -d "
+      out << "complete -c marlet -n \"__marlet_at " << inQuotes(command.key()) << " 0\" -a " << name << " -d "
           << inQuotes(help) << "\n";
     for (const auto& option : command.options) printOption(option, condition, out);
     printOperands(command, out);

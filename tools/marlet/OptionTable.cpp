@@ -4,10 +4,6 @@
 
 namespace {
 
-std::vector<std::string> split(const std::string& text, char separator) {
-  return CLI::detail::split(text, separator);
-}
-
 OptionRow makeRow(const CLI::Option& option) {
   OptionRow row;
   for (const auto& name : option.get_snames()) row.flags.push_back("-" + name);
@@ -21,7 +17,7 @@ OptionRow makeRow(const CLI::Option& option) {
   row.operand = row.flags.empty() ? option.get_name() : type;
   if (type.find('|') != std::string::npos) {
     row.kind = OperandKind::choice;
-    row.choices = split(type, '|');
+    row.choices = CLI::detail::split(type, '|');
   } else {
     row.kind = type == "FILE"  ? OperandKind::file
                : type == "DIR" ? OperandKind::directory
@@ -50,6 +46,8 @@ void addRows(const CLI::App& app, const std::vector<std::string>& words, std::ve
 }
 
 }  // namespace
+
+std::string CommandRow::key() const { return words.empty() ? "" : " " + joined(words, " "); }
 
 std::vector<CommandRow> optionTable(const CLI::App& app) {
   std::vector<CommandRow> table;

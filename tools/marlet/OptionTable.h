@@ -6,7 +6,8 @@
 #include <vector>
 
 /// What the command takes, read off its parser: the manual page and the completions are made from it, so that they
-/// say what is so.
+/// say what is so. The type name of an option or operand tells what may stand there: FILE, DIR, or words to choose
+/// from; anything else is a text of the reader's own.
 
 enum class OperandKind { none, text, file, directory, choice };
 
@@ -30,6 +31,9 @@ struct CommandRow {
   std::vector<OptionRow> operands;
   /// Names of the commands right below it, with their help.
   std::vector<std::pair<std::string, std::string>> subcommands;
+
+  /// Its words, each behind a blank: what a completion script has of a line that came to this command.
+  std::string key() const;
 };
 
 /// A row for the program and each command that isn't hidden, parents first. The program's options are taken everywhere.
@@ -40,7 +44,7 @@ template <class Value>
 void offerChoices(CLI::Option* option, const std::vector<std::pair<std::string, Value>>& choices) {
   std::string names;
   for (const auto& choice : choices) names += (names.empty() ? "" : "|") + choice.first;
-  option->transform(CLI::CheckedTransformer(choices).description("").name("choices"))->type_name(names);
+  option->transform(CLI::CheckedTransformer(choices).description(""))->type_name(names);
 }
 
 /// The options that a command takes: its own, and the program's.
