@@ -47,6 +47,7 @@ embed:
 
 package: marlet
 	scripts/install-dependencies --develop
+	rm -f build/release/*.deb
 	cmake --build --preset release --target package
 	scripts/test-install build/release/*.deb
 
