@@ -1,6 +1,6 @@
 # `make` builds build/release/bin/marlet; `make demo` and `make test` install what is missing first.
 .DEFAULT_GOAL := marlet
-.PHONY: marlet demo test asan tsan bench fuzz format check-format embed
+.PHONY: marlet demo test asan tsan bench fuzz format check-format embed package
 
 FUZZ_SECONDS ?= 600
 
@@ -40,10 +40,16 @@ fuzz:
 	fuzz/run $(FUZZ_SECONDS)
 
 embed:
-	scripts/install-dependencies
+	scripts/install-dependencies --develop
 	$(call configure,debug)
 	cmake --build --preset debug
 	scripts/test-install
+
+package: marlet
+	scripts/install-dependencies --develop
+	rm -f build/release/*.deb
+	cmake --build --preset release --target package
+	scripts/test-install build/release/*.deb
 
 format:
 	@clang-format -i $(sources)

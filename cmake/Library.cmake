@@ -22,7 +22,9 @@ target_link_libraries(ArcCopier PRIVATE marlet_options LibArchive::LibArchive)
 
 add_library(MarletFoundation SHARED ${MARLET_SOURCES})
 add_library(MarletFoundation::MarletFoundation ALIAS MarletFoundation)
-set_target_properties(MarletFoundation PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${PROJECT_VERSION_MAJOR})
+# Before 1.0 the interface may change with each minor version.
+set(MARLET_SOVERSION ${PROJECT_VERSION_MAJOR}.${PROJECT_VERSION_MINOR})
+set_target_properties(MarletFoundation PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${MARLET_SOVERSION})
 target_include_directories(MarletFoundation PUBLIC $<BUILD_INTERFACE:${CMAKE_SOURCE_DIR}>
                                                    $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
 target_compile_features(MarletFoundation PUBLIC cxx_std_20)
@@ -31,7 +33,9 @@ target_compile_definitions(
                            MARLET_BUILD_RESOURCES="${CMAKE_SOURCE_DIR}/Resources")
 # The library's own calls of what it exports go straight there.
 target_compile_options(MarletFoundation PRIVATE -fno-semantic-interposition)
-target_link_options(MarletFoundation PRIVATE -Wl,-Bsymbolic-functions)
+target_link_options(MarletFoundation PRIVATE -Wl,-Bsymbolic-functions
+                                             -Wl,--version-script=${CMAKE_SOURCE_DIR}/cmake/exports.map)
+set_target_properties(MarletFoundation PROPERTIES LINK_DEPENDS ${CMAKE_SOURCE_DIR}/cmake/exports.map)
 target_link_libraries(MarletFoundation PRIVATE $<BUILD_INTERFACE:marlet_options> $<BUILD_INTERFACE:MarletDiff>
                                                $<BUILD_INTERFACE:ArcCopier> $<BUILD_INTERFACE:TelvaneReporting>
                                                $<BUILD_INTERFACE:nlohmann_json::nlohmann_json> LibArchive::LibArchive ICU::i18n ICU::uc
@@ -42,3 +46,13 @@ if(MARLET_BUILD_TESTS)
   target_precompile_headers(MarletFoundation PRIVATE <algorithm> <functional> <map> <memory> <optional>
                             <string> <variant> <vector>)
 endif()
+
+# The same objects for who links statically, and then brings the libraries that they stand on.
+add_library(MarletFoundationStatic STATIC $<TARGET_OBJECTS:MarletFoundation> $<TARGET_OBJECTS:MarletDiff>
+                                          $<TARGET_OBJECTS:ArcCopier> $<TARGET_OBJECTS:TelvaneReporting>)
+add_library(MarletFoundation::Static ALIAS MarletFoundationStatic)
+set_target_properties(MarletFoundationStatic PROPERTIES OUTPUT_NAME MarletFoundation EXPORT_NAME Static LINKER_LANGUAGE CXX)
+target_include_directories(MarletFoundationStatic INTERFACE $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
+target_compile_features(MarletFoundationStatic INTERFACE cxx_std_20)
+target_link_libraries(MarletFoundationStatic PRIVATE LibArchive::LibArchive ICU::i18n ICU::uc LibXml2::LibXml2 OpenSSL::Crypto
+                                                     uriparser::uriparser Threads::Threads ${CMAKE_DL_LIBS})

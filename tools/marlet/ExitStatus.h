@@ -10,3 +10,18 @@ enum class ExitStatus {
   /// Nothing was changed.
   failedWrite = 4,
 };
+
+/// The statuses in the words of the manual page.
+struct ExitStatusWords {
+  ExitStatus status;
+  const char* words;
+};
+
+inline constexpr ExitStatusWords exitStatusWords[] = {
+    {ExitStatus::good, "All is well."},
+    {ExitStatus::negative,
+     "A valid answer that is a no: problems were found, or a difference that was asked for."},
+    {ExitStatus::wrongUsage, "Wrong usage."},
+    {ExitStatus::unreadablePath, "A path can't be read."},
+    {ExitStatus::failedWrite, "A write failed; nothing was changed."},
+};
