@@ -22,7 +22,7 @@ def benchmarks(program, repetitions):
     scale = {"ns": 1e-9, "us": 1e-6, "ms": 1e-3, "s": 1}
     medians = {}
     for run in runs:
-        if run["aggregate_name"] == "median":
+        if run.get("aggregate_name", "median") == "median":  # of one run there is just that
             name, clock = re.subn(r"/(manual|real)_time(/threads:\d+)?$", "", run["run_name"])
             medians[name] = run["real_time" if clock else "cpu_time"] * scale[run["time_unit"]]
     return medians

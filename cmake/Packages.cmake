@@ -1,7 +1,7 @@
 # Debian packages, one a component: `cmake --build BUILD --target package` writes them into the build directory.
 set(CPACK_GENERATOR DEB)
 set(CPACK_PACKAGE_NAME marlet-foundation)
-set(CPACK_PACKAGE_CONTACT "MarletFoundation maintainers <maintainers@users.noreply.c-seed-32e8cb4a.example>" CACHE STRING
+set(CPACK_PACKAGE_CONTACT "MarletFoundation maintainers <maintainers@marlet.example>" CACHE STRING
                           "Who answers for the packages")
 set(CPACK_PACKAGING_INSTALL_PREFIX /usr)
 set(CPACK_COMPONENTS_ALL runtime development tool)
