@@ -1,6 +1,6 @@
 # `make` builds build/release/bin/marlet; `make demo` and `make test` install what is missing first.
 .DEFAULT_GOAL := marlet
-.PHONY: marlet demo test asan tsan bench fuzz format check-format embed
+.PHONY: marlet demo test asan tsan bench fuzz doc format check-format embed
 
 FUZZ_SECONDS ?= 600
 
@@ -44,6 +44,10 @@ embed:
 	$(call configure,debug)
 	cmake --build --preset debug
 	scripts/test-install
+
+doc:
+	scripts/install-dependencies --develop
+	scripts/document
 
 format:
 	@clang-format -i $(sources)
