@@ -83,7 +83,7 @@ class TableReader {
   void path(const Cells& cells) {
     const auto name = codeSpan(cells.at(0));
     const auto path = first_ + "/" + withoutSlash(name);
-    const auto without = page_.example().with(first_ + "/", "").without(path);
+    const auto without = page_.example().without(path).with(path.substr(0, path.rfind('/') + 1), "");
     claim(cells, " missing", without, cells.at(4));
     claim(cells, " of another kind",
           name.ends_with('/') ? without.with(path, "a file") : without.with(path + "/", ""), cells.at(5));
