@@ -12,7 +12,7 @@ namespace {
 
 using Cells = std::vector<std::string>;
 
-/// The contents of a cell that is one code span and nothing else.
+/// The contents of a cell that is one code span and nothing else: an answer. Another cell stands for none.
 std::string codeSpan(const std::string& cell) {
   const bool isSpan = cell.size() > 2 && cell.find('`') == 0 && cell.find('`', 1) == cell.size() - 1;
   return isSpan ? cell.substr(1, cell.size() - 2) : "";
@@ -67,7 +67,10 @@ class TableReader {
     return false;
   }
 
-  void read(const Cells& cells) {
+  void read(Cells cells) {
+    for (std::size_t i = 1; i < cells.size(); ++i) {
+      if (cells[i] == "the same") cells[i] = cells[i - 1];
+    }
     if (!row_) throw std::runtime_error("A table without a line that says what it is about: " + cells[0]);
     (this->*row_)(cells);
   }
