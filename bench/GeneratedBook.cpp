@@ -42,7 +42,7 @@ PropertyListValue resultInfo(int page) {
 
 }  // namespace
 
-void generateBook(const fs::path& book, int pages, std::uintmax_t bulk) {
+void generateBook(const fs::path& book, int pages, std::uintmax_t bulk, std::string_view contentVersion) {
   const auto contents = book / "Contents";
   PropertyListValue::Array chapterNames;
   for (int first = 0; first < pages; first += 100) {
@@ -66,7 +66,7 @@ void generateBook(const fs::path& book, int pages, std::uintmax_t bulk) {
         D{{"Version", "1.0"},
           {"Name", "A large book"},
           {"ContentIdentifier", "bench.large"},
-          {"ContentVersion", "1.0"},
+          {"ContentVersion", std::string(contentVersion)},
           {"DeploymentTarget", "slateos10.0"},
           {"Chapters", chapterNames}},
         PropertyListFormat::xml);

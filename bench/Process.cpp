@@ -9,6 +9,7 @@
 #include <chrono>
 #include <cstdlib>
 #include <filesystem>
+#include <fstream>
 #include <iostream>
 
 ProcessTime timeOf(const std::vector<std::string>& command) {
@@ -33,6 +34,14 @@ ProcessTime timeOf(const std::vector<std::string>& command) {
     return static_cast<double>(time.tv_sec) + 1e-6 * static_cast<double>(time.tv_usec);
   };
   return {elapsed.count(), seconds(usage.ru_utime) + seconds(usage.ru_stime)};
+}
+
+std::size_t peakMemory() {
+  std::ifstream status("/proc/self/status");
+  for (std::string line; std::getline(status, line);) {
+    if (line.starts_with("VmHWM:")) return std::strtoull(line.c_str() + 6, nullptr, 10) * 1024;
+  }
+  return 0;
 }
 
 std::string marletProgram() {

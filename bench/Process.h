@@ -15,3 +15,6 @@ ProcessTime timeOf(const std::vector<std::string>& command);
 
 /// The path of `marlet` as it was built beside this program.
 std::string marletProgram();
+
+/// The most memory that this process ever held, in bytes.
+std::size_t peakMemory();

@@ -9,6 +9,7 @@
 #include <random>
 
 #include "MarletFoundation/Data/PropertyListSerializable.h"
+#include "Process.h"
 
 namespace {
 
@@ -158,15 +159,6 @@ void peersWriting(benchmark::State& state, const Documents& (*documents)(), Prop
   }
   countBytes(state, documents().in(format));
   for (const auto root : roots) plist_free(root);
-}
-
-// The most memory that the process ever held, in bytes.
-std::size_t peakMemory() {
-  std::ifstream status("/proc/self/status");
-  for (std::string line; std::getline(status, line);) {
-    if (line.starts_with("VmHWM:")) return std::strtoull(line.c_str() + 6, nullptr, 10) * 1024;
-  }
-  return 0;
 }
 
 std::string contents(const char* path) {

@@ -124,11 +124,11 @@ void linearOpenTags(benchmark::State& state) {
 void linearSharedEnd(benchmark::State& state) {
   linear(state, repeated(u"/*#-editable-code ", state.range(0)) + u"*/");
 }
-BENCHMARK(linearText)->RangeMultiplier(10)->Range(10'000, 1'000'000)->Unit(benchmark::kMillisecond);
-BENCHMARK(linearTags)->RangeMultiplier(10)->Range(10'000, 1'000'000)->Unit(benchmark::kMillisecond);
-BENCHMARK(linearNesting)->RangeMultiplier(10)->Range(10'000, 1'000'000)->Unit(benchmark::kMillisecond);
-BENCHMARK(linearOpenTags)->RangeMultiplier(10)->Range(10'000, 1'000'000)->Unit(benchmark::kMillisecond);
-BENCHMARK(linearSharedEnd)->RangeMultiplier(10)->Range(10'000, 1'000'000)->Unit(benchmark::kMillisecond);
+BENCHMARK(linearText)->RangeMultiplier(8)->Range(4'096, 262'144)->Unit(benchmark::kMillisecond);
+BENCHMARK(linearTags)->RangeMultiplier(8)->Range(4'096, 262'144)->Unit(benchmark::kMillisecond);
+BENCHMARK(linearNesting)->RangeMultiplier(8)->Range(4'096, 262'144)->Unit(benchmark::kMillisecond);
+BENCHMARK(linearOpenTags)->RangeMultiplier(8)->Range(4'096, 262'144)->Unit(benchmark::kMillisecond);
+BENCHMARK(linearSharedEnd)->RangeMultiplier(8)->Range(4'096, 262'144)->Unit(benchmark::kMillisecond);
 
 }  // namespace
 }  // namespace MarletFoundation

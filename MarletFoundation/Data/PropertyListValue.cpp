@@ -11,10 +11,9 @@ using Array = PropertyListValue::Array;
 using Dictionary = PropertyListValue::Dictionary;
 using Entry = PropertyListDictionary::Entry;
 
-// How deep destructors may follow a value on the stack. What lies deeper waits for the outermost one.
+// How deep destructors may follow a value on the stack.
 constexpr int clearDepthLimit = 64;
 thread_local int clearDepth = 0;
-thread_local std::vector<PropertyListValue>* waiting = nullptr;
 
 bool isContainer(const PropertyListValue& value) { return value.payload.index() < 2; }
 
@@ -160,30 +159,51 @@ void PropertyListValue::clearContainer() noexcept {
                               : std::any_of(dictionary->begin(), dictionary->end(),
                                             [](const Entry& entry) { return isContainer(entry.value); });
   if (!isDeeper) return;
-  if (clearDepth == clearDepthLimit) {
-    waiting->push_back(std::move(*this));
-    return;
+  if (clearDepth == clearDepthLimit) return clearWithoutStack();
+  ++clearDepth;
+  if (array) {
+    array->clear();
+  } else {
+    dictionary->entries_.clear();
   }
-  const auto clear = [array, dictionary] {
-    ++clearDepth;
-    if (array) {
-      array->clear();
-    } else {
-      dictionary->entries_.clear();
+  --clearDepth;
+}
+
+std::size_t PropertyListValue::containedCount() const {
+  if (const auto* values = array()) return values->size();
+  return dictionary() ? dictionary()->size() : 0;
+}
+
+PropertyListValue& PropertyListValue::fromEnd(std::size_t place) {
+  if (auto* const values = std::get_if<Array>(&payload))
+    return values->end()[-static_cast<std::ptrdiff_t>(place)];
+  auto& entries = std::get<Dictionary>(payload).entries_;
+  return entries.end()[-static_cast<std::ptrdiff_t>(place)].value;
+}
+
+void PropertyListValue::removeLast() {
+  if (auto* const values = std::get_if<Array>(&payload)) return values->pop_back();
+  std::get<Dictionary>(payload).entries_.pop_back();
+}
+
+/// A destructor has no memory to ask for: the last place of each container that was entered holds the one around it.
+void PropertyListValue::clearWithoutStack() noexcept {
+  PropertyListValue value = std::move(*this), around;
+  while (true) {
+    while (value.containedCount() > 0) {
+      auto last = std::move(value.fromEnd(1));
+      value.fromEnd(1) = std::move(around);
+      around = std::move(value);
+      value = std::move(last);
     }
-    --clearDepth;
-  };
-  if (clearDepth > 0) return clear();
-  std::vector<PropertyListValue> deeper;
-  waiting = &deeper;
-  clear();
-  while (!deeper.empty()) {
-    ++clearDepth;
-    {
-      const auto next = std::move(deeper.back());
-      deeper.pop_back();
+    while (around.containedCount() == 1) {
+      auto next = std::move(around.fromEnd(1));
+      around = std::move(next);
     }
-    --clearDepth;
+    if (around.containedCount() == 0) return;
+    value = std::move(around.fromEnd(2));
+    around.fromEnd(2) = std::move(around.fromEnd(1));
+    around.removeLast();
   }
 }
 

@@ -114,6 +114,12 @@ struct MARLET_EXPORT PropertyListValue {
   /// What the variant's own move does, in code that compilers inline: readers move every value once.
   static Payload moved(Payload& payload) noexcept;
   void clearContainer() noexcept;
+  void clearWithoutStack() noexcept;
+  /// How many values a container holds; none in a scalar.
+  std::size_t containedCount() const;
+  /// A container's value at a place counted from 1 at its end.
+  PropertyListValue& fromEnd(std::size_t place);
+  void removeLast();
 };
 
 struct PropertyListDictionary::Entry {

@@ -63,10 +63,12 @@ bool isMountPoint(int parent, const std::string& name) {
 
 }  // namespace
 
-AtomicReplacement::AtomicReplacement(std::string path) : path_(std::move(path)), place_(placeOf(path_)) {
+AtomicReplacement::AtomicReplacement(std::string path, ExistingItem existing)
+    : path_(std::move(path)), existing_(existing), place_(currentPlace()) {
   stagePrefix_ = hiddenName(place_.name) + std::string(StageMark);
   displaced_ = hiddenName(place_.name) + std::string(DisplacedMark);
   if (!place_.item) undoHalfReplacement();
+  if (place_.item && existing_ == ExistingItem::Kept) throwPosix(EEXIST, path_);
   if (place_.item && isMountPoint(place_.parent.get(), place_.name)) {
     throwPosix(EBUSY, path_, "A mount point can't be replaced as a whole.");
   }
@@ -77,37 +79,38 @@ AtomicReplacement::~AtomicReplacement() {
   if (!staging_.empty()) removeTree(place_.parent.get(), staging_);
 }
 
-AtomicReplacement::Place AtomicReplacement::placeOf(const std::string& path) {
-  std::string way = path;
+AtomicReplacement::Place AtomicReplacement::currentPlace() const {
+  std::string way = path_;
   for (int links = 0;; ++links) {
     const SplitPath split(way);
     Place place;
     place.name = split.name;
-    if (!isFileName(place.name)) throwPosix(EINVAL, path);
+    if (!isFileName(place.name)) throwPosix(EINVAL, path_);
     place.parent =
         Descriptor(retrying([&] { return ::open(split.parent.c_str(), DirectoryFlags & ~O_NOFOLLOW); }));
-    if (!place.parent) throwPosix(errno, path);
+    if (!place.parent) throwPosix(errno, path_);
     struct stat status;
     if (::fstatat(place.parent.get(), place.name.c_str(), &status, AT_SYMLINK_NOFOLLOW) != 0) {
-      if (errno != ENOENT) throwPosix(errno, path);
+      if (errno != ENOENT) throwPosix(errno, path_);
       return place;
     }
     if (!S_ISLNK(status.st_mode)) {
-      if (!S_ISREG(status.st_mode) && !S_ISDIR(status.st_mode)) throwPosix(EINVAL, path);
+      if (!S_ISREG(status.st_mode) && !S_ISDIR(status.st_mode)) throwPosix(EINVAL, path_);
       place.item = status;
       return place;
     }
-    if (links == MostLinks) throwPosix(ELOOP, path);
+    if (existing_ == ExistingItem::Kept) throwPosix(EEXIST, path_);
+    if (links == MostLinks) throwPosix(ELOOP, path_);
     std::string target(static_cast<std::size_t>(PATH_MAX), '\0');
     const auto length = ::readlinkat(place.parent.get(), place.name.c_str(), target.data(), target.size());
-    if (length < 0) throwPosix(errno, path);
+    if (length < 0) throwPosix(errno, path_);
     target.resize(static_cast<std::size_t>(length));
     way = target.starts_with('/') ? target : split.parent + target;
   }
 }
 
 void AtomicReplacement::undoHalfReplacement() {
-  if (moveToFreeName(displaced_, place_.name) == 0) place_ = placeOf(path_);
+  if (moveToFreeName(displaced_, place_.name) == 0) place_ = currentPlace();
 }
 
 bool AtomicReplacement::isStage(std::string_view name) const {
@@ -205,7 +208,7 @@ void AtomicReplacement::commit() {
 }
 
 void AtomicReplacement::requireSamePlace() const {
-  const auto now = placeOf(path_);
+  const auto now = currentPlace();
   struct stat parent, parentNow;
   const bool isSame = now.name == place_.name && ::fstat(place_.parent.get(), &parent) == 0 &&
                       ::fstat(now.parent.get(), &parentNow) == 0 && parent.st_dev == parentNow.st_dev &&
@@ -220,6 +223,7 @@ void AtomicReplacement::putInPlace() {
     struct stat old;
     const bool exists = ::fstatat(place_.parent.get(), place_.name.c_str(), &old, AT_SYMLINK_NOFOLLOW) == 0;
     if (!exists && errno != ENOENT) throwPosix(errno, path_);
+    if (exists && existing_ == ExistingItem::Kept) throwPosix(EEXIST, path_);
     if (!exists) {
       if (moveToFreeName(staging_, place_.name) == 0) return staging_.clear();
     } else if (S_ISDIR(old.st_mode) || S_ISDIR(built.st_mode)) {

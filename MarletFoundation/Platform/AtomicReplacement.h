@@ -7,6 +7,7 @@
 
 #include "MarletFoundation/Platform/Descriptor.h"
 #include "MarletFoundation/Platform/DiskTree.h"
+#include "MarletFoundation/Platform/ExistingItem.h"
 
 namespace MarletFoundation {
 
@@ -18,8 +19,9 @@ namespace MarletFoundation {
 class AtomicReplacement {
  public:
   /// Takes the place of the item at `path`, or of what it links to in the end; it need not exist. Only files
-  /// and directories are replaced (EINVAL), and no mount points (EBUSY).
-  explicit AtomicReplacement(std::string path);
+  /// and directories are replaced (EINVAL), and no mount points (EBUSY). Nothing is where it is to be kept
+  /// (EEXIST), which `commit` looks to as well.
+  explicit AtomicReplacement(std::string path, ExistingItem existing = ExistingItem::Replaced);
   /// Removes what was built but not committed.
   ~AtomicReplacement();
   AtomicReplacement(const AtomicReplacement&) = delete;
@@ -53,8 +55,8 @@ class AtomicReplacement {
     std::string name;
     std::optional<struct stat> item;
   };
-  /// What a path means, the links at its end followed.
-  static Place placeOf(const std::string& path);
+  /// What the path means, the links at its end followed.
+  Place currentPlace() const;
   void undoHalfReplacement();
   bool isStage(std::string_view name) const;
   /// Renames within the directory, never over another item.
@@ -67,6 +69,7 @@ class AtomicReplacement {
   void replaceInTwoSteps();
 
   std::string path_;
+  ExistingItem existing_;
   Place place_;              // as it was at the start
   std::string stagePrefix_;  // of the names of what is built for this name
   std::string displaced_;

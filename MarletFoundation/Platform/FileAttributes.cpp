@@ -2,6 +2,7 @@
 #include <sys/xattr.h>
 #include <unistd.h>
 
+#include <new>
 #include <vector>
 
 #include "MarletFoundation/Platform/AtomicReplacement.h"
@@ -52,14 +53,9 @@ int copyAttributes(int from, int to) {
   return ::fchmod(to, mode);
 }
 
-void removeTree(int parent, const std::string& name) {
-  if (::unlinkat(parent, name.c_str(), 0) == 0 || errno == ENOENT) return;
-  Descriptor opened(::openat(parent, name.c_str(), DirectoryFlags));
-  if (!opened && errno == EACCES && ::fchmodat(parent, name.c_str(), 0700, AT_SYMLINK_NOFOLLOW) == 0) {
-    opened = Descriptor(::openat(parent, name.c_str(), DirectoryFlags));
-  }
-  if (!opened) return;
+namespace {
 
+void removeDirectory(int parent, const std::string& name, Descriptor opened) {
   struct Level {
     std::shared_ptr<DiskDirectory> directory, above;
     std::string name;
@@ -87,6 +83,22 @@ void removeTree(int parent, const std::string& name) {
         levels.push_back(
             {DiskDirectory::child(level.directory, SharedString(entry.name)), level.directory, entry.name});
     }
+  }
+}
+
+}  // namespace
+
+void removeTree(int parent, const std::string& name) {
+  if (::unlinkat(parent, name.c_str(), 0) == 0 || errno == ENOENT) return;
+  Descriptor opened(::openat(parent, name.c_str(), DirectoryFlags));
+  if (!opened && errno == EACCES && ::fchmodat(parent, name.c_str(), 0700, AT_SYMLINK_NOFOLLOW) == 0) {
+    opened = Descriptor(::openat(parent, name.c_str(), DirectoryFlags));
+  }
+  if (!opened) return;
+  try {
+    removeDirectory(parent, name, std::move(opened));
+  } catch (const std::bad_alloc&) {
+    // Some of it stays; the next replacement clears it away.
   }
 }
 

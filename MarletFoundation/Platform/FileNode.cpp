@@ -2,6 +2,7 @@
 
 #include <dirent.h>
 
+#include <new>
 #include <vector>
 
 #include "MarletFoundation/Platform/AtomicReplacement.h"
@@ -82,16 +83,20 @@ FileNode::~FileNode() {
   auto* const directory = std::get_if<Directory>(&facts_);
   if (!directory || directory->children.empty()) return;
   // Level by level: a tree may be deeper than the stack.
-  std::vector<Children> pending;
-  pending.push_back(std::move(directory->children));
-  while (!pending.empty()) {
-    const auto children = std::move(pending.back());
-    pending.pop_back();
-    for (const auto& [name, node] : children) {
-      if (!node || node.use_count() > 1) continue;
-      auto* const below = std::get_if<Directory>(&node->facts_);
-      if (below && !below->children.empty()) pending.push_back(std::move(below->children));
+  try {
+    std::vector<Children> pending;
+    pending.push_back(std::move(directory->children));
+    while (!pending.empty()) {
+      const auto children = std::move(pending.back());
+      pending.pop_back();
+      for (const auto& [name, node] : children) {
+        if (!node || node.use_count() > 1) continue;
+        auto* const below = std::get_if<Directory>(&node->facts_);
+        if (below && !below->children.empty()) pending.push_back(std::move(below->children));
+      }
     }
+  } catch (const std::bad_alloc&) {
+    // What wasn't moved goes with its node, on the stack.
   }
 }
 

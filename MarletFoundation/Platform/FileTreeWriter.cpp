@@ -231,11 +231,11 @@ void writeRegularFile(AtomicReplacement& replacement, FileNode& file) {
 
 }  // namespace
 
-void FileWrapper::write(const URL& url) const {
+void FileWrapper::write(const URL& url, ExistingItem existing) const {
   const auto path = systemPath(url);
   const auto kind = node_->kind();
   if (kind != FileNode::Kind::directory && kind != FileNode::Kind::regularFile) throwPosix(EINVAL, path);
-  AtomicReplacement replacement(path);
+  AtomicReplacement replacement(path, existing);
   if (kind == FileNode::Kind::regularFile) {
     writeRegularFile(replacement, *node_);
     replacement.commit();

@@ -7,6 +7,7 @@
 #include <string_view>
 
 #include "MarletFoundation/Platform/Data.h"
+#include "MarletFoundation/Platform/ExistingItem.h"
 #include "MarletFoundation/Platform/URL.h"
 
 namespace MarletFoundation {
@@ -68,8 +69,9 @@ class MARLET_EXPORT FileWrapper {
   /// opened at `url` goes on in what was written.
   ///
   /// A directory that is replaced is another one afterwards: watch its parent for changes. Mount points are
-  /// refused (EBUSY), and so is a path whose links change while it is written (ESTALE).
-  void write(const URL& url) const;
+  /// refused (EBUSY), and so are a path whose links change while it is written (ESTALE) and one that something
+  /// lies at which is to be kept (EEXIST).
+  void write(const URL& url, ExistingItem existing = ExistingItem::Replaced) const;
 
  private:
   explicit FileWrapper(std::shared_ptr<FileNode> node) : node_(std::move(node)) {}

@@ -4,6 +4,7 @@
 #include <cmath>
 #include <functional>
 #include <limits>
+#include <new>
 
 namespace MarletFoundation {
 namespace {
@@ -15,8 +16,12 @@ thread_local PropertyListObjects* waiting = nullptr;
 
 void release(PropertyListObjects& objects) noexcept {
   if (releaseDepth == releaseDepthLimit) {
-    waiting->insert(waiting->end(), std::make_move_iterator(objects.begin()),
-                    std::make_move_iterator(objects.end()));
+    try {
+      waiting->insert(waiting->end(), std::make_move_iterator(objects.begin()),
+                      std::make_move_iterator(objects.end()));
+    } catch (const std::bad_alloc&) {
+      // They go with their owner, on the stack.
+    }
     return;
   }
   PropertyListObjects deeper;

@@ -8,10 +8,13 @@
 #include <sys/xattr.h>
 #include <unistd.h>
 
+#include <algorithm>
+#include <array>
 #include <cerrno>
 #include <filesystem>
 #include <fstream>
 #include <functional>
+#include <thread>
 
 #include "MarletFoundation/Platform/ErrorObject.h"
 #include "MarletFoundation/Platform/FileManager.h"
@@ -39,9 +42,10 @@ std::vector<std::string> names(const TemporaryDirectory& directory) {
   return FileManager::contentsOfDirectory(directory.url(), false);
 }
 
-int errorOfWriting(const FileWrapper& wrapper, const URL& url) {
+int errorOfWriting(const FileWrapper& wrapper, const URL& url,
+                   ExistingItem existing = ExistingItem::Replaced) {
   try {
-    wrapper.write(url);
+    wrapper.write(url, existing);
   } catch (const ErrorObject& error) {
     return error.code();
   }
@@ -74,6 +78,34 @@ TEST(FileWrapperWriting, TakesThePlaceOfWhatWasThere) {
   FileWrapper(directory.url("book/a/b")).write(directory.url("copy"));
   EXPECT_EQ(text(directory.path() / "copy"), "1");
   EXPECT_EQ(names(directory), (std::vector<std::string>{"book", "copy", "link"}));
+}
+
+TEST(FileWrapperWriting, KeepsWhatIsToBeKept) {
+  const TemporaryDirectory directory;
+  Tree{{"file", "1"s}, {"book/file", "1"s}}.writeTo(directory.path());
+  fs::create_symlink("nowhere", directory.path() / "link");
+  const Tree tree{{"file", "2"s}};
+  for (const char* name : {"file", "book", "link"})
+    EXPECT_EQ(errorOfWriting(tree.wrapper(), directory.url(name), ExistingItem::Kept), EEXIST) << name;
+  EXPECT_EQ(text(directory.path() / "book/file"), "1");
+  EXPECT_EQ(names(directory), (std::vector<std::string>{"book", "file", "link"}));
+
+  // Of those who write one name at the same time, one makes it, and what that one wrote stays.
+  for (int round = 0; round < 20; ++round) {
+    const auto url = directory.url("new" + std::to_string(round));
+    std::array<int, 4> errors{};
+    std::vector<std::thread> writers;
+    for (std::size_t i = 0; i < errors.size(); ++i) {
+      writers.emplace_back([&, i] {
+        errors[i] = errorOfWriting(Tree{{"file", std::to_string(i)}}.wrapper(), url, ExistingItem::Kept);
+      });
+    }
+    for (auto& writer : writers) writer.join();
+    const auto winner = std::find(errors.begin(), errors.end(), 0);
+    ASSERT_NE(winner, errors.end());
+    EXPECT_EQ(std::count(errors.begin(), errors.end(), EEXIST), std::ssize(errors) - 1);
+    EXPECT_EQ(text(url.path() + "/file"), std::to_string(winner - errors.begin()));
+  }
 }
 
 TEST(FileWrapperWriting, KeepsWhatADocumentIsMadeOf) {

@@ -94,7 +94,7 @@ ExitStatus convert(const std::string& path, const std::string& output, bool forc
     const auto tree = makesBook ? bookOfMarlet(marlet, path, url) : currentForm(marlet, path, url);
     for (const auto& name : leftOut(document, marlet))
       terminal.complain(printable(path + ": left out, since it is no part of the document: " + name));
-    writeTree(tree, url);
+    writeTree(tree, url, force ? ExistingItem::Replaced : ExistingItem::Kept);
     const std::string form = makesBook ? "a book" : marlet.isSinglePage() ? "version 5.0" : "version 6.0";
     terminal.note(printable("wrote " + output + ": " + form + ", " + counted(marlet.pages.size(), "page")));
     return ExitStatus::good;

@@ -46,7 +46,8 @@ ExitStatus makeBook(const std::string& path, const std::optional<std::string>& n
       throw CommandFailure{ExitStatus::wrongUsage, path + ": A book's name ends in \".marletbook\"."};
     requireNothingAt(path);
     const auto stem = filename.substr(0, filename.rfind('.'));
-    writeTree(newBook(filename, name.value_or(stem), identifier ? *identifier : randomUUIDString()), url);
+    writeTree(newBook(filename, name.value_or(stem), identifier ? *identifier : randomUUIDString()), url,
+              ExistingItem::Kept);
   });
 }
 
@@ -57,7 +58,7 @@ ExitStatus makeChapter(const std::string& book, const std::string& name, const T
     const MarletBookSnapshot mustOpen(document.wrapper, document.url);
     auto contents = *document.wrapper.child("Contents");
     addTo(contents, "Chapters", newChapter(name, name));
-    writeTree(document.wrapper, document.url);
+    writeTree(document.wrapper, document.url, ExistingItem::Replaced);
   });
 }
 
@@ -74,6 +75,6 @@ ExitStatus makePage(const std::string& book, const std::string& chapter, const s
     addTo(
         directory, "Pages",
         isCutscene ? newCutscenePage(name + ".cutscenepage", name) : newCodePage(name + ".marletpage", name));
-    writeTree(document.wrapper, document.url);
+    writeTree(document.wrapper, document.url, ExistingItem::Replaced);
   });
 }

@@ -23,6 +23,6 @@ void requireNothingAt(const std::string& path) {
     refuseToOverwrite(path);
 }
 
-void writeTree(const FileWrapper& tree, const URL& url) {
-  orFailWith(ExitStatus::failedWrite, url.path(), [&] { tree.write(url); });
+void writeTree(const FileWrapper& tree, const URL& url, ExistingItem existing) {
+  orFailWith(ExitStatus::failedWrite, url.path(), [&] { tree.write(url, existing); });
 }

@@ -12,4 +12,5 @@ void requireFilename(const std::string& name);
 /// Refuses a path that something lies at, were it a link to nowhere.
 void requireNothingAt(const std::string& path);
 /// Writes a whole tree or nothing.
-void writeTree(const MarletFoundation::FileWrapper& tree, const MarletFoundation::URL& url);
+void writeTree(const MarletFoundation::FileWrapper& tree, const MarletFoundation::URL& url,
+               MarletFoundation::ExistingItem existing);

@@ -1,5 +1,5 @@
-/// What it costs to change a document on disk as a whole: an update under a learner's edits, which must grow with the
-/// book and no faster, and a save of 150 changed files among 5,000 beside rsync's copy with hard links and a final sync.
+/// What it costs to change a document on disk as a whole: a save of 150 changed files among 5,000, beside rsync's copy
+/// with hard links and a final sync.
 /// The counter `cpu` is the processor time of this process and of those it started, in seconds a round.
 
 #include <benchmark/benchmark.h>
@@ -7,14 +7,13 @@
 #include <unistd.h>
 
 #include <cstdlib>
+#include <filesystem>
 #include <fstream>
 
-#include "GeneratedBook.h"
 #include "MarletFoundation/MarletFoundation.h"
 
 namespace fs = std::filesystem;
 using namespace MarletFoundation;
-using MarletDiff::FileDiffDescriptor;
 
 namespace {
 
@@ -40,7 +39,7 @@ void measure(benchmark::State& state, Round round) {
 }
 
 struct Scratch {
-  fs::path path = fs::temp_directory_path() / ("marlet-update-bench-" + std::to_string(::getpid()));
+  fs::path path = fs::temp_directory_path() / ("marlet-save-bench-" + std::to_string(::getpid()));
   Scratch() { fs::create_directories(path); }
   ~Scratch() { fs::remove_all(path); }
 };
@@ -49,51 +48,6 @@ void writeText(const fs::path& path, std::string_view text) {
   fs::create_directories(path.parent_path());
   std::ofstream(path, std::ios::binary) << text;
 }
-
-/// Every tenth page is changed by the update and by the learner, in different lines.
-void applyUpdate(benchmark::State& state) {
-  const Scratch scratch;
-  const int pages = static_cast<int>(state.range(0));
-  const auto book = scratch.path / "Book.marletbook";
-  generateBook(book, pages, 0);
-  std::string source = "let version = 1\n";
-  for (int line = 0; line < 60; ++line) source += "lamp.flash(times: " + std::to_string(line) + ")\n";
-  source += "lamp.color = 3\n";
-  const auto place = static_cast<std::int64_t>(source.size()) - 2;
-  std::vector<FileDiffDescriptor> edits, forward, back;
-  for (int page = 0; page < pages; ++page) {
-    const auto path = "Chapters/Chapter" + std::to_string(page / 100) + ".marletchapter/Pages/Page" +
-                      std::to_string(page) + ".marletpage/Contents.swift";
-    writeText(book / "Contents" / path, source);
-    if (page % 10 != 0) continue;
-    edits.push_back({FileDiffDescriptor::Modified{path, {{{place, 1}, {place, 1}, u"3", u"4"}}}});
-    forward.push_back({FileDiffDescriptor::Modified{path, {{{14, 1}, {14, 2}, u"1", u"22"}}}});
-    back.push_back({FileDiffDescriptor::Modified{path, {{{14, 2}, {14, 1}, u"22", u"1"}}}});
-  }
-  const auto url = URL::file(book.string(), true);
-  const auto contents = url.appendingPathComponent("Contents", true);
-  const auto pack = [&](DiffPackType type, std::vector<FileDiffDescriptor> updates) {
-    return DiffPackSnapshot(type, DiffPackDocumentType::MarletBook, contents, "bench.large", "1.0", "1.0",
-                            std::move(updates));
-  };
-  fs::create_directories(book / "Edits");
-  pack(DiffPackType::UserEditPack, std::move(edits))
-      .fileWrapper()
-      .write(url.appendingPathComponent("Edits/UserEdits.diffpack"));
-  const auto there = pack(DiffPackType::UpdatePack, std::move(forward));
-  const auto andBack = pack(DiffPackType::UpdatePack, std::move(back));
-  measure(state, [&] {
-    applyUpdateDiffPack(url, there);
-    applyUpdateDiffPack(url, andBack);
-  });
-  state.SetComplexityN(pages);
-}
-BENCHMARK(applyUpdate)
-    ->RangeMultiplier(2)
-    ->Range(250, 2000)
-    ->Unit(benchmark::kMillisecond)
-    ->UseRealTime()
-    ->Complexity();
 
 std::string fileName(int file) { return std::to_string(file / 100) + "/file" + std::to_string(file); }
 

@@ -1,0 +1,128 @@
+"""What is measured beside what, and the ratio that is asked for: at most, ours to the peer's."""
+from dataclasses import dataclass
+
+
+@dataclass
+class Benchmark:
+    """Two benchmarks of one program, measured in one run."""
+    figure: str
+    program: str
+    ours: str
+    peer_name: str
+    peer: str
+    asked: float | None = None
+    why: str = ""
+
+
+@dataclass
+class Processes:
+    """Two programs, each in processes of its own, over files that `DiffBench --write-texts` made. By their processor time, or by
+    the memory that they held at most."""
+    figure: str
+    ours: list
+    peer_name: str
+    peer: list
+    asked: float | None = None
+    why: str = ""
+    memory: bool = False
+
+
+SEARCH = ("a refined diff compares the changed lines again, as words and as characters, with ICU's grapheme clusters and a "
+          "lossless slide; what is left of it is that second search")
+MEMORY_SPEED = "the loop over UTF-16 runs at the memory's speed on a long text, so a ratio of the computing isn't to be had there"
+
+BENCHMARKS = [
+    Benchmark("opening a book of 10,000 pages", "OpenBookBench", "openBook", "open, read and close of its files", "bareLoop", 1.4),
+    Benchmark("the same", "OpenBookBench", "openBook", "that loop with libplist parsing", "bareLoopWithLibplist", 1.0),
+    Benchmark("opening a classic document of 2,000 pages", "OpenMarletBench", "openMarlet", "open, read and close of its files",
+              "bareLoop", 1.6, "the two optional directories of each page have to be looked for; those system calls alone make 1.4 to 1.7"),
+    Benchmark("fetching a page", "FetchPageBench", "fetchPage", "reading its files", "bareFiles"),
+    Benchmark("fetching a page, book and pack not given", "FetchPageBench", "fetchPageOpeningTheBook", "opening the book",
+              "openBook", 2.0),
+    Benchmark("reading a large XML list", "PropertyListBench", "ours/read_xml_large", "libplist", "peers/read_xml_large", 1 / 4),
+    Benchmark("reading small XML lists", "PropertyListBench", "ours/read_xml_small", "libplist", "peers/read_xml_small", 1 / 5),
+    Benchmark("reading a large binary list", "PropertyListBench", "ours/read_binary_large", "libplist", "peers/read_binary_large",
+              1 / 1.8),
+    Benchmark("reading small binary lists", "PropertyListBench", "ours/read_binary_small", "libplist", "peers/read_binary_small",
+              1 / 2),
+    Benchmark("writing a large XML list", "PropertyListBench", "oursWriting/write_xml_large", "libplist",
+              "peersWriting/write_xml_large", 1 / 2),
+    Benchmark("writing a large binary list", "PropertyListBench", "oursWriting/write_binary_large", "libplist",
+              "peersWriting/write_binary_large", 1 / 20),
+    Benchmark("an uncontended synchronous lock", "LockBench", "dispatchLock", "two pairs of std::mutex", "twoMutexPairs", 1.0),
+    Benchmark("an uncontended read lock", "LockBench", "readerWriterRead", "two pairs of std::shared_mutex", "twoSharedPairs", 1.0),
+    Benchmark("finding tags' candidates, text in the cache", "TagScanBench", "candidates/2", "a loop over char16_t", "naiveLoop/2",
+              1 / 8, MEMORY_SPEED),
+    Benchmark("finding tags' candidates, 100 million units", "TagScanBench", "candidates/0", "a loop over char16_t", "naiveLoop/0",
+              1 / 8, MEMORY_SPEED),
+    Benchmark("the same", "TagScanBench", "candidates/0", "memchr", "memchrOfBytes/0", 2.0),
+    Benchmark("parsing 100 million units without tags", "TagScanBench", "parseStringForTags/0", "a loop over char16_t",
+              "naiveLoop/0", 1 / 4, MEMORY_SPEED),
+    Benchmark("parsing 100 million units with tags", "TagScanBench", "parseStringForTags/1", "a loop over char16_t", "naiveLoop/1"),
+    Benchmark("1 MB of source, 1 % of the lines, refined", "DiffBench", "ours/fewLines", "libgit2, lines", "libgit2/fewLines", 0.4,
+              SEARCH),
+    Benchmark("merging two such diffs", "DiffBench", "oursMerge", "libgit2", "libgit2Merge"),
+    Benchmark("decoding UTF-8, ASCII", "TextBench", "decodeOurs/ascii", "ICU", "decodeICU/ascii", 1 / 5),
+    Benchmark("decoding UTF-8, mixed", "TextBench", "decodeOurs/mixed", "ICU", "decodeICU/mixed", 1 / 2,
+              "scripts change at random in this text, and what is left is branches that the processor can't foresee"),
+    Benchmark("encoding UTF-8, ASCII", "TextBench", "encodeOurs/ascii", "ICU", "encodeICU/ascii", 1 / 3),
+    Benchmark("100,000 ranges over 10 MB, ASCII", "TextBench", "convertRanges/ascii", "one u_strToUTF8", "convertOnceWithICU/ascii",
+              0.5),
+    Benchmark("100,000 ranges over 10 MB, accented", "TextBench", "convertRanges/accented", "one u_strToUTF8",
+              "convertOnceWithICU/accented", 1.5),
+    Benchmark("100,000 ranges over 10 MB, astral", "TextBench", "convertRanges/astral", "one u_strToUTF8",
+              "convertOnceWithICU/astral", 1.5),
+    Benchmark("expanding 1,000 files", "ArchiveBench", "marletUnzip", "bsdtar", "bsdtar", 1.0),
+    Benchmark("the same", "ArchiveBench", "marletUnzip", "unzip", "unzip", 0.5,
+              "under a hundredth of a second of it is inflating; the rest is the kernel making files, which both wait for"),
+    Benchmark("expanding with progress", "ArchiveBench", "withProgress", "without", "withoutProgress", 1.01),
+    Benchmark("MD5 of a large file", "DigestBench", "checksumMD5", "OpenSSL over the mapped file", "openSSLMD5", 1.03),
+    Benchmark("SHA-1 of a large file", "DigestBench", "dataSHA1", "OpenSSL over the mapped file", "openSSLSHA1", 1.03),
+    Benchmark("the command, MD5", "DigestBench", "marletMD5", "md5sum", "md5sum", 1.0),
+    Benchmark("the command, SHA-1", "DigestBench", "marletSHA1", "sha1sum", "sha1sum", 1 / 3),
+    Benchmark("reading JSON into values", "JSONBench", "ours", "simdjson's document", "simdjsonDocument"),
+    Benchmark("saving 150 of 5,000 files durably", "SaveBench", "durableSave", "rsync with links, and a sync",
+              "copyWithLinksBySync", 0.25, "both wait for the disk's flush; what is ours to save is the linking of 4,850 files"),
+]
+
+
+def diff(pair):
+    return ["DiffBench", "--diff", f"{pair}.old", f"{pair}.new"]
+
+
+def git_diff(pair):
+    return ["git", "diff", "--no-index", "-U0", f"{pair}.old", f"{pair}.new"]
+
+
+MERGE = ["DiffBench", "--merge", "base", "left", "right"]
+PLISTLIB = "import plistlib; plistlib.load(open('large.xml', 'rb'))"
+
+PROCESSES = [
+    Processes("1 MB of source, 1 % of the lines, refined", diff("few"), "git diff", git_diff("few"), 0.35, SEARCH),
+    Processes("the same, peak memory", diff("few"), "git diff", git_diff("few"), 1.4, "the text is held as UTF-16, twice its bytes",
+              memory=True),
+    Processes("every third line, refined", diff("third"), "git diff", git_diff("third"), 0.5, SEARCH),
+    Processes("every third line, plain", diff("third"), "GNU diff", ["diff", "third.old", "third.new"]),
+    Processes("200,000 lines of ten symbols", diff("symbols"), "git diff", git_diff("symbols"), 0.04),
+    Processes("one line of 1 MB, 1 % of its words", diff("line"), "git diff by characters", git_diff("characters"), 0.12, SEARCH),
+    Processes("merging three texts, both diffs with it", MERGE, "git merge-file", ["git", "merge-file", "-p", "left", "base", "right"],
+              0.5, SEARCH),
+    Processes("two trees of 5,000 files", ["DiffBench", "--trees", "old", "new"], "diff -rq", ["diff", "-rq", "old", "new"], 0.7,
+              "both are bound by the kernel's opening and reading of 10,000 files"),
+    Processes("reading a large XML list", ["PropertyListBench", "--memory", "large.xml"], "python's plistlib",
+              ["python3", "-c", PLISTLIB]),
+    Processes("a digest", ["marlet", "digest", "large.xml"], "openssl", ["openssl", "md5", "large.xml"]),
+]
+
+# Each at three sizes, eight times the one before: pages of a book, lines of a text.
+GROWTH = {
+    "opening a book": ("opening", 250),
+    "scanning for tags": ("scanning", 4000),
+    "converting offsets": ("converting", 4000),
+    "diffing": ("diffing", 4000),
+    "diffing where the search gives up": ("diffingFewSymbols", 4000),
+    "merging": ("merging", 4000),
+    "making and writing an update": ("packing", 32),
+    "applying an update and undoing it": ("applying", 32),
+}
+EXPONENT_ASKED = 1.1
