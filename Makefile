@@ -1,6 +1,6 @@
 # `make` builds build/release/bin/marlet; `make demo` and `make test` install what is missing first.
 .DEFAULT_GOAL := marlet
-.PHONY: marlet demo test asan tsan bench fuzz format check-format embed package
+.PHONY: marlet demo test asan tsan bench fuzz doc format check-format embed package
 
 FUZZ_SECONDS ?= 600
 
@@ -50,6 +50,9 @@ package: marlet
 	rm -f build/release/*.deb
 	cmake --build --preset release --target package
 	scripts/test-install build/release/*.deb
+doc:
+	scripts/install-dependencies --develop
+	scripts/document
 
 format:
 	@clang-format -i $(sources)

@@ -10,6 +10,7 @@
 #define ARC_COPIER_EXPORT
 #endif
 
+/// @file
 /// Extracts PKZip archives that anybody may have made.
 ///
 /// An archive is refused before anything is written when its directory can't be trusted: entries that

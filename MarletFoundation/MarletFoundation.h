@@ -1,5 +1,6 @@
 #pragma once
 
+/// @file
 /// Everything of the library, for hosts that don't want to choose.
 
 #include "MarletFoundation/Data/CaseError.h"

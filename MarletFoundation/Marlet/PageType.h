@@ -12,6 +12,7 @@
 #include "MarletFoundation/Marlet/MarletResultInfo.h"
 #include "MarletFoundation/Platform/FileWrapper.h"
 
+/// @file
 /// What code may ask of a page without knowing whether it is a snapshot or live, of a book or of a classic
 /// document. Texts and record are answered by reference and hold as long as the page; the rest is answered by
 /// value, so that a page may make it up.

@@ -4,6 +4,7 @@
 
 #include "MarletFoundation/SourceEditor/OffsetRange.h"
 
+/// @file
 /// Strings by user-perceived characters (extended grapheme clusters). Each call walks the string from its
 /// front.
 namespace MarletFoundation {

@@ -12,6 +12,7 @@
 #include "MarletFoundation/Data/Unit.h"
 #include "MarletFoundation/Platform/FatalError.h"
 
+/// @file
 /// Small functions that the library is written with. `docs/functional-kit.md` tells which names stand for
 /// operators.
 namespace MarletFoundation {

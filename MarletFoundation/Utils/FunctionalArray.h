@@ -13,6 +13,7 @@
 
 #include "MarletFoundation/Platform/FatalError.h"
 
+/// @file
 /// Small functions on arrays and dictionaries. Indices count elements from 0.
 namespace MarletFoundation {
 

@@ -2,6 +2,7 @@
 
 #include "MarletFoundation/Platform/DispatchQueue.h"
 
+/// @file
 /// Mutual exclusion by work queues. The locks are values: copies share one queue. The synchronous forms give
 /// back what the block returns or throws, and run it on the calling thread; a lock that is free costs neither
 /// a switch of threads nor an allocation. The asynchronous forms queue the block and return at once.
