@@ -50,6 +50,7 @@ package: marlet
 	rm -f build/release/*.deb
 	cmake --build --preset release --target package
 	scripts/test-install build/release/*.deb
+
 doc:
 	scripts/install-dependencies --develop
 	scripts/document
