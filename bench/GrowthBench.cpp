@@ -45,9 +45,8 @@ Work opening(int pages) {
   const auto scratch = std::make_shared<Scratch>();
   const auto url = bookIn(scratch);
   generateBook(url.path(), pages, 0);
-  return [scratch, url] {
-    benchmark::DoNotOptimize(MarletBookSnapshot(FileWrapper(url), url).chapters.size());
-  };
+  return
+      [scratch, url] { benchmark::DoNotOptimize(MarletBookSnapshot(FileWrapper(url), url).chapters.size()); };
 }
 
 /// Source lines of a few words, a tag on every 20th; with `salt`, other words on a line in a hundred.
@@ -59,7 +58,8 @@ std::u16string source(int lines, int salt = 0, int first = 0) {
     if (line % 40 == 19) text += u"//#-editable-code\n";
     if (line % 40 == 39) text += u"//#-end-editable-code\n";
     for (auto words = 3 + random() % 6; words > 0; --words) {
-      constexpr const char16_t* vocabulary[] = {u"let ", u"value ", u"= ", u"turtle.forward ", u"for ", u"é "};
+      constexpr const char16_t* vocabulary[] = {u"let ", u"value ", u"= ", u"turtle.forward ",
+                                                u"for ", u"é "};
       text += vocabulary[random() % std::size(vocabulary)];
     }
     for (const char digit : std::to_string(random() % 1000 + (changed ? 1000 * salt : 0)))
@@ -112,8 +112,8 @@ Work merging(int lines) {
 }
 
 std::string sourcePath(int page) {
-  return "Chapters/Chapter" + std::to_string(page / 100) + ".marletchapter/Pages/Page" + std::to_string(page) +
-         ".marletpage/Contents.swift";
+  return "Chapters/Chapter" + std::to_string(page / 100) + ".marletchapter/Pages/Page" +
+         std::to_string(page) + ".marletpage/Contents.swift";
 }
 
 void writeSources(const URL& book, int pages, const std::function<std::string(int)>& text) {
@@ -154,8 +154,9 @@ Work applying(int pages) {
     back.push_back({FileDiffDescriptor::Modified{path, {{{14, 2}, {14, 1}, u"22", u"1"}}}});
   }
   const auto pack = [&](DiffPackType type, std::vector<FileDiffDescriptor> updates) {
-    return DiffPackSnapshot(type, DiffPackDocumentType::MarletBook, url.appendingPathComponent("Contents", true),
-                            "bench.large", "1.0", "1.0", std::move(updates));
+    return DiffPackSnapshot(type, DiffPackDocumentType::MarletBook,
+                            url.appendingPathComponent("Contents", true), "bench.large", "1.0", "1.0",
+                            std::move(updates));
   };
   fs::create_directories(url.path() + "/Edits");
   pack(DiffPackType::UserEditPack, std::move(edits))
@@ -174,10 +175,14 @@ struct Operation {
   int smallest;
 };
 constexpr Operation operations[] = {
-    {"opening", opening, 250},      {"scanning", scanning, 4000},
-    {"converting", converting, 4000}, {"diffing", diffing, 4000},
-    {"diffingFewSymbols", diffingFewSymbols, 4000}, {"merging", merging, 4000},
-    {"packing", packing, 32},       {"applying", applying, 32},
+    {"opening", opening, 250},
+    {"scanning", scanning, 4000},
+    {"converting", converting, 4000},
+    {"diffing", diffing, 4000},
+    {"diffingFewSymbols", diffingFewSymbols, 4000},
+    {"merging", merging, 4000},
+    {"packing", packing, 32},
+    {"applying", applying, 32},
 };
 
 void measure(benchmark::State& state, Work (*prepare)(int)) {

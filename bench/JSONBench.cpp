@@ -17,7 +17,8 @@ const std::string& document() {
     std::string result = "[";
     for (int record = 0; record < 15'000; ++record) {
       result += record == 0 ? "" : ",";
-      result += R"({"name": "Page )" + std::to_string(record) + R"(", "description": "What \"loop\" means: für", )";
+      result +=
+          R"({"name": "Page )" + std::to_string(record) + R"(", "description": "What \"loop\" means: für", )";
       result += R"("passed": )" + std::string(random() % 2 ? "true" : "false");
       result += R"(, "score": )" + std::to_string(random() % 1000) + "." + std::to_string(random() % 100);
       result += R"(, "hints": [)" + std::to_string(random()) + ", null]}";

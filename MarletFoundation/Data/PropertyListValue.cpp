@@ -198,6 +198,7 @@ void PropertyListValue::clearWithoutStack() noexcept {
     }
     while (around.containedCount() == 1) {
       auto next = std::move(around.fromEnd(1));
+      around.removeLast();
       around = std::move(next);
     }
     if (around.containedCount() == 0) return;
