@@ -125,6 +125,18 @@ TEST_F(UpdatingUserEdits, KeepsWhatIsEditableOfATextAndDropsTheRest) {
   EXPECT_EQ(seen("page", slashes), slashes);
 }
 
+TEST_F(UpdatingUserEdits, KeepsWhatIsWrittenBetweenTheQuotesOfAField) {
+  const auto page = [](const std::string& written) {
+    return "let s = /*#-editable-code*/\"" + written + "\"/*#-end-editable-code*/\n";
+  };
+  const std::vector<std::string> texts = {
+      "", "\"", "x", "\"x\"", R"(\"x\")", R"(x" + name + "!)", R"(a" + "x)", R"(\(names["x"]))"};
+  for (const auto& original : texts) {
+    Tree{{"quoted", page(original)}}.writeTo(directory_.path());
+    for (const auto& written : texts) EXPECT_EQ(seen("quoted", page(written)), page(written)) << original;
+  }
+}
+
 TEST_F(UpdatingUserEdits, ALineFeedThatTheEditorAddsIsNoEdit) {
   EXPECT_TRUE(updated({{"bare", Data("one\ntwo\n"s)}}).empty());
   EXPECT_EQ(seen("bare", "one\ntwo\n\n"), "one\ntwo\n");
