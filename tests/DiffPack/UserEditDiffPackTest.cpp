@@ -1,6 +1,9 @@
 #include "MarletFoundation/DiffPack/UserEditDiffPack.h"
 
 #include <gtest/gtest.h>
+#include <rapidcheck/gtest.h>
+
+#include <numeric>
 
 #include "DiffPack/Packs.h"
 #include "MarletDiff/ContentDiff.h"
@@ -135,6 +138,23 @@ TEST_F(UpdatingUserEdits, KeepsWhatIsWrittenBetweenTheQuotesOfAField) {
     Tree{{"quoted", page(original)}}.writeTo(directory_.path());
     for (const auto& written : texts) EXPECT_EQ(seen("quoted", page(written)), page(written)) << original;
   }
+}
+
+RC_GTEST_FIXTURE_PROP(UpdatingUserEdits, LosesNothingThatIsWrittenInFields, ()) {
+  const auto anyText =
+      rc::gen::map(rc::gen::container<std::vector<std::string>>(rc::gen::element<std::string>(
+                       "a", " ", "\n", "\"", "/", "*", "//#-", "//#-end-editable-code\n",
+                       "/*#-end-editable-code*/", "//#-editable-code\n", "/*#-editable-code*/", "let x")),
+                   [](const std::vector<std::string>& pieces) {
+                     return std::accumulate(pieces.begin(), pieces.end(), std::string());
+                   });
+  const auto page = [&](const std::string& one, const std::string& two, const std::string& three) {
+    return "a\n//#-editable-code\n" + one + "//#-end-editable-code\nb\nf(/*#-editable-code*/\"" + two +
+           "\"/*#-end-editable-code*/)\n//#-editable-code\n" + three + "//#-end-editable-code\n";
+  };
+  Tree{{"fields", page("x\ny\n", "x y", "\n")}}.writeTo(directory_.path());
+  const auto edited = page(*anyText, *anyText, *anyText);
+  RC_ASSERT(seen("fields", edited) == edited);
 }
 
 TEST_F(UpdatingUserEdits, ALineFeedThatTheEditorAddsIsNoEdit) {
