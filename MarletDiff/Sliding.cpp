@@ -6,16 +6,25 @@
 namespace MarletDiff {
 namespace {
 
+/// Whether a place stands within a comment's delimiter. A quote beside a comment is a part of it: what is
+/// written between the quotes of a field is then not taken for text behind the field.
+bool dividesDelimiter(std::u16string_view before, std::u16string_view after) {
+  return (before.ends_with(u'/') && after.starts_with(u'*')) ||
+         (before.ends_with(u'*') && after.starts_with(u'/')) ||
+         (before.ends_with(u'"') && after.starts_with(u"/*")) ||
+         (before.ends_with(u"*/") && after.starts_with(u'"'));
+}
+
 /// How good a place is to start or end a change at.
 int rank(std::u16string_view text, std::size_t offset) {
   if (offset == text.size() || isLineStart(text, offset)) return 5;
-  const char16_t before = text[offset - 1], after = text[offset];
-  // Never through a delimiter, if it can be helped: text beside a comment is then not taken for a part of it.
-  if ((before == u'/' && after == u'*') || (before == u'*' && after == u'/')) return 0;
-  const bool opens = after == u'/' && offset + 1 < text.size() && text[offset + 1] == u'*';
-  const bool closes = before == u'/' && offset >= 2 && text[offset - 2] == u'*';
+  const auto before = text.substr(0, offset), after = text.substr(offset);
+  // If it can be helped, text beside a comment is not taken for a part of it.
+  if (dividesDelimiter(before, after)) return 0;
+  const bool opens = after.starts_with(u"/*") || after.starts_with(u"\"/*");
+  const bool closes = before.ends_with(u"*/") || before.ends_with(u"*/\"");
   if (opens || closes) return 4;
-  const bool wordBefore = isWordUnit(before), wordAfter = isWordUnit(after);
+  const bool wordBefore = isWordUnit(before.back()), wordAfter = isWordUnit(after.front());
   if (wordAfter) return wordBefore ? 0 : 3;
   return wordBefore ? 2 : 1;
 }

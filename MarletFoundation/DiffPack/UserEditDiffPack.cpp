@@ -1,6 +1,7 @@
 #include "MarletFoundation/DiffPack/UserEditDiffPack.h"
 
 #include "MarletDiff/ContentDiff.h"
+#include "MarletFoundation/DiffPack/FieldwiseDiff.h"
 #include "MarletFoundation/DiffPack/UserEditDiffPackValidator.h"
 #include "MarletFoundation/Marlet/MarletBookSnapshot.h"
 #include "MarletFoundation/Platform/FileManager.h"
@@ -64,7 +65,12 @@ DiffPackSnapshot makeUserEditDiffPack(const MarletBookSnapshot& book, URL conten
 std::vector<MarletDiff::DiffDescriptor> userEditHunks(std::u16string_view original,
                                                       std::u16string_view edited) {
   if (!endsInLineFeed(original) && endsInLineFeed(edited)) edited.remove_suffix(1);
-  return MarletDiff::diffContent(original, edited, MarletDiff::DiffOptions::SmallerHunks);
+  auto hunks = MarletDiff::diffContent(original, edited, MarletDiff::DiffOptions::SmallerHunks);
+  if (editableHunks(hunks, original).size() == hunks.size()) return hunks;
+  // The same edit can often be told by other changes: a learner who writes what a field's border looks like
+  // must not lose it because it was compared with the border itself.
+  auto byField = fieldwiseDiff(original, edited);
+  return byField ? *std::move(byField) : hunks;
 }
 
 DiffPackSnapshot updatedUserEditDiffPack(const DiffPackSnapshot& pack, const UserEdits& userEdits) {

@@ -37,6 +37,15 @@ class RangesByStart {
 
 }  // namespace
 
+std::vector<DiffDescriptor> editableHunks(const MarletDiff::DiffDescriptors& hunks,
+                                          std::u16string_view content) {
+  const RangesByStart editable(editableRanges(content));
+  std::vector<DiffDescriptor> kept;
+  std::copy_if(hunks.begin(), hunks.end(), std::back_inserter(kept),
+               [&](const DiffDescriptor& hunk) { return editable.holdWhole(hunk.originalRange); });
+  return kept;
+}
+
 UserEditDiffPackValidator::UserEditDiffPackValidator(DiffPackSnapshot pack) : userEditPack(std::move(pack)) {
   if (userEditPack.diffPackType != DiffPackType::UserEditPack ||
       userEditPack.baseVersion != userEditPack.updateVersion ||
@@ -50,10 +59,7 @@ std::optional<FileDiffDescriptor> UserEditDiffPackValidator::validatedUpdate(
   const auto* modified = std::get_if<FileDiffDescriptor::Modified>(&descriptor.change);
   if (!modified) return descriptor;
   if (!content) fatalError("A modified file is validated against its original text.");
-  const RangesByStart editable(editableRanges(*content));
-  std::vector<DiffDescriptor> survivors;
-  std::copy_if(modified->diff.begin(), modified->diff.end(), std::back_inserter(survivors),
-               [&](const DiffDescriptor& hunk) { return editable.holdWhole(hunk.originalRange); });
+  auto survivors = editableHunks(modified->diff, *content);
   if (survivors.empty()) return std::nullopt;
   return FileDiffDescriptor{FileDiffDescriptor::Modified{modified->path, std::move(survivors)}};
 }

@@ -4,6 +4,11 @@
 
 namespace MarletFoundation {
 
+/// Those of the hunks whose original range lies wholly in one of the `editableRanges` of `content`, an
+/// insertion at either end included.
+std::vector<MarletDiff::DiffDescriptor> editableHunks(const MarletDiff::DiffDescriptors& hunks,
+                                                      std::u16string_view content);
+
 /// Keeps a learner's changes within what may be edited.
 struct MARLET_EXPORT UserEditDiffPackValidator final : DiffPackValidator {
   /// A user-edit pack of a book, whose base version is its update version.
@@ -16,9 +21,7 @@ struct MARLET_EXPORT UserEditDiffPackValidator final : DiffPackValidator {
   /// Does nothing: the pack was tested when the validator was made.
   void validate() const override {}
 
-  /// A modified entry with those of its hunks whose original range lies wholly in one of the
-  /// `editableRanges` of `content`, an insertion at either end included; nothing when no hunk is left. Other
-  /// entries stay as they are. A modified entry without `content` is a fatal error.
+  /// A modified entry with its `editableHunks`; nothing when no hunk is left. Other entries stay as they are. A modified entry without `content` is a fatal error.
   std::optional<MarletDiff::FileDiffDescriptor> validatedUpdate(
       const MarletDiff::FileDiffDescriptor& descriptor,
       std::optional<std::u16string_view> content = std::nullopt) const override;

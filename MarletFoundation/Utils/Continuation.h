@@ -114,9 +114,25 @@ Continuation<Unit> sequence_(std::vector<Continuation<T>> continuations) {
       });
 }
 
-/// Calls `f` on the global queue; returns at once.
-inline void asyncio(std::function<void()> f) { DispatchQueue::global().async(std::move(f)); }
-/// Calls `f` on the main queue; returns at once.
-inline void mainthreadio(std::function<void()> f) { DispatchQueue::main().async(std::move(f)); }
+/// A function of no arguments that yields a continuation to be run next.
+template <class F>
+concept YieldsContinuation = std::convertible_to<std::invoke_result_t<F&>, Continuation<Unit>>;
+
+/// Has `f` called on the global queue, and the continuation run that it may yield; returns at once.
+template <std::invocable F>
+void asyncio(F f) {
+  if constexpr (YieldsContinuation<F>)
+    Continuation<Unit>::background(std::move(f)).run();
+  else
+    DispatchQueue::global().async(std::move(f));
+}
+/// The same on the main queue.
+template <std::invocable F>
+void mainthreadio(F f) {
+  if constexpr (YieldsContinuation<F>)
+    Continuation<Unit>::mainAsync(std::move(f)).run();
+  else
+    DispatchQueue::main().async(std::move(f));
+}
 
 }  // namespace MarletFoundation

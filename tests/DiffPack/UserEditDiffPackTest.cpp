@@ -1,6 +1,9 @@
 #include "MarletFoundation/DiffPack/UserEditDiffPack.h"
 
 #include <gtest/gtest.h>
+#include <rapidcheck/gtest.h>
+
+#include <numeric>
 
 #include "DiffPack/Packs.h"
 #include "MarletDiff/ContentDiff.h"
@@ -123,6 +126,35 @@ TEST_F(UpdatingUserEdits, KeepsWhatIsEditableOfATextAndDropsTheRest) {
   // A learner's slashes ahead of the end tag are the learner's.
   const auto slashes = replacing(source, "second\n", "second\n//\n//\n////\n");
   EXPECT_EQ(seen("page", slashes), slashes);
+}
+
+TEST_F(UpdatingUserEdits, KeepsWhatIsWrittenBetweenTheQuotesOfAField) {
+  const auto page = [](const std::string& written) {
+    return "let s = /*#-editable-code*/\"" + written + "\"/*#-end-editable-code*/\n";
+  };
+  const std::vector<std::string> texts = {
+      "", "\"", "x", "\"x\"", R"(\"x\")", R"(x" + name + "!)", R"(a" + "x)", R"(\(names["x"]))"};
+  for (const auto& original : texts) {
+    Tree{{"quoted", page(original)}}.writeTo(directory_.path());
+    for (const auto& written : texts) EXPECT_EQ(seen("quoted", page(written)), page(written)) << original;
+  }
+}
+
+RC_GTEST_FIXTURE_PROP(UpdatingUserEdits, LosesNothingThatIsWrittenInFields, ()) {
+  const auto anyText =
+      rc::gen::map(rc::gen::container<std::vector<std::string>>(rc::gen::element<std::string>(
+                       "a", " ", "\n", "\"", "/", "*", "//#-", "//#-end-editable-code\n",
+                       "/*#-end-editable-code*/", "//#-editable-code\n", "/*#-editable-code*/", "let x")),
+                   [](const std::vector<std::string>& pieces) {
+                     return std::accumulate(pieces.begin(), pieces.end(), std::string());
+                   });
+  const auto page = [&](const std::string& one, const std::string& two, const std::string& three) {
+    return "a\n//#-editable-code\n" + one + "//#-end-editable-code\nb\nf(/*#-editable-code*/\"" + two +
+           "\"/*#-end-editable-code*/)\n//#-editable-code\n" + three + "//#-end-editable-code\n";
+  };
+  Tree{{"fields", page("x\ny\n", "x y", "\n")}}.writeTo(directory_.path());
+  const auto edited = page(*anyText, *anyText, *anyText);
+  RC_ASSERT(seen("fields", edited) == edited);
 }
 
 TEST_F(UpdatingUserEdits, ALineFeedThatTheEditorAddsIsNoEdit) {

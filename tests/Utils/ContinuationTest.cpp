@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <atomic>
 #include <thread>
 
 #include "MarletFoundation/Platform/Host.h"
@@ -29,6 +30,15 @@ TEST(Continuation, ChainsAndStopsAtTheFirstFailure) {
   EXPECT_EQ(sequence<int>({step('p'), step('q')}).run(), (std::vector<int>{'p', 'q'}));
   EXPECT_EQ(sequence<int>({}).run(), std::vector<int>());
   EXPECT_TRUE(sequence_<int>({}).run());
+}
+
+TEST(Continuation, SubmissionRunsAFunctionAndWhatItYields) {
+  std::atomic<int> ran = 0;
+  asyncio([&] { ran += isMainThread() ? 0 : 1; });
+  asyncio([&] { return Work([&] { return ran += isMainThread() ? 0 : 2, Unit(); }); });
+  mainthreadio([&] { ran += isMainThread() ? 4 : 0; });
+  mainthreadio([&] { return Work([&] { return ran += isMainThread() ? 8 : 0, Unit(); }); });
+  EXPECT_TRUE(runUntil([&] { return ran == 15; }, 10)) << ran;
 }
 
 TEST(Continuation, SchedulerRunsTheLastOfAName) {
