@@ -28,8 +28,8 @@ MARLET_EXPORT DiffPackSnapshot updatedUserEditDiffPack(const DiffPackSnapshot& p
                                                        const UserEdits& userEdits);
 
 /// The changes from a file's authored text to its edited one, before any is dropped. Where some would be
-/// dropped, though the text around the fields is as authored, the fields are compared one by one. A line feed at the end
-/// that the authored text lacks doesn't count: editors add one.
+/// dropped, though the text around the fields is as authored, the fields are compared one by one. A line feed at
+/// the end that the authored text lacks doesn't count: editors add one.
 MARLET_EXPORT std::vector<MarletDiff::DiffDescriptor> userEditHunks(std::u16string_view original,
                                                                     std::u16string_view edited);
 

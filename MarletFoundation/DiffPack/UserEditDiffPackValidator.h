@@ -21,7 +21,8 @@ struct MARLET_EXPORT UserEditDiffPackValidator final : DiffPackValidator {
   /// Does nothing: the pack was tested when the validator was made.
   void validate() const override {}
 
-  /// A modified entry with its `editableHunks`; nothing when no hunk is left. Other entries stay as they are. A modified entry without `content` is a fatal error.
+  /// A modified entry with its `editableHunks`; nothing when no hunk is left. Other entries stay as they are. A
+  /// modified entry without `content` is a fatal error.
   std::optional<MarletDiff::FileDiffDescriptor> validatedUpdate(
       const MarletDiff::FileDiffDescriptor& descriptor,
       std::optional<std::u16string_view> content = std::nullopt) const override;
