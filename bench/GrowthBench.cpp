@@ -136,7 +136,8 @@ Work packing(int pages) {
   generateBook(updated.path(), pages, 0, "1.0.1");
   writeSources(original, pages, [](int) { return lampSource(1); });
   writeSources(updated, pages, [](int page) { return lampSource(page % 10 == 0 ? 2 : 1); });
-  return [=] { makeUpdateDiffPack(original, updated).fileWrapper().write(pack); };
+  return
+      [scratch, original, updated, pack] { makeUpdateDiffPack(original, updated).fileWrapper().write(pack); };
 }
 
 /// Every tenth page is changed by the update and by the learner, in different lines; there and back.
