@@ -15,15 +15,15 @@
 namespace MarletFoundation {
 namespace {
 
-/// The file at its end, made when it isn't there; none when it can't be opened.
+/// The file at its end, made when it isn't there; none when it can't be opened, or is a pipe that nobody reads.
 Descriptor openLog() {
   const auto& directory = HostEnvironment::current().applicationSupportDirectory;
-  if (!directory) fatalError("There is no application-support directory for the activity log.");
   std::error_code failure;
-  std::filesystem::create_directories(directory->path(), failure);
+  if (directory) std::filesystem::create_directories(directory->path(), failure);
+  if (!directory || failure) fatalError("There is no application-support directory for the activity log.");
   const auto path = directory->appendingPathComponent("activity.log").path();
-  return Descriptor(
-      retrying([&] { return ::open(path.c_str(), O_WRONLY | O_CREAT | O_APPEND | O_CLOEXEC, 0600); }));
+  return Descriptor(retrying(
+      [&] { return ::open(path.c_str(), O_WRONLY | O_CREAT | O_APPEND | O_NONBLOCK | O_CLOEXEC, 0600); }));
 }
 
 /// "2026-11-23 05:20:40 +0000"
