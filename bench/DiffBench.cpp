@@ -1,5 +1,5 @@
 // Texts, merges and trees compared, side by side with libgit2's line diff and merge on the same input. The
-// peers that are programs are in `compare-diff-programs`.
+// peers that are programs are in `headlines.py`.
 #include <benchmark/benchmark.h>
 #include <git2.h>
 
@@ -9,7 +9,6 @@
 
 #include "MarletDiff/ContentDiff.h"
 #include "MarletDiff/ContentMerge.h"
-#include "MarletDiff/RecursiveFileDiff.h"
 #include "MarletFoundation/Platform/Text.h"
 
 namespace {
@@ -203,23 +202,6 @@ int writeTexts(const std::filesystem::path& directory) {
   return 0;
 }
 
-/// What the programs of the same names do, in a process of its own.
-int runOnce(std::string_view what, const char* first, const char* second, const char* third) {
-  const auto text = [](const char* path) {
-    std::ifstream file(path, std::ios::binary);
-    return *MarletFoundation::utf16FromUTF8(std::string(std::istreambuf_iterator<char>(file), {}));
-  };
-  const auto smaller = DiffOptions::SmallerHunks;
-  if (what == "--trees") {
-    using MarletFoundation::URL;
-    return recursiveFileDiff(URL::file(first, true), URL::file(second, true), smaller).size() == 100 ? 0 : 1;
-  }
-  const auto base = text(first), left = text(second);
-  const auto diff = diffContent(base, left, smaller);
-  if (what == "--diff") return diff.empty() ? 1 : 0;
-  return mergeContent(base, diff, diffContent(base, text(third), smaller)).empty() ? 1 : 0;
-}
-
 }  // namespace
 
 #define COMPARE(texts)                   \
@@ -233,11 +215,9 @@ BENCHMARK_CAPTURE(libgit2, longLineCharacters, longLineCharacters);
 BENCHMARK(oursMerge);
 BENCHMARK(libgit2Merge);
 
-// `--write-texts DIRECTORY` writes the input; `--diff`, `--merge` and `--trees` do that once with files.
+// `--write-texts DIRECTORY` writes the input of DiffDriver and its peers.
 int main(int argc, char** argv) {
   if (argc == 3 && std::string_view(argv[1]) == "--write-texts") return writeTexts(argv[2]);
-  if (argc >= 4 && std::string_view(argv[1]).starts_with("--") && argv[2][0] != '-')
-    return runOnce(argv[1], argv[2], argv[3], argc > 4 ? argv[4] : nullptr);
   git_libgit2_init();
   benchmark::Initialize(&argc, argv);
   benchmark::RunSpecifiedBenchmarks();

@@ -87,14 +87,14 @@ BENCHMARKS = [
 
 
 def diff(pair):
-    return ["DiffBench", "--diff", f"{pair}.old", f"{pair}.new"]
+    return ["DiffDriver", "diff", f"{pair}.old", f"{pair}.new"]
 
 
 def git_diff(pair):
     return ["git", "diff", "--no-index", "-U0", f"{pair}.old", f"{pair}.new"]
 
 
-MERGE = ["DiffBench", "--merge", "base", "left", "right"]
+MERGE = ["DiffDriver", "merge", "base", "left", "right"]
 PLISTLIB = "import plistlib; plistlib.load(open('large.xml', 'rb'))"
 
 PROCESSES = [
@@ -107,7 +107,7 @@ PROCESSES = [
     Processes("one line of 1 MB, 1 % of its words", diff("line"), "git diff by characters", git_diff("characters"), 0.12, SEARCH),
     Processes("merging three texts, both diffs with it", MERGE, "git merge-file", ["git", "merge-file", "-p", "left", "base", "right"],
               0.5, SEARCH),
-    Processes("two trees of 5,000 files", ["DiffBench", "--trees", "old", "new"], "diff -rq", ["diff", "-rq", "old", "new"], 0.7,
+    Processes("two trees of 5,000 files", ["DiffDriver", "trees", "old", "new"], "diff -rq", ["diff", "-rq", "old", "new"], 0.7,
               "both are bound by the kernel's opening and reading of 10,000 files"),
     Processes("reading a large XML list", ["PropertyListBench", "--memory", "large.xml"], "python's plistlib",
               ["python3", "-c", PLISTLIB]),

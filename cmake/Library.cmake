@@ -52,7 +52,8 @@ add_library(MarletFoundationStatic STATIC $<TARGET_OBJECTS:MarletFoundation> $<T
                                           $<TARGET_OBJECTS:ArcCopier> $<TARGET_OBJECTS:TelvaneReporting>)
 add_library(MarletFoundation::Static ALIAS MarletFoundationStatic)
 set_target_properties(MarletFoundationStatic PROPERTIES OUTPUT_NAME MarletFoundation EXPORT_NAME Static LINKER_LANGUAGE CXX)
-target_include_directories(MarletFoundationStatic INTERFACE $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
+target_include_directories(MarletFoundationStatic INTERFACE $<BUILD_INTERFACE:${CMAKE_SOURCE_DIR}>
+                                                            $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
 target_compile_features(MarletFoundationStatic INTERFACE cxx_std_20)
 target_link_libraries(MarletFoundationStatic PRIVATE LibArchive::LibArchive ICU::i18n ICU::uc LibXml2::LibXml2 OpenSSL::Crypto
                                                      uriparser::uriparser Threads::Threads ${CMAKE_DL_LIBS})
