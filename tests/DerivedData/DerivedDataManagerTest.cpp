@@ -92,21 +92,21 @@ TEST_F(DerivedData, IsWipedWhereAnotherVersionMadeIt) {
 TEST_F(DerivedData, DirectoriesOfADocument) {
   const DerivedDataManager manager;
   const auto base = directory_.path() / "group.CompilerDerivedData/DerivedData";
-  const auto path = [&](const char* name) {
-    return directory_.url("group.CompilerDerivedData/DerivedData/" + std::string(name)).path();
-  };
-  EXPECT_EQ(manager.derivedDataDirectoryURLForMarletWithName("Foo", "abc", false).path(), path("Foo-abc"));
+  // Relative URLs are made from these, so they have to say that they are directories.
+  const auto url = [&](const char* name) { return URL::file((base / name).string(), true).absoluteString(); };
+  EXPECT_EQ(manager.derivedDataDirectoryURLForMarletWithName("Foo", "abc", false).absoluteString(),
+            url("Foo-abc"));
   EXPECT_FALSE(fs::exists(base / "Foo-abc"));
-  EXPECT_EQ(manager.buildDirectoryURLForMarletWithName("Foo", "abc").path(), path("Foo-abc/Build"));
+  EXPECT_EQ(manager.buildDirectoryURLForMarletWithName("Foo", "abc").absoluteString(), url("Foo-abc/Build"));
   EXPECT_TRUE(fs::is_directory(base / "Foo-abc/Build"));
-  EXPECT_EQ(manager.resourcesBundlesDirectoryURLForMarletWithName("Foo", "abc").path(),
-            path("Foo-abc/ResourcesBundles"));
-  EXPECT_EQ(manager.buildDirectoryURLForMarletWithName("Foo", "abc", true, false).path(),
-            directory_.url("support/PrivateDerivedData/Foo-abc/Build").path());
-  EXPECT_EQ(manager.derivedDataDirectoryURLForMarletWithName("../../..", "x", false).path(),
-            path(".._.._..-x"));
+  EXPECT_EQ(manager.resourcesBundlesDirectoryURLForMarletWithName("Foo", "abc").absoluteString(),
+            url("Foo-abc/ResourcesBundles"));
+  EXPECT_EQ(manager.buildDirectoryURLForMarletWithName("Foo", "abc", true, false).absoluteString(),
+            directory_.url("support/PrivateDerivedData/Foo-abc/Build").absoluteString() + "/");
+  EXPECT_EQ(manager.derivedDataDirectoryURLForMarletWithName("../../..", "x", false).absoluteString(),
+            url(".._.._..-x"));
   std::ofstream(base / "Bar-x") << "in the way";
-  EXPECT_EQ(manager.buildDirectoryURLForMarletWithName("Bar", "x").path(), path("Bar-x/Build"));
+  EXPECT_EQ(manager.buildDirectoryURLForMarletWithName("Bar", "x").absoluteString(), url("Bar-x/Build"));
 }
 
 TEST_F(DerivedData, WithoutAContainerIsFatal) {
