@@ -136,9 +136,16 @@ void ContentDiff::cut(Text& text, std::uint32_t start, std::uint32_t end, Level 
 void ContentDiff::numberOriginal(Side& side) {
   side.numbers.clear();
   firstPlaces_.clear();
-  for (std::uint32_t i = 0; i + 1 < side.starts.size(); ++i) {
-    side.numbers.push_back(numbers_.number(side.token(original_.view, i)));
-    if (side.numbers.back() == firstPlaces_.size()) firstPlaces_.push_back(i);
+  const auto count = static_cast<std::uint32_t>(side.starts.size()) - 1;
+  std::array<std::uint64_t, 8> prepared;
+  for (std::uint32_t ahead = 0; ahead < count + prepared.size(); ++ahead) {
+    auto& hash = prepared[ahead % prepared.size()];
+    if (ahead >= prepared.size()) {
+      const auto i = ahead - static_cast<std::uint32_t>(prepared.size());
+      side.numbers.push_back(numbers_.number(side.token(original_.view, i), hash));
+      if (side.numbers.back() == firstPlaces_.size()) firstPlaces_.push_back(i);
+    }
+    if (ahead < count) hash = numbers_.prepare(side.token(original_.view, ahead));
   }
 }
 

@@ -38,21 +38,6 @@ std::uint64_t mixed(std::uint64_t a, std::uint64_t b) {
   return static_cast<std::uint64_t>(product) ^ static_cast<std::uint64_t>(product >> 64);
 }
 
-std::uint64_t hash(std::u16string_view token) {
-  constexpr std::uint64_t first = 0x9E3779B97F4A7C15, second = 0xC2B2AE3D27D4EB4F;
-  const auto* bytes = reinterpret_cast<const char*>(token.data());
-  auto size = token.size() * sizeof(char16_t);
-  std::uint64_t result = seed ^ size;
-  std::uint64_t words[2];
-  for (; size > sizeof words; bytes += sizeof words, size -= sizeof words) {
-    std::memcpy(words, bytes, sizeof words);
-    result = mixed(words[0] ^ first ^ result, words[1] ^ second);
-  }
-  words[0] = words[1] = 0;
-  std::memcpy(words, bytes, size);
-  return mixed(words[0] ^ first ^ result, words[1] ^ second ^ seed);
-}
-
 }  // namespace
 
 void cutLines(std::u16string_view text, std::uint32_t start, std::uint32_t end, TokenStarts& tokens) {
@@ -93,8 +78,28 @@ void TokenNumbers::reset(std::size_t tokens) {
   known_.clear();
 }
 
-std::uint32_t TokenNumbers::number(std::u16string_view token) {
+std::uint64_t TokenNumbers::hash(std::u16string_view token) {
+  constexpr std::uint64_t first = 0x9E3779B97F4A7C15, second = 0xC2B2AE3D27D4EB4F;
+  const auto* bytes = reinterpret_cast<const char*>(token.data());
+  auto size = token.size() * sizeof(char16_t);
+  std::uint64_t result = seed ^ size;
+  std::uint64_t words[2];
+  for (; size > sizeof words; bytes += sizeof words, size -= sizeof words) {
+    std::memcpy(words, bytes, sizeof words);
+    result = mixed(words[0] ^ first ^ result, words[1] ^ second);
+  }
+  words[0] = words[1] = 0;
+  std::memcpy(words, bytes, size);
+  return mixed(words[0] ^ first ^ result, words[1] ^ second ^ seed);
+}
+
+std::uint64_t TokenNumbers::prepare(std::u16string_view token) const {
   const auto tokenHash = hash(token);
+  __builtin_prefetch(&slots_[tokenHash & mask_], 1);
+  return tokenHash;
+}
+
+std::uint32_t TokenNumbers::number(std::u16string_view token, std::uint64_t tokenHash) {
   const auto hashBits = static_cast<std::uint32_t>(tokenHash >> 32);
   for (auto place = tokenHash & mask_;; place = (place + 1) & mask_) {
     auto& slot = slots_[place];

@@ -24,10 +24,15 @@ class TokenNumbers {
  public:
   /// Forgets all tokens and makes room for as many.
   void reset(std::size_t tokens);
-  std::uint32_t number(std::u16string_view token);
+  std::uint32_t number(std::u16string_view token) { return number(token, hash(token)); }
+  /// The same in two steps, for many tokens: between them, the memory for the second is fetched.
+  std::uint64_t prepare(std::u16string_view token) const;
+  std::uint32_t number(std::u16string_view token, std::uint64_t prepared);
   std::size_t size() const { return known_.size(); }
 
  private:
+  static std::uint64_t hash(std::u16string_view token);
+
   std::vector<std::u16string_view> known_;
   /// A hash table with open addressing: numbers plus 1, 0 where free, beside some bits of the hash.
   struct Slot {

@@ -177,11 +177,11 @@ struct Operation {
 };
 constexpr Operation operations[] = {
     {"opening", opening, 250},
-    {"scanning", scanning, 4000},
-    {"converting", converting, 4000},
-    {"diffing", diffing, 4000},
-    {"diffingFewSymbols", diffingFewSymbols, 4000},
-    {"merging", merging, 4000},
+    {"scanning", scanning, 16000},
+    {"converting", converting, 16000},
+    {"diffing", diffing, 16000},
+    {"diffingFewSymbols", diffingFewSymbols, 16000},
+    {"merging", merging, 16000},
     {"packing", packing, 32},
     {"applying", applying, 32},
 };

@@ -117,11 +117,11 @@ PROCESSES = [
 # Each at three sizes, eight times the one before: pages of a book, lines of a text.
 GROWTH = {
     "opening a book": ("opening", 250),
-    "scanning for tags": ("scanning", 4000),
-    "converting offsets": ("converting", 4000),
-    "diffing": ("diffing", 4000),
-    "diffing where the search gives up": ("diffingFewSymbols", 4000),
-    "merging": ("merging", 4000),
+    "scanning for tags": ("scanning", 16000),
+    "converting offsets": ("converting", 16000),
+    "diffing": ("diffing", 16000),
+    "diffing where the search gives up": ("diffingFewSymbols", 16000),
+    "merging": ("merging", 16000),
     "making and writing an update": ("packing", 32),
     "applying an update and undoing it": ("applying", 32),
 }
