@@ -25,7 +25,9 @@ namespace {
 
 /// A directory that goes with the last copy of the work that uses it.
 struct Scratch {
-  std::string path = (fs::temp_directory_path() / "marlet-growth-XXXXXX").string();
+  std::string path =
+      ((fs::exists("/dev/shm") ? fs::path("/dev/shm") : fs::temp_directory_path()) / "marlet-growth-XXXXXX")
+          .string();
   Scratch() {
     if (!::mkdtemp(path.data())) std::exit(1);
   }
