@@ -13,19 +13,20 @@ bool fails() {
   return failing != 0 && (made == failing || (failsFromThere && made > failing));
 }
 
-void* allocated(void* memory) {
+void* allocate(std::size_t size) { return fails() ? nullptr : std::malloc(size == 0 ? 1 : size); }
+
+void* orThrow(void* memory) {
   if (!memory) throw std::bad_alloc();
   return memory;
 }
 
 }  // namespace
 
-void* operator new(std::size_t size) {
-  return allocated(fails() ? nullptr : std::malloc(size == 0 ? 1 : size));
-}
+void* operator new(std::size_t size) { return orThrow(allocate(size)); }
+void* operator new(std::size_t size, const std::nothrow_t&) noexcept { return allocate(size); }
 void* operator new(std::size_t size, std::align_val_t alignment) {
   const auto unit = static_cast<std::size_t>(alignment);
-  return allocated(fails() ? nullptr : std::aligned_alloc(unit, (size + unit - 1) / unit * unit));
+  return orThrow(fails() ? nullptr : std::aligned_alloc(unit, (size + unit - 1) / unit * unit));
 }
 void operator delete(void* memory) noexcept { std::free(memory); }
 void operator delete(void* memory, std::size_t) noexcept { std::free(memory); }
