@@ -40,6 +40,16 @@ bool equal(const UserInfoValue& a, const UserInfoValue& b) {
 
 }  // namespace
 
+UserInfoValue::UserInfoValue(const UserInfoValue& other) : variant() {
+  if (const auto* text = std::get_if<std::string>(&other)) {
+    emplace<std::string>(*text);
+  } else if (const auto* number = std::get_if<std::int64_t>(&other)) {
+    emplace<std::int64_t>(*number);
+  } else {
+    emplace<ErrorPointer>(std::get<ErrorPointer>(other));
+  }
+}
+
 ErrorObject::ErrorObject(std::string domain, int code, UserInfo userInfo)
     : domain_(std::move(domain)), code_(code), userInfo_(std::move(userInfo)) {}
 

@@ -28,7 +28,17 @@ inline constexpr std::string_view MarletFoundationErrorDomain = "MarletFoundatio
 /// For hosts that make error objects of serialization failures.
 inline constexpr std::string_view MarletSerializationErrorDomain = "MarletSerialization";
 
-using UserInfoValue = std::variant<std::string, std::int64_t, ErrorPointer>;
+/// A text, a number, or another error.
+struct MARLET_EXPORT UserInfoValue : std::variant<std::string, std::int64_t, ErrorPointer> {
+  using variant::variant;
+  /// By a hand of its own: the standard library's copy is undefined when it finds no memory for the text.
+  UserInfoValue(const UserInfoValue& other);
+  UserInfoValue(UserInfoValue&&) noexcept = default;
+  UserInfoValue& operator=(UserInfoValue other) noexcept {
+    swap(other);
+    return *this;
+  }
+};
 using UserInfo = std::map<std::string, UserInfoValue, std::less<>>;
 
 /// The form in which an error reaches a host: domain, code and user info. One that was made from a typed
