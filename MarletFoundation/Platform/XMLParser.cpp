@@ -65,21 +65,27 @@ struct XMLParserEvents {
     UserInfo info{{std::string(LocalizedDescriptionKey), std::move(message)}, {std::string(LineKey), line}};
     parser.error_.emplace(std::string(XMLParserErrorDomain), code, std::move(info));
   }
+  /// Keeps what `work` throws, which also is what finds no memory.
+  template <class Work>
+  void keepThrown(const Work& work) noexcept {
+    try {
+      work();
+    } catch (...) {
+      if (!thrown) thrown = std::current_exception();
+      parser.aborted_ = true;
+    }
+  }
   /// Ends the run from within an event.
-  void stop(int code, std::string message) {
-    fail(code, std::move(message), context && context->input ? context->input->line : 1);
+  void stop(int code, std::string_view message) {
+    keepThrown(
+        [&] { fail(code, std::string(message), context && context->input ? context->input->line : 1); });
     if (context) xmlStopParser(context);
   }
 
   template <class Call>
   void tellDelegate(const Call& call) {
-    if (!parser.delegate || parser.error_) return;
-    try {
-      call(*parser.delegate);
-    } catch (...) {
-      thrown = std::current_exception();
-      parser.aborted_ = true;
-    }
+    if (!parser.delegate || parser.error_ || thrown) return;
+    keepThrown([&] { call(*parser.delegate); });
     if (parser.aborted_) stop(XML_ERR_USER_STOP, "The parse was aborted.");
   }
 
@@ -118,17 +124,24 @@ struct XMLParserEvents {
   }
   /// Asked for all but the five entities of XML itself. Beside a document type the reader would only warn.
   static xmlEntity* entity(void* self, const xmlChar* name) {
-    of(self).stop(XML_ERR_UNDECLARED_ENTITY, std::string("The entity '") + text(name) + "' isn't declared.");
+    auto& events = of(self);
+    events.keepThrown([&] {
+      events.fail(XML_ERR_UNDECLARED_ENTITY, std::string("The entity '") + text(name) + "' isn't declared.",
+                  events.context->input->line);
+    });
+    xmlStopParser(events.context);
     return nullptr;
   }
 
   static void error(void* self, xmlError* error) {
     auto& events = of(self);
     if (error->level < XML_ERR_FATAL) return;
-    std::string message = error->message ? error->message : "The document isn't well-formed.";
-    message.erase(message.find_last_not_of('\n') + 1);
-    if (error->code == XML_ERR_NO_MEMORY) message = "The document's names take more than a megabyte.";
-    events.fail(error->code, std::move(message), error->line);
+    events.keepThrown([&] {
+      std::string message = error->message ? error->message : "The document isn't well-formed.";
+      message.erase(message.find_last_not_of('\n') + 1);
+      if (error->code == XML_ERR_NO_MEMORY) message = "The document's names take more than a megabyte.";
+      events.fail(error->code, std::move(message), error->line);
+    });
     // The reader goes on to report every further error. Its buffers are in use, so it can't be stopped as
     // from an event, only made to leave its loops.
     events.context->instate = XML_PARSER_EOF;
@@ -178,13 +191,13 @@ bool XMLParser::parse() {
   const auto utf8 = document.utf8.view();
   XMLParserEvents events(*this);
   events.tellDelegate([&](Delegate& d) { d.didStartDocument(*this); });
-  if (!error_) events.read(utf8);
+  if (!error_ && !events.thrown) events.read(utf8);
   if (document.refusal && !aborted_ && (!error_ || line(*error_) >= lastLine(utf8))) {
     // Where the text was cut, the cut's reason tells more than that the text ends too early.
     error_.reset();
     events.fail(XML_ERR_DOCUMENT_END, std::string(*document.refusal), lastLine(utf8));
   }
-  if (!error_) events.tellDelegate([&](Delegate& d) { d.didEndDocument(*this); });
+  if (!error_ && !events.thrown) events.tellDelegate([&](Delegate& d) { d.didEndDocument(*this); });
   if (events.thrown) std::rethrow_exception(events.thrown);
   return !error_;
 }
