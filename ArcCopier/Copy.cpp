@@ -32,7 +32,7 @@ bool isDestinationsEnd(int error) {
 
 Copy::Copy(ArcCopier& copier, int archive) : copier_(copier), directory_(archive, copier.limits.entries) {
   directory_.checkLocalHeaders();
-  items_ = plan(directory_);
+  items_ = plan(directory_, copier.limits.entries);
   std::vector<const ZipEntry*> readable;
   for (const auto& item : items_) {
     if (!item.path.problem && !item.path.isDirectory) readable.push_back(item.entry);
