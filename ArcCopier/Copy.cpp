@@ -113,6 +113,9 @@ void Copy::failedToWrite(const PlannedItem& item, int error) {
     return stopUnlessContinued(
         copier_.call(copier_.fileConflict, path, error, "something else is there already"));
   }
+  // Which of the two the system tells depends on what is asked of it.
+  if (error == ENOTDIR || error == ELOOP)
+    return failed(item, {error, "a file or a link is there already where it needs a directory"});
   if (!isDestinationsEnd(error)) return failed(item, {error, std::strerror(error)});
   copier_.call(copier_.fatalFileError, path, error, std::strerror(error));
   throw CopyEnd{ArcCopierBadDestination, error};
