@@ -74,13 +74,22 @@ void Tokens::cutLines(std::uint32_t start, std::uint32_t end) {
 
 void Tokens::cutWords(Characters& characters, std::uint32_t start, std::uint32_t end) {
   starts.clear();
+  // Each place is written and counted only where a token starts: a processor can't foresee which do.
+  std::array<std::uint32_t, 256> block;
+  std::size_t count = 0;
   bool inWord = false;
   for (auto at = start; at < end; ++at) {
-    if (at != start && !characters.startAt(at)) continue;
+    const bool startsCharacter = at == start || characters.startAt(at);
     const bool isWord = isWordUnit(text[at]);
-    if (!isWord || !inWord) starts.push_back(at);
-    inWord = isWord;
+    block[count] = at;
+    count += startsCharacter & !(isWord & inWord);
+    inWord = startsCharacter ? isWord : inWord;
+    if (count == block.size()) {
+      starts.insert(starts.end(), block.begin(), block.end());
+      count = 0;
+    }
   }
+  starts.insert(starts.end(), block.begin(), block.begin() + count);
   starts.push_back(end);
 }
 
@@ -167,9 +176,14 @@ std::uint64_t TokenNumbers::hash(std::u16string_view token) {
     std::memcpy(words, bytes + at, sizeof words);
     mix();
   }
-  // The last words end where the token does, and of a long one begin within those before.
-  if (size >= sizeof words) {
-    std::memcpy(words, bytes + size - sizeof words, sizeof words);
+  // The last words end where the token does, and may begin within what was mixed before.
+  const auto* tail = bytes + size;
+  if (size >= 16) {
+    std::memcpy(words, tail - 16, 16);
+  } else if (size >= 8) {
+    std::memcpy(&words[0], bytes, 8), std::memcpy(&words[1], tail - 8, 8);
+  } else if (size >= 4) {
+    std::memcpy(&words[0], bytes, 4), std::memcpy(&words[1], tail - 4, 4);
   } else {
     std::memcpy(words, bytes, size);
   }
