@@ -2,25 +2,7 @@
 
 #include <sstream>
 
-#include "MarletFoundation/Data/JSON.h"
-#include "MarletFoundation/Environment/SearchPath.h"
-#include "MarletFoundation/Marlet/AssessmentInformation.h"
-#include "MarletFoundation/Marlet/AssessmentStatus.h"
-#include "MarletFoundation/Marlet/BookPageLoading.h"
-#include "MarletFoundation/Marlet/BookPagePlaceholderSnapshot.h"
-#include "MarletFoundation/Marlet/CutsceneBookPageSnapshot.h"
-#include "MarletFoundation/Marlet/MarletBookPageSnapshot.h"
-#include "MarletFoundation/Marlet/MarletBookSnapshot.h"
-#include "MarletFoundation/Marlet/MarletChapterSnapshot.h"
-#include "MarletFoundation/Marlet/MarletInlineResultData.h"
-#include "MarletFoundation/Marlet/MarletKeyValueStore.h"
-#include "MarletFoundation/Marlet/MarletResultInfoSnapshot.h"
-#include "MarletFoundation/Marlet/MarletSnapshot.h"
-#include "MarletFoundation/SourceEditor/Issue.h"
-#include "MarletFoundation/SourceEditor/SourceEditorPosition.h"
-#include "MarletFoundation/SourceEditor/SourceEditorRange.h"
-#include "MarletFoundation/Utils/Archive.h"
-#include "MarletFoundation/Utils/Checksum.h"
+#include "MarletFoundation/MarletFoundation.h"
 
 namespace MarletFoundation::test {
 namespace {
