@@ -1,6 +1,6 @@
 # `make` builds build/release/bin/marlet; `make demo` and `make test` install what is missing first.
 .DEFAULT_GOAL := marlet
-.PHONY: marlet demo test asan tsan bench fuzz doc format check-format embed package
+.PHONY: marlet demo test asan tsan coverage bench fuzz doc format check-format embed package
 
 FUZZ_SECONDS ?= 600
 
@@ -26,6 +26,12 @@ asan tsan:
 	$(call configure,$@)
 	cmake --build --preset $@ --target marlet_tests
 	build/$@/bin/marlet_tests --gtest_brief=1
+
+coverage:
+	scripts/install-dependencies --develop
+	$(call configure,$@)
+	cmake --build --preset $@
+	scripts/measure-coverage
 
 bench:
 	scripts/install-dependencies --develop

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <array>
 #include <cstddef>
 #include <string_view>
 #include <vector>
@@ -9,12 +10,18 @@ namespace MarletDiff {
 /// U+2029, which ends a line as LF, CR and CR LF do.
 inline constexpr char16_t ParagraphSeparator = u'\u2029';
 
+inline constexpr auto asciiWordUnits = [] {
+  std::array<bool, 0x80> isWord{};
+  for (char unit = 'a'; unit <= 'z'; ++unit) isWord[unit] = isWord[unit - 'a' + 'A'] = true;
+  for (char unit = '0'; unit <= '9'; ++unit) isWord[unit] = true;
+  isWord['_'] = true;
+  return isWord;
+}();
+
 /// Whether a UTF-16 unit is part of a word: a letter, a digit or an underscore, and whatever lies beyond
 /// ASCII, so that neither a surrogate pair nor a letter with its marks is ever divided.
 inline bool isWordUnit(char16_t unit) {
-  if (unit >= 0x80) return unit != ParagraphSeparator;
-  return (unit >= u'a' && unit <= u'z') || (unit >= u'A' && unit <= u'Z') || (unit >= u'0' && unit <= u'9') ||
-         unit == u'_';
+  return unit < asciiWordUnits.size() ? asciiWordUnits[unit] : unit != ParagraphSeparator;
 }
 
 inline bool endsLine(char16_t unit) { return unit == u'\n' || unit == u'\r' || unit == ParagraphSeparator; }

@@ -12,22 +12,27 @@ constexpr auto none = std::numeric_limits<std::uint32_t>::max();
 
 void Comparison::countOccurrences(std::span<const std::uint32_t> original,
                                   std::span<const std::uint32_t> modified, std::size_t numbers) {
-  occurrences_.assign(numbers, {});
+  occurrences_.assign(numbers + 1, {});
   for (const auto number : original) ++occurrences_[number].original;
   for (const auto number : modified) ++occurrences_[number].modified;
-  original_.clear(), originalPlaces_.clear(), modified_.clear(), modifiedPlaces_.clear();
+  original_.resize(original.size()), originalPlaces_.resize(original.size());
+  modified_.resize(modified.size()), modifiedPlaces_.resize(modified.size());
+  std::uint32_t count = 0;
   for (std::uint32_t i = 0; i < original.size(); ++i) {
-    if (occurrences_[original[i]].modified == 0) continue;
-    original_.push_back(original[i]);
-    originalPlaces_.push_back(i);
+    original_[count] = original[i];
+    originalPlaces_[count] = i;
+    count += occurrences_[original[i]].modified != 0;
   }
+  original_.resize(count), originalPlaces_.resize(count);
+  count = 0;
   for (std::uint32_t i = 0; i < modified.size(); ++i) {
     auto& occurrences = occurrences_[modified[i]];
-    if (occurrences.original == 0) continue;
-    occurrences.lastModified = static_cast<std::uint32_t>(modified_.size());
-    modified_.push_back(modified[i]);
-    modifiedPlaces_.push_back(i);
+    modified_[count] = modified[i];
+    modifiedPlaces_[count] = i;
+    occurrences.lastModified = count;
+    count += occurrences.original != 0;
   }
+  modified_.resize(count), modifiedPlaces_.resize(count);
 }
 
 /// Leaves in `anchors_` the longest row of tokens that are unique in both lists and ascend in both.

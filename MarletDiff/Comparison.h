@@ -20,7 +20,7 @@ struct Change {
 class Comparison {
  public:
   /// The changes that lead from one list to the other, ascending, with an equal token between any two of
-  /// them. All numbers are less than `numbers`. Takes its work off `budget`; where that ends, a change takes
+  /// them. A number is less than `numbers`, or that itself for a modified token without a partner. Takes its work off `budget`; where that ends, a change takes
   /// in all that isn't compared yet.
   const std::vector<Change>& changes(std::span<const std::uint32_t> original,
                                      std::span<const std::uint32_t> modified, std::size_t numbers,

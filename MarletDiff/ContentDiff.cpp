@@ -80,23 +80,12 @@ class ContentDiff {
   Change trimmed(Change change);
   DiffDescriptor descriptor(const Change& change) const;
 
-  /// One side of a part, cut into tokens.
-  struct Side {
-    TokenStarts starts;
-    std::vector<std::uint32_t> numbers;
-
-    std::u16string_view token(std::u16string_view text, std::size_t index) const {
-      return text.substr(starts[index], starts[index + 1] - starts[index]);
-    }
-  };
-  void cut(Text& text, std::uint32_t start, std::uint32_t end, Level level, Side& side) const;
-  void numberOriginal(Side& side);
-  void numberModified(Side& side, const Side& original);
+  static void cut(Text& text, std::uint32_t start, std::uint32_t end, Level level, Tokens& tokens);
 
   /// Kept from part to part, for each level that is under way.
   struct Workspace {
-    Side original;
-    Side modified;
+    Tokens original;
+    Tokens modified;
     Comparison comparison;
   };
 
@@ -105,8 +94,6 @@ class ContentDiff {
   bool smallerHunks_;
   std::int64_t budget_;
   TokenNumbers numbers_;
-  /// Where in the original each number comes first.
-  std::vector<std::uint32_t> firstPlaces_;
   std::array<Workspace, 3> workspaces_;
   std::vector<Change> changes_;
 };
@@ -122,46 +109,15 @@ Change ContentDiff::withoutEqualLines() const {
   return {offset(prefix), offset(a.size() - suffix), offset(prefix), offset(b.size() - suffix)};
 }
 
-void ContentDiff::cut(Text& text, std::uint32_t start, std::uint32_t end, Level level, Side& side) const {
+void ContentDiff::cut(Text& text, std::uint32_t start, std::uint32_t end, Level level, Tokens& tokens) {
+  tokens.text = text.view;
   switch (level) {
     case Level::lines:
-      return cutLines(text.view, start, end, side.starts);
+      return tokens.cutLines(start, end);
     case Level::words:
-      return cutWords(text.view, text.characters, start, end, side.starts);
+      return tokens.cutWords(text.characters, start, end);
     case Level::characters:
-      return cutCharacters(text.characters, start, end, side.starts);
-  }
-}
-
-void ContentDiff::numberOriginal(Side& side) {
-  side.numbers.clear();
-  firstPlaces_.clear();
-  const auto count = static_cast<std::uint32_t>(side.starts.size()) - 1;
-  std::array<std::uint64_t, 8> prepared;
-  for (std::uint32_t ahead = 0; ahead < count + prepared.size(); ++ahead) {
-    auto& hash = prepared[ahead % prepared.size()];
-    if (ahead >= prepared.size()) {
-      const auto i = ahead - static_cast<std::uint32_t>(prepared.size());
-      side.numbers.push_back(numbers_.number(side.token(original_.view, i), hash));
-      if (side.numbers.back() == firstPlaces_.size()) firstPlaces_.push_back(i);
-    }
-    if (ahead < count) hash = numbers_.prepare(side.token(original_.view, ahead));
-  }
-}
-
-/// Most tokens stand behind the same ones as in the original, so that place is tried before all others.
-void ContentDiff::numberModified(Side& side, const Side& original) {
-  side.numbers.clear();
-  std::size_t expected = 0;
-  for (std::uint32_t i = 0; i + 1 < side.starts.size(); ++i) {
-    const auto token = side.token(modified_.view, i);
-    if (expected < original.numbers.size() && original.token(original_.view, expected) == token) {
-      side.numbers.push_back(original.numbers[expected++]);
-      continue;
-    }
-    const auto number = numbers_.number(token);
-    side.numbers.push_back(number);
-    expected = (number < firstPlaces_.size() ? firstPlaces_[number] : expected) + 1;
+      return tokens.cutCharacters(text.characters, start, end);
   }
 }
 
@@ -170,9 +126,7 @@ void ContentDiff::compare(const Change& part, Level level) {
   auto& [original, modified, comparison] = workspaces_[static_cast<std::size_t>(level)];
   cut(original_, part.original, part.originalEnd, level, original);
   cut(modified_, part.modified, part.modifiedEnd, level, modified);
-  numbers_.reset(original.starts.size() + modified.starts.size());
-  numberOriginal(original);
-  numberModified(modified, original);
+  numbers_.number(original, modified);
   const auto& changes = comparison.changes(original.numbers, modified.numbers, numbers_.size(), budget_);
   for (const auto& change : changes) {
     add({original.starts[change.original], original.starts[change.originalEnd],

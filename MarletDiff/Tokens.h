@@ -8,39 +8,52 @@
 
 namespace MarletDiff {
 
-/// Where the tokens of a stretch of text start, and behind the last one where it ends.
-using TokenStarts = std::vector<std::uint32_t>;
+/// A stretch of a text, cut into tokens.
+struct Tokens {
+  std::u16string_view text;
+  /// Where the tokens start, and behind the last one where it ends.
+  std::vector<std::uint32_t> starts;
+  std::vector<std::uint32_t> numbers;
 
-/// Lines with their ends.
-void cutLines(std::u16string_view text, std::uint32_t start, std::uint32_t end, TokenStarts& tokens);
-/// Words, and every other character by itself.
-void cutWords(std::u16string_view text, Characters& characters, std::uint32_t start, std::uint32_t end,
-              TokenStarts& tokens);
-void cutCharacters(Characters& characters, std::uint32_t start, std::uint32_t end, TokenStarts& tokens);
+  std::uint32_t count() const { return static_cast<std::uint32_t>(starts.size()) - 1; }
+  std::u16string_view operator[](std::size_t index) const {
+    return text.substr(starts[index], starts[index + 1] - starts[index]);
+  }
 
-/// Gives tokens numbers, the same to equal ones, counted from 0 in the order in which they come first. Tokens
-/// are found by a hash and compared for real.
+  /// Cuts into lines with their ends.
+  void cutLines(std::uint32_t start, std::uint32_t end);
+  /// Cuts into words, and every other character by itself.
+  void cutWords(Characters& characters, std::uint32_t start, std::uint32_t end);
+  void cutCharacters(Characters& characters, std::uint32_t start, std::uint32_t end);
+};
+
+/// Gives tokens numbers, the same to equal ones. Tokens are found by a hash and compared for real. An object may
+/// be used again; it keeps its memory.
 class TokenNumbers {
  public:
-  /// Forgets all tokens and makes room for as many.
-  void reset(std::size_t tokens);
-  std::uint32_t number(std::u16string_view token) { return number(token, hash(token)); }
-  /// The same in two steps, for many tokens: between them, the memory for the second is fetched.
-  std::uint64_t prepare(std::u16string_view token) const;
-  std::uint32_t number(std::u16string_view token, std::uint64_t prepared);
-  std::size_t size() const { return known_.size(); }
+  /// Numbers those of the original from 0 on, in the order in which they come first; what of the modified text
+  /// isn't among them is `size()`.
+  void number(Tokens& original, Tokens& modified);
+  std::uint32_t size() const { return static_cast<std::uint32_t>(firstPlaces_.size()); }
 
  private:
-  static std::uint64_t hash(std::u16string_view token);
-
-  std::vector<std::u16string_view> known_;
   /// A hash table with open addressing: numbers plus 1, 0 where free, beside some bits of the hash.
   struct Slot {
     std::uint32_t hashBits;
     std::uint32_t number;
   };
+
+  static std::uint64_t hash(std::u16string_view token);
+  void reset(std::size_t tokens);
+  void numberOriginal(Tokens& original);
+  void numberModified(Tokens& modified, const Tokens& original);
+  /// The slot of a token of that hash, or the free one where it belongs.
+  Slot& slot(std::u16string_view token, std::uint64_t hash, const Tokens& original);
+
   std::vector<Slot> slots_;
   std::size_t mask_ = 0;
+  /// Where in the original each number comes first.
+  std::vector<std::uint32_t> firstPlaces_;
 };
 
 }  // namespace MarletDiff

@@ -109,6 +109,25 @@ TEST_F(DerivedData, DirectoriesOfADocument) {
   EXPECT_EQ(manager.buildDirectoryURLForMarletWithName("Bar", "x").absoluteString(), url("Bar-x/Build"));
 }
 
+TEST_F(DerivedData, WhatStandsInTheWayIsReported) {
+  std::string logged;
+  environment_.systemLog = [&](std::string_view entry) { logged += entry; };
+  HostEnvironment::setCurrent(environment_);
+  const auto container = directory_.path() / "group.CompilerDerivedData";
+  fs::create_directories(container / "DerivedData/DerivedDataInfo.plist/x");
+  fs::create_directory(container / "Library");
+  std::ofstream(container / "Library/Caches") << "in the way";
+  DerivedDataManager();
+  EXPECT_NE(logged.find("Failed to wipe data: "), std::string::npos) << logged;
+  EXPECT_FALSE(fs::exists(info().path()));
+
+  environment_.applicationSupportDirectory = directory_.url("group.CompilerDerivedData/Library/Caches/x");
+  HostEnvironment::setCurrent(environment_);
+  EXPECT_EQ(
+      fatalMessage([] { DerivedDataManager manager; }).find("Unable to get the private derived data URL: "),
+      0u);
+}
+
 TEST_F(DerivedData, WithoutAContainerIsFatal) {
   environment_.groupContainer = [](std::string_view) { return std::nullopt; };
   HostEnvironment::setCurrent(environment_);

@@ -94,6 +94,10 @@ TEST_F(ActivityTracerTest, SpoolStaysBounded) {
   MLFReporting reporting;
   reporting.startConfiguration(
       [](const std::vector<std::string>& results) { EXPECT_FALSE(results.empty()); });
+  std::optional<ErrorObject> failure;
+  const auto flush = [&] { reporting.flushMessages([&](const auto& error) { failure = error; }); };
+  flush();
+  EXPECT_FALSE(failure);
   for (int i = 0; i < 5; ++i) reporting.sendMessage(1, 1, StringObject(std::string(300000, 'x')));
   const auto spool = directory_.path() / "support/TelvaneReporting";
   EXPECT_LE(std::filesystem::file_size(spool / "Messages.jsonl"), 1u << 20);
@@ -101,6 +105,13 @@ TEST_F(ActivityTracerTest, SpoolStaysBounded) {
   EXPECT_EQ(
       lines("TelvaneReporting/Messages.jsonl").size() + lines("TelvaneReporting/Messages.old.jsonl").size(),
       6u);
+  std::filesystem::remove(spool / "Messages.jsonl");
+  std::filesystem::create_directory(spool / "Messages.jsonl");
+  flush();
+  ASSERT_TRUE(failure);
+  EXPECT_EQ(failure->code(), EISDIR);
+  reporting.finishSession();
+  EXPECT_THROW(reporting.sendMessage(1, 1, StringObject("x")), ErrorObject);
 }
 
 TEST_F(ActivityTracerTest, IdentifiersPersistUntilRegenerated) {

@@ -70,6 +70,14 @@ TEST_F(Log, RegisteringReplacesAndNotRegisteringDoesnt) {
   const LogAspect registered("Registered", LogLevel::Normal, LogAspect::Loggers(), true);
   EXPECT_EQ(LogAspect("Registered").activeLevel, LogLevel::Normal);
   EXPECT_TRUE(LogAspect("Registered").loggers);
+
+  auto environment = HostEnvironment::current();
+  environment.userDefault = [](std::string_view) {
+    LogAspect("Meanwhile", LogLevel::Verbose, true);
+    return std::nullopt;
+  };
+  HostEnvironment::setCurrent(environment);
+  EXPECT_EQ(LogAspect("Meanwhile").activeLevel, LogLevel::Verbose) << "registered while the host was asked";
 }
 
 TEST_F(Log, AMessageIsMadeOnlyWhenItsLevelPasses) {

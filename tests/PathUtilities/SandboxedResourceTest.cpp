@@ -4,6 +4,7 @@
 
 #include <filesystem>
 #include <fstream>
+#include <map>
 
 #include "MarletFoundation/Data/PropertyListSerializable.h"
 #include "MarletFoundation/PathUtilities/ExtendedAttributeAccess.h"
@@ -64,6 +65,30 @@ TEST_F(SandboxedResource, GivesAccessAsLongAsItLives) {
   struct stat status;
   ASSERT_EQ(::stat((directory_.path() / "support/MarletFoundation/SandboxSecret").c_str(), &status), 0);
   EXPECT_EQ(status.st_mode & 0777, 0600u);
+}
+
+struct Coder : KeyedCoder {
+  std::map<std::string, URL, std::less<>> urls;
+  std::map<std::string, Data, std::less<>> data;
+  void encodeURL(const URL& url, std::string_view key) override { urls.emplace(key, url); }
+  void encodeData(const Data& bytes, std::string_view key) override { data.emplace(key, bytes); }
+  std::optional<URL> decodeURL(std::string_view key) const override {
+    const auto found = urls.find(key);
+    return found == urls.end() ? std::nullopt : std::optional(found->second);
+  }
+  std::optional<Data> decodeData(std::string_view key) const override {
+    const auto found = data.find(key);
+    return found == data.end() ? std::nullopt : std::optional(found->second);
+  }
+};
+
+TEST_F(SandboxedResource, TravelsThroughACoder) {
+  Coder coder;
+  MLFSandboxedResource(page_).encodeWithCoder(coder);
+  EXPECT_EQ(MLFSandboxedResource(coder).resourceURL, page_);
+  EXPECT_FALSE(MLFSandboxedResource(Coder()).accessingSecurityScopedResource);
+  coder.data.clear();
+  EXPECT_FALSE(MLFSandboxedResource(coder).accessingSecurityScopedResource);
 }
 
 TEST_F(SandboxedResource, OpensInAnotherProcessUnlessForged) {

@@ -58,6 +58,45 @@ TEST(PropertyListObject, ConvertsNumbersByTypeCode) {
   EXPECT_EQ(converted("q", 1e300), "integer(9223372036854775807)");
 }
 
+TEST(PropertyListObject, AreEqualByKindAndContents) {
+  const auto data = [](const char* bytes) { return std::make_shared<DataObject>(Data(std::string(bytes))); };
+  const auto date = [](double seconds) { return std::make_shared<DateObject>(Date{seconds}); };
+  const auto number = [](NumberObject::Value value) { return std::make_shared<NumberObject>("q", value); };
+  // Objects of one row are equal, those of different rows aren't.
+  const std::vector<PropertyListObjects> rows = {
+      {text("1"), text("1")},
+      {data("1"), data("1")},
+      {date(1), date(1)},
+      {number(std::int64_t{1}), number(std::uint64_t{1}), NumberObject::real(1), NumberObject::boolean(true)},
+      {number(std::int64_t{-1})},
+      {number(~std::uint64_t{0})},
+      {number(std::int64_t{1} << 53)},
+      {number((std::int64_t{1} << 53) + 1)},
+      {array({text("1"), date(1)}), array({text("1"), date(1)})},
+      {array({text("1")})},
+      {array({})},
+      {std::make_shared<PlainDictionary>(PropertyListObjects{date(1)}, PropertyListObjects{data("1")}),
+       std::make_shared<MLFSortedDictionary>(PropertyListObjects{date(1)}, PropertyListObjects{data("1")})},
+  };
+  for (const auto& row : rows) {
+    for (const auto& object : row) {
+      for (const auto& others : rows) {
+        for (const auto& other : others) {
+          EXPECT_EQ(object->isEqual(*other), &row == &others) << &row - rows.data() << &others - rows.data();
+          if (&row == &others) {
+            EXPECT_EQ(object->hash(), other->hash());
+          }
+        }
+      }
+    }
+  }
+  const PropertyListObjects ascending = {number(std::int64_t{-1}), NumberObject::real(0.5), date(1), date(2),
+                                         text("a")};
+  const MLFSortedDictionary sorted({text("4"), text("3"), text("2"), text("1"), text("0")},
+                                   PropertyListObjects(ascending.rbegin(), ascending.rend()));
+  EXPECT_EQ(sorted.allKeys(), ascending);
+}
+
 TEST(PropertyListObject, GivesNothingForWhatNoCaseFits) {
   const auto host = std::make_shared<HostObject>();
   EXPECT_FALSE(propertyListValue(nullptr));

@@ -200,6 +200,10 @@ TEST(PropertyListXMLReader, KnowsEncodings) {
       {declared("UTF-16", "a"), failure(unsupportedEncoding, 1, 0)},
       {"\xEF\xBB\xBF" + declared("ISO-8859-1", "a"), failure(invalidEncoding, 1, 0)},
   });
+  // Somewhere here a converter's buffer ends between the two units of the character.
+  for (std::size_t length = 4000; length < 4096; ++length)
+    check({{declared("gb18030", std::string(length, 'a') + "\x94\x39\xFC\x36"),
+            "string(\"" + std::string(length, 'a') + "\xF0\x9F\x98\x80\")"}});
   for (const bool bigEndian : {false, true}) {
     check({
         {utf16(u"\uFEFF<string>\u00E9</string>", bigEndian), accented},

@@ -56,6 +56,9 @@ TEST(URL, JoiningAppendsComponents) {
   EXPECT_EQ(URL::file("/").appendingPathComponent("c").path(), "/c");
   EXPECT_EQ(base.appendingPathExtension("delta").path(), "/a/b.delta");
   EXPECT_EQ(URL::file("/").appendingPathExtension("x").path(), "/");
+  EXPECT_EQ(URL::parse("http://a/b/?c#d")->appendingPathExtension("x y").absoluteString(),
+            "http://a/b.x%20y/?c#d");
+  EXPECT_EQ(URL::parse("http://a/")->appendingPathExtension("x").absoluteString(), "http://a/");
   const auto web = *URL::parse("http://host?q#f");
   EXPECT_EQ(web.appendingPathComponent("a b").absoluteString(), "http://host/a%20b?q#f");
   EXPECT_EQ(web.appendingPathComponent("a/b").deletingLastPathComponent().absoluteString(),

@@ -70,6 +70,8 @@ RC_GTEST_PROP(RangeConverter, AgreesWithTheNaiveWalkInAnyOrder, ()) {
     const auto unit = std::clamp<std::int64_t>(target, 0, static_cast<std::int64_t>(text.size()));
     const auto back = both.indexFromSourceEditorPosition(buffer->positionFromIndex(unit, target));
     RC_ASSERT(back == naive(places, &ConvertedIndex::utf16Index, unit).utf8Index);
+    const OffsetRange range{std::min(back, expected.utf8Index), std::max(back, expected.utf8Index)};
+    RC_ASSERT(both.rangeFromSourceEditorRange(both.sourceEditorRangeFromRange(range)) == range);
   }
 }
 

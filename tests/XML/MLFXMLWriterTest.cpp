@@ -71,6 +71,11 @@ TEST(MLFXMLWriter, RefusesWhatXMLCannotCarryAndASecondRoot) {
     EXPECT_THROW(withElement([&](auto& e) { e.addChildElementWithName(name); }), ErrorObject) << name;
     EXPECT_THROW(withElement([&](auto& e) { e.addChildElementWithName("b", {{name, ""}}); }), ErrorObject);
   }
+  try {
+    withElement([](auto& e) { e.addText("a\x01"); });
+  } catch (const ErrorObject& error) {
+    EXPECT_EQ(error.localizedDescription(), "XML has no form for \"a\\u{01}\".");
+  }
   for (const char* comment : {"a--b", "a-"})
     EXPECT_THROW(withElement([&](auto& e) { e.addComment(comment); }), ErrorObject) << comment;
   EXPECT_EQ(fatalMessage([] {

@@ -29,30 +29,30 @@ std::string functionName(const CommandRow& command) {
 }
 
 /// ":what is asked for:what completes it".
-std::string operandSpecification(const OptionRow& row) {
-  auto specification = ":" + escaped(row.operand, ":\\") + ":";
+std::string operandForm(const OptionRow& row) {
+  auto form = ":" + escaped(row.operand, ":\\") + ":";
   switch (row.kind) {
     case OperandKind::none:
     case OperandKind::text:
-      return specification;
+      return form;
     case OperandKind::file:
-      return specification + "_files";
+      return form + "_files";
     case OperandKind::directory:
-      return specification + "_files -/";
+      return form + "_files -/";
     case OperandKind::choice:
-      return specification + "(" + joined(row.choices, " ") + ")";
+      return form + "(" + joined(row.choices, " ") + ")";
   }
-  return specification;
+  return form;
 }
 
 void printOption(const OptionRow& option, std::ostream& out) {
   const auto exclusion = option.isRepeatable ? std::string("*") : "(" + joined(option.flags, " ") + ")";
   for (const auto& flag : option.flags) {
-    auto specification = exclusion + flag;
-    if (!option.operand.empty()) specification += flag.starts_with("--") ? "=" : "+";
-    specification += "[" + escaped(option.help, "[]\\") + "]";
-    if (!option.operand.empty()) specification += operandSpecification(option);
-    out << " \\\n    " << inQuotes(specification);
+    auto form = exclusion + flag;
+    if (!option.operand.empty()) form += flag.starts_with("--") ? "=" : "+";
+    form += "[" + escaped(option.help, "[]\\") + "]";
+    if (!option.operand.empty()) form += operandForm(option);
+    out << " \\\n    " << inQuotes(form);
   }
 }
 
@@ -81,7 +81,7 @@ void printFunction(const CommandRow& command, const std::vector<CommandRow>& tab
   } else {
     for (std::size_t i = 0; i < command.operands.size(); ++i) {
       const auto place = command.operands[i].isRepeatable ? "*" : std::to_string(i + 1);
-      out << " \\\n    " << inQuotes(place + operandSpecification(command.operands[i]));
+      out << " \\\n    " << inQuotes(place + operandForm(command.operands[i]));
     }
     out << "\n";
   }
