@@ -65,12 +65,12 @@ int Destination::makeDirectory(const std::string& path, mode_t mode) {
 
 int Destination::makeFile(const std::string& path, mode_t mode, Naming naming, File& file) {
   if (const int error = openParent(path, file.name_, true)) return error;
-  const auto& name = naming == Naming::atOnce ? file.name_ : passingName_;
+  auto name = naming == Naming::atOnce ? file.name_ : passingName_;
   const int flags = O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC;
   file.descriptor_ = Descriptor(retrying([&] { return ::openat(parent_.get(), name.c_str(), flags, mode); }));
   if (!file.descriptor_) return errno;
   file.directory_ = parent_.get();
-  file.currentName_ = name;
+  file.currentName_ = std::move(name);  // nothing can fail between the making and this
   return 0;
 }
 

@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include <fstream>
+
 #include "DiffPack/Packs.h"
 #include "MarletDiff/ContentDiff.h"
 #include "MarletDiff/ContentMerge.h"
@@ -7,6 +9,7 @@
 #include "MarletFoundation/MarletFoundation.h"
 #include "support/Documents.h"
 #include "support/FailingAllocation.h"
+#include "support/Zip.h"
 
 namespace MarletFoundation::test {
 namespace {
@@ -103,6 +106,17 @@ TEST(WithoutMemory, DocumentsOnDisk) {
     return contents(MarletBookSnapshot(FileWrapper(copy), url));
   };
   expectNothingWrongWithoutMemory("writing", write, 10);
+  std::ofstream(directory.path() / "a.zip")
+      << zip({{.name = "Top/a", .contents = "a"}, zeros("large", 300'000)});
+  int count = 0;
+  const auto unarchive = [&] {
+    const auto out = directory.url("out" + std::to_string(++count));
+    const auto first = Archive::unarchiveFile(directory.url("a.zip"), out);
+    return first + std::to_string(std::filesystem::file_size(out.path() + "/large"));
+  };
+  expectNothingWrongWithoutMemory("an archive", unarchive, 50);
+  for (const auto& item : std::filesystem::recursive_directory_iterator(directory.path()))
+    EXPECT_FALSE(item.path().filename().string().starts_with(".arc-copier"));
 }
 
 }  // namespace MarletFoundation::test
