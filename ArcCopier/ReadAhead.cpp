@@ -1,6 +1,5 @@
 #include "ArcCopier/ReadAhead.h"
 
-#include <cerrno>
 #include <new>
 #include <utility>
 
@@ -17,7 +16,7 @@ constexpr std::size_t BatchChunks = 32;
 }  // namespace
 
 ReadAhead::ReadAhead(int file, std::vector<const ZipEntry*> entries)
-    : reader_(file), entries_(std::move(entries)), thread_([this] { readAll(); }) {}
+    : reader_(file), entries_(std::move(entries)), thread_([this] { run(); }) {}
 
 ReadAhead::~ReadAhead() {
   {
@@ -35,6 +34,7 @@ ReadAhead::Chunk ReadAhead::next(const ZipEntry* entry) {
     while (taken_.empty()) {
       std::unique_lock lock(mutex_);
       filled_.wait(lock, [&] { return isAtEnd_ || queued_ >= BatchBytes || queue_.size() >= BatchChunks; });
+      if (isOutOfMemory_ && queue_.empty()) throw std::bad_alloc();
       taken_.swap(queue_);
       queued_ = 0;
       emptied_.notify_one();
@@ -45,21 +45,25 @@ ReadAhead::Chunk ReadAhead::next(const ZipEntry* entry) {
   }
 }
 
-void ReadAhead::readAll() {
-  for (const auto* entry : entries_) {
-    Problem problem;
-    try {
-      problem = readEntry(entry);
-    } catch (const std::bad_alloc&) {
-      problem = {ENOMEM, "there is not enough memory to read it"};
-    }
-    if (problem) add({entry, {}, true, problem});
-    const std::lock_guard lock(mutex_);
-    if (isStopped_) return;
+void ReadAhead::run() {
+  bool isOutOfMemory = false;
+  try {
+    readAll();
+  } catch (const std::bad_alloc&) {
+    isOutOfMemory = true;
   }
   const std::lock_guard lock(mutex_);
   isAtEnd_ = true;
+  isOutOfMemory_ = isOutOfMemory;
   filled_.notify_one();
+}
+
+void ReadAhead::readAll() {
+  for (const auto* entry : entries_) {
+    if (const auto problem = readEntry(entry)) add({entry, {}, true, problem});
+    const std::lock_guard lock(mutex_);
+    if (isStopped_) return;
+  }
 }
 
 Problem ReadAhead::readEntry(const ZipEntry* entry) {

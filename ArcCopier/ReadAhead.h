@@ -32,10 +32,12 @@ class ReadAhead {
   ReadAhead(const ReadAhead&) = delete;
   ReadAhead& operator=(const ReadAhead&) = delete;
 
-  /// The next chunk of an entry. What is left of the ones before it is dropped.
+  /// The next chunk of an entry. What is left of the ones before it is dropped. Throws `std::bad_alloc` when there
+  /// was no memory to read it.
   Chunk next(const ZipEntry* entry);
 
  private:
+  void run();
   void readAll();
   Problem readEntry(const ZipEntry* entry);
   bool isWanted(const ZipEntry* entry) const { return entry >= wanted_.load(std::memory_order_relaxed); }
@@ -51,6 +53,7 @@ class ReadAhead {
   std::deque<Chunk> queue_;
   std::size_t queued_ = 0;  // bytes
   bool isAtEnd_ = false;
+  bool isOutOfMemory_ = false;
   bool isStopped_ = false;
   std::thread thread_;
 };
