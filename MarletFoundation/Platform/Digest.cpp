@@ -2,6 +2,8 @@
 
 #include <openssl/evp.h>
 
+#include <new>
+
 #include "MarletFoundation/Platform/Data.h"
 #include "MarletFoundation/Platform/ErrorObject.h"
 #include "MarletFoundation/Platform/FatalError.h"
@@ -16,6 +18,7 @@ constexpr std::size_t SHA1SliceSize = 16384;
 class RunningDigest {
  public:
   explicit RunningDigest(const EVP_MD* kind) : context_(EVP_MD_CTX_new()) {
+    if (!context_) throw std::bad_alloc();
     if (EVP_DigestInit_ex(context_, kind, nullptr) != 1) fatalError("A digest is not available");
   }
   ~RunningDigest() { EVP_MD_CTX_free(context_); }
