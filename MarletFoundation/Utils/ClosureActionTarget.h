@@ -17,7 +17,7 @@ class ClosureActionTarget {
   using Selector = void (ClosureActionTarget::*)(const Sender&) const;
 
   /// `performAction`, as controls take it beside the target.
-  static constexpr auto actionSelector() { return &ClosureActionTarget::performAction; }
+  static const Selector actionSelector;
 
   std::function<void(const Sender&)> action;
 
@@ -27,5 +27,8 @@ class ClosureActionTarget {
 
   void performAction(const Sender& sender) const { action(sender); }
 };
+
+inline constexpr ClosureActionTarget::Selector ClosureActionTarget::actionSelector =
+    &ClosureActionTarget::performAction;
 
 }  // namespace MarletFoundation
