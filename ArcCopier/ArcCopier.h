@@ -68,6 +68,7 @@ typedef struct {
 
 /// What one archive may make of itself. Reaching a limit is no error, passing it is.
 typedef struct {
+  /// With the directories that none of them names, but that their paths need.
   uint64_t entries;
   /// Bytes of all extracted files together.
   uint64_t totalBytes;

@@ -32,7 +32,7 @@ bool isDestinationsEnd(int error) {
 
 Copy::Copy(ArcCopier& copier, int archive) : copier_(copier), directory_(archive, copier.limits.entries) {
   directory_.checkLocalHeaders();
-  items_ = plan(directory_);
+  items_ = plan(directory_, copier.limits.entries);
   std::vector<const ZipEntry*> readable;
   for (const auto& item : items_) {
     if (!item.path.problem && !item.path.isDirectory) readable.push_back(item.entry);
@@ -113,6 +113,9 @@ void Copy::failedToWrite(const PlannedItem& item, int error) {
     return stopUnlessContinued(
         copier_.call(copier_.fileConflict, path, error, "something else is there already"));
   }
+  // Which of the two the system tells depends on what is asked of it.
+  if (error == ENOTDIR || error == ELOOP)
+    return failed(item, {error, "a file or a link is there already where it needs a directory"});
   if (!isDestinationsEnd(error)) return failed(item, {error, std::strerror(error)});
   copier_.call(copier_.fatalFileError, path, error, std::strerror(error));
   throw CopyEnd{ArcCopierBadDestination, error};

@@ -87,17 +87,23 @@ int Destination::openParent(const std::string& path, std::string& name, bool mak
 }
 
 int Destination::openDirectory(const std::string& path, bool makingIt, Descriptor& directory) {
-  directory = Descriptor(openBeneath(root_.get(), path.c_str()));
-  if (directory) return 0;
-  const bool isMissing = errno == ENOENT && makingIt;
-  const bool isUnsupported = errno == ENOSYS || errno == EPERM;
-  if (!isMissing && !isUnsupported) return errno;
-  directory = Descriptor(openName(root_.get(), "."));
-  for (const auto component : MarletFoundation::split(path, '/')) {
-    const std::string name(component);
+  // Up to what is there already, and down again name by name.
+  auto there = path;
+  while (!(directory = Descriptor(openBeneath(root_.get(), there.empty() ? "." : there.c_str())))) {
+    if (errno == ENOSYS || errno == EPERM) {  // unsupported
+      there.clear();
+      directory = Descriptor(openName(root_.get(), "."));
+      break;
+    }
+    if (errno != ENOENT || !makingIt || there.empty()) return errno;
+    const auto slash = there.rfind('/');
+    there.resize(slash == std::string::npos ? 0 : slash);
+  }
+  for (const auto component : MarletFoundation::split(std::string_view(path).substr(there.size()), '/')) {
     if (!directory) return errno;
-    if (makingIt && name != "." && ::mkdirat(directory.get(), name.c_str(), 0777) != 0 && errno != EEXIST)
-      return errno;
+    if (component.empty() || component == ".") continue;
+    const std::string name(component);
+    if (makingIt && ::mkdirat(directory.get(), name.c_str(), 0777) != 0 && errno != EEXIST) return errno;
     directory = Descriptor(openName(directory.get(), name));
   }
   return directory ? 0 : errno;

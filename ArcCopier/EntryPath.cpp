@@ -38,6 +38,12 @@ std::string decoded(std::string_view name, bool isMarkedUTF8, Problem& problem) 
   return MarletFoundation::utf8FromUTF16Lossy(text);
 }
 
+std::string withoutNULs(std::string_view text) {
+  std::string shown;
+  for (const char c : text) c == '\0' ? shown += "\uFFFD" : shown += c;
+  return shown;
+}
+
 bool isDrive(std::string_view name) {
   return name.size() >= 2 && name[1] == ':' && ((name[0] | 0x20) >= 'a' && (name[0] | 0x20) <= 'z');
 }
@@ -58,7 +64,7 @@ EntryPath entryPath(std::string_view name, bool isMarkedUTF8) {
   path.shown = decoded(name, isMarkedUTF8, path.problem);
   path.isDirectory = name.ends_with('/') || name.ends_with("/.") || name == ".";
   if (!path.problem) path.problem = problemOfName(path.shown);
-  for (std::size_t i; (i = path.shown.find('\0')) != std::string::npos;) path.shown.replace(i, 1, "\uFFFD");
+  path.shown = withoutNULs(path.shown);
   while (path.shown.size() > 1 && path.shown.ends_with('/')) path.shown.pop_back();
   if (path.problem) return path;
 

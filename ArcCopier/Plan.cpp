@@ -17,10 +17,12 @@ constexpr std::uint16_t UTF8Flag = 1u << 11;
 class Places {
  public:
   Problem take(std::string_view path, bool isDirectory) {
-    for (auto slash = path.find('/'); slash != std::string_view::npos; slash = path.find('/', slash + 1)) {
-      const auto [place, isNew] = kinds_.try_emplace(path.substr(0, slash), Kind::neededDirectory);
-      if (place->second == Kind::file) return {ENOTDIR, "it lies below what is a file"};
-    }
+    const auto known = nearestKnown(path);
+    if (known != kinds_.end() && known->second == Kind::file)
+      return {ENOTDIR, "it lies below what is a file"};
+    auto slash = path.find('/', known == kinds_.end() ? 0 : known->first.size() + 1);
+    for (; slash != std::string_view::npos; slash = path.find('/', slash + 1))
+      kinds_.emplace(path.substr(0, slash), Kind::neededDirectory);
     const auto kind = isDirectory ? Kind::directory : Kind::file;
     const auto [place, isNew] = kinds_.try_emplace(path, kind);
     if (isNew) return {};
@@ -32,9 +34,23 @@ class Places {
     return {EEXIST, "its name was there before"};
   }
 
+  std::size_t count() const { return kinds_.size(); }
+
  private:
   enum class Kind { file, directory, neededDirectory };
-  std::unordered_map<std::string_view, Kind> kinds_;
+  using Kinds = std::unordered_map<std::string_view, Kind>;
+
+  /// The nearest place above a path that somebody has.
+  Kinds::iterator nearestKnown(std::string_view path) {
+    while (true) {
+      const auto slash = path.rfind('/');
+      if (slash == std::string_view::npos) return kinds_.end();
+      path = path.substr(0, slash);
+      if (const auto known = kinds_.find(path); known != kinds_.end()) return known;
+    }
+  }
+
+  Kinds kinds_;
 };
 
 Problem problemOfType(const ZipEntry& entry, bool isDirectory) {
@@ -54,7 +70,7 @@ Problem problemOfType(const ZipEntry& entry, bool isDirectory) {
 
 }  // namespace
 
-std::vector<PlannedItem> plan(const ZipDirectory& directory) {
+std::vector<PlannedItem> plan(const ZipDirectory& directory, std::uint64_t entryLimit) {
   std::vector<PlannedItem> items;
   items.reserve(directory.entries().size());  // the places refer to the paths
   Places places;
@@ -65,6 +81,7 @@ std::vector<PlannedItem> plan(const ZipDirectory& directory) {
     if (!path.problem) path.problem = problemOfType(entry, path.isDirectory);
     if (!path.problem) path.problem = EntryReader::problem(entry);
     if (!path.problem) path.problem = places.take(path.normalized, path.isDirectory);
+    if (places.count() > entryLimit) throw Refusal{EFBIG, "it has too many entries", true};
   }
   return items;
 }

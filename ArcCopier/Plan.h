@@ -14,7 +14,8 @@ struct PlannedItem {
   EntryPath path;
 };
 
-/// The entries in the directory's order. Of several for one place the first one has it.
-std::vector<PlannedItem> plan(const ZipDirectory& directory);
+/// The entries in the directory's order. Of several for one place the first one has it. Throws a `Refusal` when
+/// the entries, and the directories that their paths need besides, are more than allowed.
+std::vector<PlannedItem> plan(const ZipDirectory& directory, std::uint64_t entryLimit);
 
 }  // namespace ArcCopierImplementation

@@ -9,6 +9,7 @@ namespace ArcCopierImplementation {
 /// Reads a file here and there; what lies close together is read in one call.
 class Window {
  public:
+  /// `size` bytes are read at a time. One that is asked for more keeps that size from then on.
   Window(int file, std::size_t size) : file_(file), size_(size), buffer_(new char[size]) {}
 
   /// The bytes from an offset on: `least`, which may be more than the window's size, or more as they are at

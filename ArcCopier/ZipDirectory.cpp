@@ -70,13 +70,14 @@ struct ZipDirectory::End {
   std::uint64_t directorySize, directoryOffset;
 };
 
-ZipDirectory::ZipDirectory(int file, std::uint64_t entryLimit) : window_(file, WindowSize) {
+ZipDirectory::ZipDirectory(int file, std::uint64_t entryLimit)
+    : window_(file, WindowSize), directory_(file, 0) {
   struct stat status;
   if (::fstat(file, &status) != 0) refuse("it can't be read", errno);
   if (!S_ISREG(status.st_mode)) refuse("it is no regular file", S_ISDIR(status.st_mode) ? EISDIR : EINVAL);
   archiveSize_ = static_cast<std::uint64_t>(status.st_size);
 
-  const auto end = zip64End(findEnd());
+  const auto end = zip64End(findEnd(file));
   if (end.disk != 0 || end.directoryDisk != 0 || end.entriesHere != end.entries)
     refuse("it is one of several volumes");
   if (end.directoryOffset > end.position || end.directorySize != end.position - end.directoryOffset)
@@ -86,15 +87,15 @@ ZipDirectory::ZipDirectory(int file, std::uint64_t entryLimit) : window_(file, W
   if (end.entries > end.directorySize / DirectoryEntrySize)
     refuse("its directory has fewer entries than it says");
   directoryOffset_ = end.directoryOffset;
-  bytes_ = readAt(window_, directoryOffset_, static_cast<std::size_t>(end.directorySize));
-  readEntries(end.entries);
+  readEntries(readAt(directory_, directoryOffset_, static_cast<std::size_t>(end.directorySize)), end.entries);
 }
 
 /// The end record is the one whose comment reaches to the end of the file.
-ZipDirectory::End ZipDirectory::findEnd() {
+ZipDirectory::End ZipDirectory::findEnd(int file) {
   const auto size = static_cast<std::size_t>(std::min<std::uint64_t>(archiveSize_, EndSize + 0xFFFF));
   if (size < EndSize) refuse("it is no zip archive, or cut off");
-  const auto tail = readAt(window_, archiveSize_ - size, size);
+  Window window(file, size);
+  const auto tail = readAt(window, archiveSize_ - size, size);
   std::optional<std::size_t> found;
   for (std::size_t i = size - EndSize + 1; i-- > 0;) {
     if (tail[i] != 'P' || number32(tail, i) != EndSignature) continue;
@@ -139,9 +140,8 @@ ZipDirectory::End ZipDirectory::zip64End(const End& end) {
   return large;
 }
 
-void ZipDirectory::readEntries(std::uint64_t count) {
+void ZipDirectory::readEntries(std::string_view rest, std::uint64_t count) {
   entries_.reserve(static_cast<std::size_t>(count));
-  std::string_view rest = bytes_;
   for (std::uint64_t i = 0; i < count; ++i) {
     if (rest.size() < DirectoryEntrySize || number32(rest, 0) != DirectoryEntrySignature)
       refuse("its directory is damaged");
@@ -166,17 +166,17 @@ void ZipDirectory::readEntries(std::uint64_t count) {
 }
 
 void ZipDirectory::checkLocalHeaders() {
-  for (auto& entry : entries_) entry.dataOffset = checkedDataOffset(entry);
-
-  std::vector<const ZipEntry*> byOffset;
+  // As they lie, so that the archive is walked once, in whatever order its directory has them.
+  std::vector<ZipEntry*> byOffset;
   byOffset.reserve(entries_.size());
-  for (const auto& entry : entries_) byOffset.push_back(&entry);
+  for (auto& entry : entries_) byOffset.push_back(&entry);
   const auto earlier = [](const ZipEntry* a, const ZipEntry* b) { return a->headerOffset < b->headerOffset; };
   if (!std::is_sorted(byOffset.begin(), byOffset.end(), earlier))
     std::sort(byOffset.begin(), byOffset.end(), earlier);
   std::uint64_t end = 0;
-  for (const auto* entry : byOffset) {
+  for (auto* entry : byOffset) {
     if (entry->headerOffset < end) refuse("its entries overlap");
+    entry->dataOffset = checkedDataOffset(*entry);
     const auto descriptor = entry->hasDataDescriptor() ? SmallestDescriptor : 0;
     const auto space = directoryOffset_ - entry->dataOffset;
     if (entry->compressedSize > space || descriptor > space - entry->compressedSize)

@@ -1,7 +1,6 @@
 #pragma once
 
 #include <cstdint>
-#include <string>
 #include <string_view>
 #include <vector>
 
@@ -57,15 +56,15 @@ class ZipDirectory {
 
  private:
   struct End;
-  End findEnd();
+  End findEnd(int file);
   End zip64End(const End& end);
-  void readEntries(std::uint64_t count);
+  void readEntries(std::string_view rest, std::uint64_t count);
   std::uint64_t checkedDataOffset(const ZipEntry& entry);
 
   Window window_;
+  Window directory_;  // holds the whole of it
   std::uint64_t archiveSize_;
   std::uint64_t directoryOffset_;
-  std::string bytes_;
   std::vector<ZipEntry> entries_;
 };
 

@@ -5,6 +5,7 @@
 #include <cerrno>
 #include <cstring>
 
+#include "MarletFoundation/Platform/Descriptor.h"
 #include "MarletFoundation/Platform/ErrorObject.h"
 #include "MarletFoundation/Platform/SecurityScope.h"
 
@@ -16,10 +17,11 @@ constexpr std::string_view tokenKey = "sandboxExtensionToken";
 constexpr int unknownKindCode = 0;
 constexpr int symbolicLinkCode = 1;
 
-void refuseSymbolicLink(const std::string& path) {
+void refuseSymbolicLink(const URL& url) {
+  const auto path = fileSystemPath(url);
   struct stat status;
-  if (::lstat(path.c_str(), &status) != 0) {
-    const auto underlying = ErrorObject::posix(errno, path);
+  if (!path || ::lstat(path->c_str(), &status) != 0) {
+    const auto underlying = ErrorObject::posix(path ? errno : EINVAL, url.path());
     throw ErrorObject::withMessage(MarletFoundationErrorDomain, unknownKindCode,
                                    "Unable to determine if file is a symlink", underlying.copy());
   }
@@ -34,8 +36,8 @@ void refuseSymbolicLink(const std::string& path) {
 
 std::string issuedToken(const URL& url) {
   if (auto token = SecurityScope::copySecurityScope(url)) return *token;
+  refuseSymbolicLink(url);
   const auto path = url.path();
-  refuseSymbolicLink(path);
   if (auto token = SecurityScope::issueSandboxExtension(path)) return *token;
   const int code = errno;
   throw ErrorObject::withMessage(

@@ -81,10 +81,16 @@ int writeAll(int descriptor, std::string_view bytes) {
   return 0;
 }
 
-std::string systemPath(const URL& url) {
+std::optional<std::string> fileSystemPath(const URL& url) {
   auto path = url.path();
-  if (!url.isFileURL() || path.empty() || path.find('\0') != std::string::npos) throwPosix(EINVAL, path);
+  if (!url.isFileURL() || path.empty() || path.find('\0') != std::string::npos) return std::nullopt;
   return path;
+}
+
+std::string systemPath(const URL& url) {
+  auto path = fileSystemPath(url);
+  if (!path) throwPosix(EINVAL, url.path());
+  return *std::move(path);
 }
 
 void throwPosix(int errorNumber, std::string_view path) { throw ErrorObject::posix(errorNumber, path); }
@@ -93,6 +99,11 @@ void throwPosix(int errorNumber, std::string_view path, std::string_view sentenc
   throw ErrorObject(std::string(PosixErrorDomain), errorNumber,
                     {{std::string(LocalizedDescriptionKey), std::string(sentence)},
                      {std::string(FilePathKey), std::string(path)}});
+}
+
+void throwNoRegularFile(const struct stat& status, std::string_view path) {
+  if (S_ISDIR(status.st_mode)) throwPosix(EISDIR, path);
+  throwPosix(EINVAL, path, "It is no regular file");
 }
 
 }  // namespace MarletFoundation

@@ -74,11 +74,15 @@ FileContents readToEnd(int descriptor, std::optional<off_t> expectedSize);
 /// Writes all bytes.
 int writeAll(int descriptor, std::string_view bytes);
 
-/// The path of a file URL for the system. Throws EINVAL when the URL is no file's or the path holds a NUL.
+/// The path of a file URL for the system. Nothing when the URL is no file's or the path holds a NUL.
+std::optional<std::string> fileSystemPath(const URL& url);
+/// The same, but throws EINVAL.
 std::string systemPath(const URL& url);
 
 [[noreturn]] void throwPosix(int errorNumber, std::string_view path);
 /// With a sentence of ours in place of the system's words, which say too little.
 [[noreturn]] void throwPosix(int errorNumber, std::string_view path, std::string_view sentence);
+/// EISDIR for a directory, EINVAL for anything else.
+[[noreturn]] void throwNoRegularFile(const struct stat& status, std::string_view path);
 
 }  // namespace MarletFoundation

@@ -3,6 +3,8 @@
 #include <linux/limits.h>
 #include <sys/xattr.h>
 
+#include "MarletFoundation/Platform/Descriptor.h"
+
 namespace MarletFoundation::ExtendedAttributes {
 
 std::optional<std::string> attributeNameWithFlags(std::string_view name, MLFExtendedAttributeFlags flags) {
@@ -19,26 +21,28 @@ std::optional<std::string> attributeNameWithFlags(std::string_view name, MLFExte
 }
 
 std::optional<std::string> value(const URL& url, const std::string& attributeName) {
-  const auto path = url.path();
-  const auto size = ::getxattr(path.c_str(), attributeName.c_str(), nullptr, 0);
+  const auto path = fileSystemPath(url);
+  const auto size = path ? ::getxattr(path->c_str(), attributeName.c_str(), nullptr, 0) : -1;
   if (size < 0) return std::nullopt;
   std::string bytes(static_cast<std::size_t>(size), '\0');
   // A size of 0 would ask for the size once more.
-  if (size > 0 && ::getxattr(path.c_str(), attributeName.c_str(), bytes.data(), bytes.size()) != size)
+  if (size > 0 && ::getxattr(path->c_str(), attributeName.c_str(), bytes.data(), bytes.size()) != size)
     return std::nullopt;
   return bytes;
 }
 
 bool exists(const URL& url, const std::string& attributeName) {
-  return ::getxattr(url.path().c_str(), attributeName.c_str(), nullptr, 0) >= 0;
+  const auto path = fileSystemPath(url);
+  return path && ::getxattr(path->c_str(), attributeName.c_str(), nullptr, 0) >= 0;
 }
 
 bool setValue(const URL& url, const std::string& attributeName, std::string_view value) {
-  return ::setxattr(url.path().c_str(), attributeName.c_str(), value.data(), value.size(), 0) == 0;
+  const auto path = fileSystemPath(url);
+  return path && ::setxattr(path->c_str(), attributeName.c_str(), value.data(), value.size(), 0) == 0;
 }
 
 void remove(const URL& url, const std::string& attributeName) {
-  ::removexattr(url.path().c_str(), attributeName.c_str());
+  if (const auto path = fileSystemPath(url)) ::removexattr(path->c_str(), attributeName.c_str());
 }
 
 }  // namespace MarletFoundation::ExtendedAttributes

@@ -21,7 +21,7 @@ constexpr MLFExtendedAttributeFlags operator|(MLFExtendedAttributeFlags a, MLFEx
 }
 
 /// Extended attributes of files, links followed, under names of the user's own space. A file system without any
-/// answers as if there were none.
+/// answers as if there were none, and so does a URL that is no file's.
 namespace ExtendedAttributes {
 
 /// The name that the system's calls take: "user.", the name and, unless there are none, "#" and a letter for

@@ -41,10 +41,9 @@ Relationship relationship(const URL& directory, const URL& item) {
 }
 
 bool fileExists(const URL& url) {
-  const auto path = url.path();
+  const auto path = fileSystemPath(url);
   struct stat status;
-  return url.isFileURL() && !path.empty() && path.find('\0') == std::string::npos &&
-         retrying([&] { return ::stat(path.c_str(), &status); }) == 0;
+  return path && retrying([&] { return ::stat(path->c_str(), &status); }) == 0;
 }
 
 bool isDirectory(const URL& url) { return S_ISDIR(statusOf(systemPath(url)).st_mode); }
@@ -71,7 +70,7 @@ std::vector<std::string> contentsOfDirectory(const URL& url, bool skipHidden) {
 Data readFile(const URL& url) {
   const auto path = systemPath(url);
   const auto status = statusOf(path);
-  if (!S_ISREG(status.st_mode)) throwPosix(S_ISDIR(status.st_mode) ? EISDIR : EINVAL, path);
+  if (!S_ISREG(status.st_mode)) throwNoRegularFile(status, path);
   const Descriptor file(retrying([&] { return ::open(path.c_str(), ReadingFlags); }));
   if (!file) throwPosix(errno, path);
   auto contents = readToEnd(file.get(), status.st_size);

@@ -39,7 +39,8 @@ MARLET_EXPORT void writeFileAtomically(const URL& url, const Data& contents);
 
 /// The bytes of a regular file, mapped instead of read in: for one pass over a file of any size. They are the
 /// file's and not a copy: what another process writes shows, and a process that looks at bytes which the file
-/// has lost in between is stopped (SIGBUS). Refuses what `readFile` refuses, but for size.
+/// has lost in between is stopped (SIGBUS). Refuses what `readFile` refuses, but for size. What the system makes up
+/// as it is read, as in /proc, can't be mapped and is read.
 MARLET_EXPORT Data mapFile(const URL& url);
 
 /// Takes a file or whole directory, of any size, from its place at once, and removes it later on the

@@ -94,10 +94,10 @@ Library treeOfDictionary(const DictionaryObject& dictionary, int depth) {
 }
 
 Library treeOf(const PropertyListObject& object, int depth) {
-  if (depth > DepthLimit) fail("Arrays and dictionaries lie deeper in each other than 512.");
   if (dynamic_cast<const NullObject*>(&object)) return nullptr;
   if (const auto* string = dynamic_cast<const StringObject*>(&object)) return string->value;
   if (const auto* number = dynamic_cast<const NumberObject*>(&object)) return treeOfNumber(*number);
+  if (depth == DepthLimit) fail("Arrays and dictionaries lie deeper in each other than 512.");
   if (const auto* dictionary = dynamic_cast<const DictionaryObject*>(&object))
     return treeOfDictionary(*dictionary, depth);
   const auto* array = dynamic_cast<const ArrayObject*>(&object);

@@ -13,6 +13,8 @@
 #include <mutex>
 
 #include "MarletFoundation/Platform/Descriptor.h"
+#include "MarletFoundation/Platform/Digest.h"
+#include "MarletFoundation/Platform/FatalError.h"
 #include "MarletFoundation/Platform/Host.h"
 #include "MarletFoundation/Platform/HostEnvironment.h"
 
@@ -67,14 +69,10 @@ std::optional<Secret> userSecret() {
 std::string signatureOf(std::string_view text, const Secret& secret) {
   std::array<unsigned char, EVP_MAX_MD_SIZE> digest;
   unsigned size = 0;
-  ::HMAC(::EVP_sha256(), secret.data(), static_cast<int>(secret.size()),
-         reinterpret_cast<const unsigned char*>(text.data()), text.size(), digest.data(), &size);
-  std::string digits;
-  for (unsigned i = 0; i < size; ++i) {
-    digits += "0123456789abcdef"[digest[i] >> 4];
-    digits += "0123456789abcdef"[digest[i] & 15];
-  }
-  return digits;
+  if (!::HMAC(::EVP_sha256(), secret.data(), static_cast<int>(secret.size()),
+              reinterpret_cast<const unsigned char*>(text.data()), text.size(), digest.data(), &size))
+    fatalError("A digest is not available");
+  return hexadecimal({digest.data(), size});
 }
 
 std::string tokenFor(const std::string& path, const Secret& secret) {
@@ -122,10 +120,10 @@ URL attachSecurityScope(const URL& url, std::string token) {
 
 bool startAccessingSecurityScopedResource(const URL& url) {
   const auto token = url.securityScope();
-  const auto path = url.path();
-  if (!token || !url.isFileURL() || !isGood(*token, path)) return false;
+  const auto path = fileSystemPath(url);
+  if (!token || !path || !isGood(*token, *path)) return false;
   const std::lock_guard lock(accesses().mutex);
-  ++accesses().counts[path];
+  ++accesses().counts[*path];
   return true;
 }
 

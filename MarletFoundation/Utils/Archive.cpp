@@ -1,16 +1,16 @@
 #include "MarletFoundation/Utils/Archive.h"
 
+#include "MarletFoundation/Platform/Descriptor.h"
 #include "MarletFoundation/Platform/Progress.h"
 #include "MarletFoundation/Utils/MLFUnzipCopier.h"
 
 namespace MarletFoundation {
 namespace {
 
-std::string fileSystemPath(const URL& url) {
-  auto path = url.path();
-  if (!url.isFileURL() || path.empty() || path.find('\0') != std::string::npos)
-    throw UnarchiveError(UnarchiveErrorCase::InvalidURL, url.absoluteString());
-  return path;
+std::string validPath(const URL& url) {
+  auto path = fileSystemPath(url);
+  if (!path) throw UnarchiveError(UnarchiveErrorCase::InvalidURL, url.absoluteString());
+  return *std::move(path);
 }
 
 }  // namespace
@@ -23,8 +23,8 @@ const ErrorTable& errorTable(UnarchiveErrorCase) {
 
 std::string Archive::unarchiveFile(const URL& fromURL, const URL& intoURL) {
   const auto progress = Progress::make(100);
-  const auto source = fileSystemPath(fromURL);
-  const auto destination = fileSystemPath(intoURL);
+  const auto source = validPath(fromURL);
+  const auto destination = validPath(intoURL);
   // Shared, since another thread may be cancelling while this one ends.
   const auto copier = std::make_shared<MLFUnzipCopier>();
   copier->progressCallback = [&](double fraction, double) {

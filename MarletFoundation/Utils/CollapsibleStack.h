@@ -13,6 +13,8 @@ namespace MarletFoundation {
 enum class StackCollapsingDecision { MarkBegin, MarkEnd, CancelGrouping, Continue };
 
 template <class Element>
+class CollapsibleStack;
+template <class Element>
 class StackSlice;
 
 /// One entry: owns the older ones behind it.
@@ -61,6 +63,37 @@ class StackIterator {
   bool forward_;
 };
 
+/// A stack from its newest entry to its oldest.
+template <class Element>
+class StackReverseView {
+ public:
+  explicit StackReverseView(const CollapsibleStack<Element>& stack) : stack_(stack) {}
+
+  StackIterator<Element> makeIterator() const { return {stack_.top_.get(), stack_.bottom_, false}; }
+  StackIterator<Element> begin() const { return makeIterator(); }
+  std::default_sentinel_t end() const { return {}; }
+
+ private:
+  const CollapsibleStack<Element>& stack_;
+};
+
+/// A stack's entries that are newer than where the last folding ended, all before any; from the oldest to the
+/// newest.
+template <class Element>
+class StackUncollapsedView {
+ public:
+  explicit StackUncollapsedView(const CollapsibleStack<Element>& stack) : stack_(stack) {}
+
+  StackIterator<Element> makeIterator() const {
+    return {stack_.oldestUncollapsed(), stack_.top_.get(), true};
+  }
+  StackIterator<Element> begin() const { return makeIterator(); }
+  std::default_sentinel_t end() const { return {}; }
+
+ private:
+  const CollapsibleStack<Element>& stack_;
+};
+
 /// A stack, such as an undo history, in which runs of neighbouring entries can be folded into one. Walks, as
 /// range-for does, from the oldest entry to the newest. One thread at a time.
 template <class Element>
@@ -68,13 +101,6 @@ class CollapsibleStack {
  public:
   using Entry = StackEntry<Element>;
   using Iterator = StackIterator<Element>;
-
-  /// A stack seen in one way; holds until the stack changes.
-  struct View {
-    Iterator first;
-    Iterator begin() const { return first; }
-    std::default_sentinel_t end() const { return {}; }
-  };
 
   CollapsibleStack() = default;
   CollapsibleStack(const CollapsibleStack&) = delete;
@@ -119,10 +145,9 @@ class CollapsibleStack {
   Iterator makeIterator() const { return {bottom_, top_.get(), true}; }
   Iterator begin() const { return makeIterator(); }
   std::default_sentinel_t end() const { return {}; }
-  /// From the newest entry to the oldest.
-  View reverse() const { return {{top_.get(), bottom_, false}}; }
-  /// The entries newer than where the last folding ended; all before any.
-  View uncollapsed() const { return {{oldestUncollapsed(), top_.get(), true}}; }
+  // These show the stack as it is when they are walked, and hold as long as it lives.
+  StackReverseView<Element> reverse() const { return StackReverseView<Element>(*this); }
+  StackUncollapsedView<Element> uncollapsed() const { return StackUncollapsedView<Element>(*this); }
 
   /// Walks the entries to the newest, or only those that weren't folded yet, and asks `iterator` about each, with
   /// the element behind it or null. Each run from a `MarkBegin` to the next `MarkEnd` is then given to
@@ -141,6 +166,9 @@ class CollapsibleStack {
       : top_(std::move(top)), bottom_(bottom), userEntries_(userEntries) {}
 
  private:
+  friend class StackReverseView<Element>;
+  friend class StackUncollapsedView<Element>;
+
   Entry* oldestUncollapsed() const { return lastCollapsed_ ? lastCollapsed_->nextEntry : bottom_; }
   /// The link that owns `entry`.
   std::shared_ptr<Entry>& ownerOf(const Entry& entry) {

@@ -106,7 +106,10 @@ TEST(ArcCopier, WhatIsThereStaysAndLinksAreNotFollowed) {
                                        {"other/a", "a"},
                                        {"out", "->"}}));
   EXPECT_EQ(extraction.conflicts, (std::vector<std::string>{"kept", "directory", "link", "out", "dangling"}));
-  EXPECT_EQ(extraction.problems.size(), 3u);
+  const auto* reason = "a file or a link is there already where it needs a directory";
+  EXPECT_EQ(extraction.problems, (Files{{"kept/below", "it lies below what is a file"},
+                                        {"out/deep/indirect", reason},
+                                        {"out/direct", reason}}));
 }
 
 TEST(ArcCopier, WhatTurnsUpMeanwhileStaysToo) {

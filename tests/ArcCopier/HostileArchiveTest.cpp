@@ -47,6 +47,8 @@ std::vector<Refused> refusedArchives() {
   return {
       {"overlapping bomb of 10 MB", overlappingBomb(10 * MiB, 200), "its entries overlap"},
       {"entry inside of another", changed(with(42, number(10, 4)), &ZipItem::changeCentral),
+       "its entries overlap"},
+      {"no entry where the directory says", changed(with(0, "x"), &ZipItem::changeLocal),
        "a local header is missing"},
       {"local name", changed(with(30, "x"), &ZipItem::changeLocal), differs},
       {"local size", changed(with(22, number(5, 4)), &ZipItem::changeLocal), differs},
@@ -180,6 +182,29 @@ TEST(HostileArchive, PassesOverAnyNumberOfFaultyEntries) {
   EXPECT_EQ(extraction.finished, (std::vector<std::string>{"last"}));
 }
 
+std::size_t bytesReadSoFar() {
+  std::ifstream counts("/proc/self/io");
+  std::string name;
+  std::size_t count = 0;
+  counts >> name >> count;
+  return count;
+}
+
+TEST(HostileArchive, IsWalkedOnceThoughItsDirectoryIsLargeAndBackwards) {
+  ZipItem item{.name = {}, .changeCentral = [](std::string& header) {
+                 header.replace(32, 2, number(5000, 2));
+                 header += std::string(5000, 'c');
+               }};
+  Items items;
+  for (int i = 0; i < 500; ++i) items.push_back(item), items.back().name = std::to_string(i);
+  const auto archive = zip(items, {.isBackwards = true});
+  Extraction extraction(archive);
+  const auto before = bytesReadSoFar();
+  extraction.run();
+  EXPECT_EQ(extraction.finished.size(), items.size());
+  EXPECT_LT(bytesReadSoFar() - before, 10 * archive.size());
+}
+
 TEST(HostileArchive, StopsAtAFaultWhenTheHandlerSaysSo) {
   Extraction extraction(zip({good("a"), {.name = "/b"}, good("c")}));
   extraction.stopsAtErrors = true;
@@ -230,10 +255,12 @@ TEST(HostileArchive, GivesBackNoMoreThanItsLimitsAndTakesLittleMemory) {
     EXPECT_EQ(limited.files(), (std::map<std::string, std::string>{{"a", "This is a"}}));
   }
 
-  Extraction crowded(bomb, {2, 1 << 30, 200});
-  crowded.run();
-  EXPECT_EQ(crowded.result, ArcCopierLimitExceeded);
-  EXPECT_FALSE(std::filesystem::exists(crowded.destination()));
+  for (const auto& archive : {bomb, zip({good("deep/er/still")})}) {
+    Extraction crowded(archive, {2, 1 << 30, 200});
+    crowded.run();
+    EXPECT_EQ(crowded.result, ArcCopierLimitExceeded);
+    EXPECT_FALSE(std::filesystem::exists(crowded.destination()));
+  }
 }
 
 }  // namespace

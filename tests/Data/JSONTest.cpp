@@ -59,6 +59,12 @@ TEST(JSON, RefusesObjectsOfOtherKinds) {
     EXPECT_THROW(JSONSerialization::write(*object), ErrorObject);
   }
   EXPECT_THROW(JSONSerialization::write(*NumberObject::real(1.0 / 0.0)), ErrorObject);
+  PropertyListObjectPointer nested = std::make_shared<ArrayObject>(PropertyListObjects{});
+  for (int i = 1; i < 512; ++i) nested = std::make_shared<ArrayObject>(PropertyListObjects{nested});
+  EXPECT_NO_THROW(JSON{*JSONSerialization::read(Data(JSONSerialization::write(*nested)))});
+  nested = std::make_shared<ArrayObject>(PropertyListObjects{nested});
+  EXPECT_THROW(JSON{*nested}, JSONError);
+  EXPECT_THROW(JSONSerialization::write(*nested), ErrorObject);
   EXPECT_EQ(JSON(NumberObject("i", std::int64_t{7})), JSON(7));
   EXPECT_EQ(JSON(NumberObject("B", std::int64_t{1})), JSON(true));
   EXPECT_EQ(JSONSerialization::write(NumberObject("B", std::int64_t{1})), "true");

@@ -150,6 +150,10 @@ TEST_F(SandboxedResource, IsRefusedForLinksAndWhatIsNotThere) {
   EXPECT_EQ(missing.domain(), MarletFoundationErrorDomain);
   EXPECT_EQ(missing.localizedDescription(), "Unable to determine if file is a symlink");
   EXPECT_EQ(missing.underlyingError()->code(), ENOENT);
+  // Of another machine, though a file here has the same path.
+  const auto elsewhere = *URL::parse("https://example.org" + page_.path());
+  EXPECT_THROW(MLFSandboxedResource{elsewhere}, ErrorObject);
+  EXPECT_FALSE(setExtendedAttribute(elsewhere, {"mark"}, "x"));
   fs::create_directories(directory_.path() / "support/MarletFoundation/SandboxSecret");
   const auto noSecret = failure("page");
   EXPECT_EQ(noSecret.domain(), PosixErrorDomain);

@@ -34,6 +34,9 @@ TEST(Checksum, DigestsFilesAndBytes) {
     EXPECT_EQ(hexadecimal(Data::mlf_SHA1DigestForURL(url)->bytes()), sha1);
     EXPECT_EQ(hexadecimal(Data(contents).mlf_SHA1Digest().bytes()), sha1);
   }
+  // A file that claims to be empty and isn't.
+  const auto version = URL::file("/proc/version");
+  EXPECT_EQ(*Data::mlf_SHA1DigestForURL(version), FileManager::readFile(version).mlf_SHA1Digest());
   for (const auto* missing : {"nothing", ""}) {
     EXPECT_THROW(Checksum::MD5ChecksumForFile(directory.url(missing)), ErrorObject);
     EXPECT_FALSE(Data::mlf_SHA1DigestForURL(directory.url(missing)));

@@ -81,7 +81,8 @@ std::string zip(const std::vector<ZipItem>& items, const ZipOptions& options) {
   std::string archive, directory;
   for (const auto& item : items) {
     const auto& packed = item.packed ? *item.packed : item.contents;
-    directory += directoryEntry(item, packed.size(), archive.size());
+    const auto entry = directoryEntry(item, packed.size(), archive.size());
+    directory.insert(options.isBackwards ? 0 : directory.size(), entry);
     archive += localHeader(item, packed.size()) + packed;
     if (item.flags & 8)
       archive += "PK\7\10" + number(crc32(item.contents), 4) + number(packed.size(), 4) +

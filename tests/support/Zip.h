@@ -31,6 +31,8 @@ struct ZipItem {
 struct ZipOptions {
   bool isZip64 = false;
   std::string comment = {};
+  /// The directory has the entries from the last one to the first.
+  bool isBackwards = false;
   /// Overwrites bytes of the end record (22), behind the zip64 records (56 and 20) where there are any.
   std::function<void(std::string& end)> changeEnd = {};
 };

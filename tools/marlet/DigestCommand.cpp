@@ -1,5 +1,8 @@
 #include "DigestCommand.h"
 
+#include <unistd.h>
+
+#include <csignal>
 #include <iostream>
 
 #include "MarletFoundation/MarletFoundation.h"
@@ -8,6 +11,14 @@
 using namespace MarletFoundation;
 
 namespace {
+
+std::string complaint;
+
+/// Files are mapped, and who looks at bytes that a file has lost meanwhile gets a signal.
+void endAtLostBytes(int) {
+  [[maybe_unused]] const auto written = ::write(STDERR_FILENO, complaint.data(), complaint.size());
+  ::_exit(static_cast<int>(ExitStatus::unreadablePath));
+}
 
 std::string digest(const URL& file, bool isSHA1) {
   if (!isSHA1) return Checksum::MD5ChecksumForFile(file);
@@ -39,9 +50,11 @@ std::string line(const std::string& digest, const std::string& name) {
 
 ExitStatus printDigests(const std::vector<std::string>& paths, bool isSHA1, const Terminal& terminal) {
   auto status = ExitStatus::good;
+  std::signal(SIGBUS, endAtLostBytes);
   for (const auto& path : paths) {
+    complaint = "marlet: " + printable(path) + ": it can't be read to its end.\n";
     try {
-      std::cout << line(digest(URL::file(path), isSHA1), path);
+      std::cout << line(digest(URL::file(path), isSHA1), path) << std::flush;
     } catch (const Error& error) {
       terminal.complain(printable(path + ": " + ErrorObject(error).localizedDescription()));
       status = ExitStatus::unreadablePath;

@@ -18,6 +18,7 @@ const std::map<std::string_view, std::string_view> wordsOfCases{
      "A hint has a \"FileReference\", but there is no \"Resources\" directory"},
     {"HintContentReferenceMissingFile", "A hint's \"FileReference\" names no file in \"Resources\""},
     {"InvalidHintContentFile", "The file of a hint is not valid UTF-8"},
+    {"UnzipFailed", "There is nothing in it"},
     {"MissingCutsceneAssetForLocalReference", "\"CutsceneReference\" names nothing that can be reached"},
     {"CutsceneAssetReferencesWithoutResources",
      "There is a \"CutsceneReference\", but no \"Resources\" directory"},

@@ -7,7 +7,7 @@ enum class ExitStatus {
   negative = 1,
   wrongUsage = 2,
   unreadablePath = 3,
-  /// Nothing was changed.
+  /// Nothing was changed, but for what was extracted before.
   failedWrite = 4,
 };
 
@@ -23,5 +23,5 @@ inline constexpr ExitStatusWords exitStatusWords[] = {
      "A valid answer that is a no: problems were found, or a difference that was asked for."},
     {ExitStatus::wrongUsage, "Wrong usage."},
     {ExitStatus::unreadablePath, "A path can't be read."},
-    {ExitStatus::failedWrite, "A write failed; nothing was changed."},
+    {ExitStatus::failedWrite, "A write failed; nothing was changed, but for what unzip had extracted."},
 };

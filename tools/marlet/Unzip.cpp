@@ -1,5 +1,7 @@
 #include "Unzip.h"
 
+#include <cerrno>
+
 #include "ArcCopier/ArcCopier.h"
 #include "Guarded.h"
 #include "MarletFoundation/MarletFoundation.h"
@@ -9,6 +11,11 @@ using namespace MarletFoundation;
 
 namespace {
 
+/// Whether an archive that was refused could be read.
+bool isDamaged(const ErrorObject& error) {
+  return std::get<std::int64_t>(error.userInfo().at("errno")) == EBADMSG;
+}
+
 CommandFailure failure(const std::string& archive, const std::string& directory, const ErrorObject& error) {
   switch (error.code()) {
     case ArcCopierBadDestination:
@@ -16,7 +23,8 @@ CommandFailure failure(const std::string& archive, const std::string& directory,
     case ArcCopierSomeFilesFailed:
       return {ExitStatus::negative, archive + ": not everything of it was extracted."};
     case ArcCopierBadArchive:
-      return {ExitStatus::negative, archive + ": nothing of it was extracted."};
+      return {isDamaged(error) ? ExitStatus::negative : ExitStatus::unreadablePath,
+              archive + ": nothing of it was extracted."};
     default:
       return {ExitStatus::negative, archive + ": it was not extracted to its end."};
   }

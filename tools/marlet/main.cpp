@@ -1,4 +1,5 @@
 #include <CLI/CLI.hpp>
+#include <csignal>
 #include <iostream>
 
 #include "ApplyCommand.h"
@@ -41,6 +42,17 @@ void setUpLibrary(const Terminal& terminal) {
   HostEnvironment::setCurrent(std::move(environment));
   setFatalErrorHandler(
       [](std::string_view message, const SourceLocation&) { throw FatalProblem{std::string(message)}; });
+}
+
+/// An empty path would be the working directory, which hardly anybody means.
+void refuseEmptyPaths(CLI::App& app) {
+  for (auto* option : app.get_options()) {
+    const auto type = option->get_type_name();
+    if (option->get_positional() && (type == "DIR" || type == "FILE"))
+      option->check(
+          [](const std::string& path) { return path.empty() ? "the path is empty" : std::string(); });
+  }
+  for (auto* command : app.get_subcommands({})) refuseEmptyPaths(*command);
 }
 
 int run(int argc, char** argv) {
@@ -268,6 +280,7 @@ int run(int argc, char** argv) {
                            {"fish", Reference::fish}});
   referenceCommand->callback([&] { printReference(app, reference, std::cout); });
 
+  refuseEmptyPaths(app);
   app.parse_complete_callback([&] { setUpLibrary(terminal); });
   try {
     app.parse(argc, argv);
@@ -285,6 +298,8 @@ int run(int argc, char** argv) {
 }  // namespace
 
 int main(int argc, char** argv) {
+  // A file that may not grow any more is an error of the write.
+  std::signal(SIGXFSZ, SIG_IGN);
   try {
     return run(argc, argv);
   } catch (const FatalProblem& fatal) {
