@@ -39,7 +39,9 @@ TEST(Target, LoadsWhatItsDirectorySays) {
   const auto paths = target->librarySearchPath().searchPaths();
   ASSERT_EQ(paths.size(), 4u);
   EXPECT_EQ(paths[0].path(), url.path() + "/Tools/usr/lib");
-  EXPECT_EQ(paths[2], Toolchain::globalToolchain()->librarySearchPath().searchPaths()[0]);
+  const auto& global = *Toolchain::globalToolchain();
+  EXPECT_EQ(paths[2], global.librarySearchPath().searchPaths()[0]);
+  EXPECT_EQ(global.effectiveLibrarySearchPath(), global.librarySearchPath());
 }
 
 TEST(Target, AnyFaultGivesNone) {

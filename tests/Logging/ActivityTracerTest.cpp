@@ -70,7 +70,8 @@ TEST_F(ActivityTracerTest, SpoolsTypedEvents) {
   finish();
   const auto messages = lines("TelvaneReporting/Messages.jsonl");
   ASSERT_EQ(messages.size(), 3u);
-  EXPECT_EQ(messages[0].find("{\"session\":{\"batchEvent\""), 0u) << messages[0];
+  EXPECT_EQ(messages[0].find(R"({"session":{"batchEvent":"true","clientType":"MarletFoundation",)"), 0u)
+      << messages[0];
   EXPECT_EQ(messages[1], R"({"category":1,"type":10,"payload":{}})");
   EXPECT_EQ(messages[2], R"({"category":2,"type":3,"payload":{"n":1.5}})");
   EXPECT_EQ(logged_, "Telvane Error, dropping log message\n");

@@ -82,6 +82,11 @@ struct Coder : KeyedCoder {
   }
 };
 
+TEST_F(SandboxedResource, KeepsTheTokenThatItsURLBrings) {
+  const MLFSandboxedResource resource(SecurityScope::attachSecurityScope(page_, "of another process"));
+  EXPECT_EQ(resource.sandboxExtensionToken.view(), std::string_view("of another process", 19));
+}
+
 TEST_F(SandboxedResource, TravelsThroughACoder) {
   Coder coder;
   MLFSandboxedResource(page_).encodeWithCoder(coder);
