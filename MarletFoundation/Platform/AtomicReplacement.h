@@ -81,7 +81,8 @@ class AtomicReplacement {
 /// a mode or an attribute of a user's that can't be kept is an error.
 int copyAttributes(int from, int to);
 
-/// Removes a file or a whole directory, of any depth; what can't be removed stays.
-void removeTree(int parent, const std::string& name);
+/// Removes a file or a whole directory, of any depth; what can't be removed stays. 0, or the errno of the first
+/// thing that stayed.
+int removeTree(int parent, const std::string& name);
 
 }  // namespace MarletFoundation

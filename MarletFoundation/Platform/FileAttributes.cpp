@@ -55,17 +55,24 @@ int copyAttributes(int from, int to) {
 
 namespace {
 
-void removeDirectory(int parent, const std::string& name, Descriptor opened) {
+int removeDirectory(int parent, const std::string& name, Descriptor opened) {
   struct Level {
     std::shared_ptr<DiskDirectory> directory, above;
     std::string name;
     bool emptied = false;
+    int listing = 0;  // errno of it
+  };
+  int firstError = 0;
+  const auto failed = [&](int error) {
+    if (firstError == 0) firstError = error;
   };
   std::vector<Level> levels{{DiskDirectory::root(std::move(opened)), nullptr, name}};
   while (!levels.empty()) {
     const Level level = levels.back();
     if (level.emptied) {
-      ::unlinkat(level.above ? level.above->descriptor() : parent, level.name.c_str(), AT_REMOVEDIR);
+      const int above = level.above ? level.above->descriptor() : parent;
+      if (::unlinkat(above, level.name.c_str(), AT_REMOVEDIR) != 0 && errno != ENOENT)
+        failed(level.listing != 0 ? level.listing : errno);
       levels.pop_back();
       continue;
     }
@@ -74,31 +81,42 @@ void removeDirectory(int parent, const std::string& name, Descriptor opened) {
       ::fchmodat(level.above->descriptor(), level.name.c_str(), 0700, AT_SYMLINK_NOFOLLOW);
     }
     const auto entries = level.directory->entries();
-    if (!entries) continue;
+    if (!entries) {
+      levels.back().listing = errno;
+      continue;
+    }
     ::fchmod(level.directory->descriptor(), 0700);
     for (const auto& entry : *entries) {
-      const bool removed =
-          entry.type != DT_DIR && ::unlinkat(level.directory->descriptor(), entry.name.c_str(), 0) == 0;
-      if (!removed)
-        levels.push_back(
-            {DiskDirectory::child(level.directory, SharedString(entry.name)), level.directory, entry.name});
+      // Not every file system tells kinds; what can't be unlinked for being a directory is one.
+      if (entry.type != DT_DIR) {
+        if (::unlinkat(level.directory->descriptor(), entry.name.c_str(), 0) == 0 || errno == ENOENT)
+          continue;
+        if (errno != EISDIR) {
+          failed(errno);
+          continue;
+        }
+      }
+      levels.push_back(
+          {DiskDirectory::child(level.directory, SharedString(entry.name)), level.directory, entry.name});
     }
   }
+  return firstError;
 }
 
 }  // namespace
 
-void removeTree(int parent, const std::string& name) {
-  if (::unlinkat(parent, name.c_str(), 0) == 0 || errno == ENOENT) return;
+int removeTree(int parent, const std::string& name) {
+  if (::unlinkat(parent, name.c_str(), 0) == 0 || errno == ENOENT) return 0;
+  if (errno != EISDIR) return errno;
   Descriptor opened(::openat(parent, name.c_str(), DirectoryFlags));
   if (!opened && errno == EACCES && ::fchmodat(parent, name.c_str(), 0700, AT_SYMLINK_NOFOLLOW) == 0) {
     opened = Descriptor(::openat(parent, name.c_str(), DirectoryFlags));
   }
-  if (!opened) return;
+  if (!opened) return errno;
   try {
-    removeDirectory(parent, name, std::move(opened));
+    return removeDirectory(parent, name, std::move(opened));
   } catch (const std::bad_alloc&) {
-    // Some of it stays; the next replacement clears it away.
+    return ENOMEM;
   }
 }
 

@@ -2,9 +2,8 @@
 
 #include <filesystem>
 
-#include "MarletFoundation/Platform/Descriptor.h"
+#include "MarletFoundation/Platform/AtomicReplacement.h"
 #include "MarletFoundation/Platform/DispatchQueue.h"
-#include "MarletFoundation/Platform/FatalError.h"
 #include "MarletFoundation/Platform/FileManager.h"
 #include "MarletFoundation/Platform/Host.h"
 
@@ -25,23 +24,15 @@ std::string moveAside(const URL& url) {
   return aside;
 }
 
-std::optional<ErrorObject> remove(const std::string& path) {
-  std::error_code error;
-  std::filesystem::remove_all(path, error);
-  if (!error) return std::nullopt;
-  if (error.category() != std::system_category() && error.category() != std::generic_category())
-    fatalError("Removal failed with what is no error object: " + error.message());
-  return ErrorObject::posix(error.value(), path);
-}
-
 }  // namespace
 
 void asynchronouslyRemoveItem(const URL& url,
                               std::function<void(const std::optional<ErrorObject>&)> completion) {
   DispatchQueue::global(DispatchQuality::background)
       .async([path = moveAside(url), completion = std::move(completion)] {
-        const auto error = remove(path);
-        if (completion) completion(error);
+        const int error = removeTree(AT_FDCWD, path);
+        if (completion)
+          completion(error == 0 ? std::nullopt : std::optional(ErrorObject::posix(error, path)));
       });
 }
 

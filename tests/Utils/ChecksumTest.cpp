@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 #include <stdlib.h>
+#include <sys/resource.h>
 
 #include <condition_variable>
 #include <fstream>
@@ -64,8 +65,8 @@ std::optional<ErrorObject> removeAndWait(const URL& url) {
 TEST(AsynchronousRemoval, TakesTheItemAwayAtOnceAndRemovesItLater) {
   const TemporaryDirectory directory, temporary;
   const auto item = directory.path() / "item";
-  const char* before = ::getenv("TMPDIR");
-  const std::string kept = before ? before : "/tmp";
+  const char* set = ::getenv("TMPDIR");
+  const std::string kept = set ? set : "/tmp";
   // The second is on another file system.
   for (const auto& place : {temporary.path().string(), std::string("/dev/shm")}) {
     ::setenv("TMPDIR", place.c_str(), 1);
@@ -78,6 +79,16 @@ TEST(AsynchronousRemoval, TakesTheItemAwayAtOnceAndRemovesItLater) {
     EXPECT_TRUE(std::filesystem::is_empty(temporary.path()));
   }
   ::setenv("TMPDIR", kept.c_str(), 1);
+  // Deeper than a process may have files open.
+  rlimit before, few;
+  ASSERT_EQ(::getrlimit(RLIMIT_NOFILE, &before), 0);
+  few = {200, before.rlim_max};
+  auto level = item;
+  for (int depth = 0; depth < 300; ++depth) level /= "d";
+  std::filesystem::create_directories(level);
+  ::setrlimit(RLIMIT_NOFILE, &few);
+  EXPECT_FALSE(removeAndWait(directory.url("item")));
+  ::setrlimit(RLIMIT_NOFILE, &before);
   EXPECT_THROW(FileManager::asynchronouslyRemoveItem(directory.url("nothing")), ErrorObject);
 }
 
