@@ -14,7 +14,7 @@ int main(int, char** argv) {
   const auto smaller = DiffOptions::SmallerHunks;
   const auto text = [&](int argument) {
     return *MarletFoundation::utf16FromUTF8(
-        MarletFoundation::FileManager::readFile(URL::file(argv[argument])).view());
+        MarletFoundation::FileManager::mapFile(URL::file(argv[argument])).view());
   };
   const std::string_view what = argv[1];
   if (what == "trees") {
