@@ -3,6 +3,7 @@
 #include <thread>
 
 #include "MarletFoundation/Data/CaseError.h"
+#include "support/Failure.h"
 
 namespace MarletFoundation::test {
 
@@ -68,11 +69,7 @@ TEST(CaseError, IsNamedByItsCaseAndPrintsItsPayload) {
     EXPECT_TRUE(std::string(printed).starts_with(error.what()));
     EXPECT_EQ(error.copy()->description(), printed);
     EXPECT_NO_THROW(error.errorContents());
-    try {
-      error.copy()->raise();
-    } catch (const LoadError& raised) {
-      EXPECT_EQ(raised, error) << "with its own type";
-    }
+    EXPECT_EQ(thrown<LoadError>([&copied = error] { copied.copy()->raise(); }), error);
   }
   EXPECT_FALSE(invalidVersion == LoadError(LoadCase::invalidVersion, "2.1"));
   EXPECT_FALSE(missingName == LoadError(LoadCase::wrapped));

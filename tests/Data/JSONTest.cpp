@@ -5,6 +5,7 @@
 
 #include "MarletFoundation/Platform/ErrorObject.h"
 #include "MarletFoundation/Platform/JSONSerialization.h"
+#include "support/Failure.h"
 
 namespace MarletFoundation::test {
 namespace {
@@ -83,14 +84,6 @@ TEST(JSON, DecodesOrTellsWhatWasWanted) {
             (std::map<std::string, bool>{{"a", true}}));
   EXPECT_EQ(decode<Half>(parsed("1.5")).value, 0.75);
 
-  const auto failure = [](auto decoding) -> std::string {
-    try {
-      decoding();
-      return "";
-    } catch (const JSONError& error) {
-      return error.description();
-    }
-  };
   EXPECT_EQ(failure([] { decode<std::int64_t>(parsed("7.0")); }), "DecodingTypeMismatch(\"integer\")");
   EXPECT_EQ(failure([] { decode<double>(parsed("7")); }), "DecodingTypeMismatch(\"double\")");
   EXPECT_EQ(failure([] { decode<bool>(parsed("1")); }), "DecodingTypeMismatch(\"boolean\")");

@@ -2,6 +2,7 @@
 
 #include "DiffPack/Packs.h"
 #include "MarletFoundation/Platform/PropertyListError.h"
+#include "support/Failure.h"
 
 namespace MarletFoundation::test {
 namespace {
@@ -144,13 +145,10 @@ TEST(DiffPackReading, FailsInTheWordsOfEachCheck) {
 }
 
 TEST(DiffPackReading, KeepsTheCauseOfABadManifest) {
-  try {
-    DiffPackSnapshot(goodPack().with(manifest, notAPlist).wrapper(), contentUrl);
-    FAIL();
-  } catch (const ErrorObject& error) {
-    ASSERT_TRUE(error.underlyingError());
-    EXPECT_EQ(error.underlyingError()->domain(), PropertyListErrorDomain);
-  }
+  const auto error =
+      errorOf([] { DiffPackSnapshot(goodPack().with(manifest, notAPlist).wrapper(), contentUrl); });
+  ASSERT_TRUE(error && error->underlyingError());
+  EXPECT_EQ(error->underlyingError()->domain(), PropertyListErrorDomain);
 }
 
 /// With everything bad from one check on, that check is the one that fails.

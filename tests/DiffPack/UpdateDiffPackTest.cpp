@@ -9,6 +9,7 @@
 #include "MarletFoundation/DiffPack/MergedUserEdit.h"
 #include "MarletFoundation/Marlet/MarletBookSnapshot.h"
 #include "support/Documents.h"
+#include "support/Failure.h"
 
 namespace MarletFoundation::test {
 namespace {
@@ -45,14 +46,10 @@ class UpdateDiffPack : public testing::Test {
   /// "DOMAIN CODE: WORDS" of what a function throws.
   template <class Function>
   std::string failure(Function function) const {
-    try {
-      function();
-    } catch (const Error& error) {
-      const ErrorObject object(error);
-      return std::string(object.domain()) + " " + std::to_string(object.code()) + ": " +
-             object.localizedDescription();
-    }
-    return "";
+    const auto error = errorOf(function);
+    return error ? std::string(error->domain()) + " " + std::to_string(error->code()) + ": " +
+                       ErrorObject(*error).localizedDescription()
+                 : "";
   }
   DiffPackSnapshot updatePack(std::vector<FileDiff> updates, const std::string& source = "source") const {
     fs::create_directories(directory_.path() / source);

@@ -11,6 +11,7 @@
 #include "MarletFoundation/DiffPack/UserEditDiffPackValidator.h"
 #include "MarletFoundation/Marlet/MarletBookSnapshot.h"
 #include "support/Documents.h"
+#include "support/Failure.h"
 #include "support/Fatal.h"
 
 namespace MarletFoundation::test {
@@ -48,14 +49,8 @@ TEST(UserEditDiffPack, OnlyAValidPackIsUpdated) {
   const DiffPackSnapshot moving(DiffPackType::UserEditPack, DiffPackDocumentType::MarletBook, url, "id", "1",
                                 "1.0", {});
   for (const auto& pack : {update, moving}) {
-    try {
-      updatedUserEditDiffPack(pack, {});
-      ADD_FAILURE() << pack.description();
-    } catch (const ErrorObject& error) {
-      EXPECT_EQ(error.domain(), "Diff");
-      EXPECT_EQ(error.code(), 5);
-      EXPECT_EQ(error.localizedDescription(), "Invalid user-edit DiffPack");
-    }
+    EXPECT_EQ(failure([&] { updatedUserEditDiffPack(pack, {}); }),
+              R"(Error(domain: Diff, code: 5, "Invalid user-edit DiffPack"))");
   }
   EXPECT_NO_THROW(UserEditDiffPackValidator(packOf(url)).validate());
 }

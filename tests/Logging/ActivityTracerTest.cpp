@@ -9,6 +9,7 @@
 
 #include "MarletFoundation/Logging/UserDefaultBoolKey.h"
 #include "MarletFoundation/Platform/HostEnvironment.h"
+#include "support/ChangedHost.h"
 #include "support/Tree.h"
 
 namespace MarletFoundation::test {
@@ -18,17 +19,6 @@ using Event = ActivityTracingEvent;
 
 class ActivityTracerTest : public testing::Test {
  protected:
-  ActivityTracerTest() {
-    auto environment = HostEnvironment::defaults();
-    environment.applicationSupportDirectory = directory_.url("support");
-    environment.systemLog = [this](std::string_view entry) { logged_ += std::string(entry) + "\n"; };
-    environment.userDefault = [](std::string_view key) {
-      return key == "Known" ? std::optional<std::int64_t>(1) : std::nullopt;
-    };
-    HostEnvironment::setCurrent(environment);
-  }
-  ~ActivityTracerTest() override { HostEnvironment::setCurrent(HostEnvironment::defaults()); }
-
   std::vector<std::string> lines(const char* name) const {
     std::ifstream file(directory_.path() / "support" / name);
     std::vector<std::string> lines;
@@ -42,6 +32,13 @@ class ActivityTracerTest : public testing::Test {
 
   const TemporaryDirectory directory_;
   std::string logged_;
+  const ChangedHost host_{[this](HostEnvironment& host) {
+    host.applicationSupportDirectory = directory_.url("support");
+    host.systemLog = [this](std::string_view entry) { logged_ += std::string(entry) + "\n"; };
+    host.userDefault = [](std::string_view key) {
+      return key == "Known" ? std::optional<std::int64_t>(1) : std::nullopt;
+    };
+  }};
   const std::shared_ptr<ActivityTracer> tracer_ = std::make_shared<ActivityTracer>();
 };
 

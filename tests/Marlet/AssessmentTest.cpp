@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "MarletFoundation/Marlet/AssessmentInformation.h"
+#include "support/Failure.h"
 #include "support/Tree.h"
 
 namespace MarletFoundation::test {
@@ -44,14 +45,10 @@ TEST(Assessment, badStatusesExplainThemselves) {
   };
   int code = 1;
   for (const auto& [value, description, words] : cases) {
-    try {
-      Status{value};
-      ADD_FAILURE() << description;
-    } catch (const Status::SerializationError& error) {
-      EXPECT_EQ(error.description(), description);
-      EXPECT_EQ(error.code(), description.starts_with("invalidStatus") ? 0 : code++);
-      EXPECT_EQ(error.errorContents(), (UserVisibleErrorContents{"Assessment Status Not Valid", words}));
-    }
+    const auto error = thrown<Status::SerializationError>([&v = value] { Status{v}; });
+    EXPECT_EQ(error.description(), description);
+    EXPECT_EQ(error.code(), description.starts_with("invalidStatus") ? 0 : code++);
+    EXPECT_EQ(error.errorContents(), (UserVisibleErrorContents{"Assessment Status Not Valid", words}));
   }
 }
 
@@ -73,13 +70,9 @@ TEST(Assessment, theStoredFlagIsTakenAsItStands) {
 
 TEST(Assessment, badInformationExplainsItself) {
   const auto words = [](const PropertyListValue& value) {
-    try {
-      AssessmentInformation{value};
-    } catch (const UserVisibleError& error) {
-      return error.errorContents().localizedDescription + ": " +
-             error.errorContents().localizedRecoverySuggestion;
-    }
-    return std::string();
+    const auto error = errorOf([&] { AssessmentInformation{value}; });
+    const auto contents = dynamic_cast<const UserVisibleError&>(*error).errorContents();
+    return contents.localizedDescription + ": " + contents.localizedRecoverySuggestion;
   };
   EXPECT_EQ(words("x"),
             "Unable to load assessment information: The assessment information is not a dictionary.");

@@ -5,6 +5,7 @@
 #include "MarletFoundation/Marlet/CutsceneBookPageSnapshot.h"
 #include "MarletFoundation/Marlet/MarletBookPageSnapshot.h"
 #include "support/Documents.h"
+#include "support/Failure.h"
 
 namespace MarletFoundation::test {
 namespace {
@@ -34,12 +35,7 @@ class BookPageLoading : public testing::Test {
 
   std::string failure(const std::string& page, const std::string& inChapter = chapter,
                       const std::optional<DiffPackSnapshot>& pack = {}) const {
-    try {
-      snapshotForPageWithFilename(page, inChapter, url(), nullptr, pack);
-      return "fetched";
-    } catch (const Error& error) {
-      return error.description();
-    }
+    return test::failure([&] { snapshotForPageWithFilename(page, inChapter, url(), nullptr, pack); });
   }
 
   std::u16string textOfA(const std::optional<DiffPackSnapshot>& pack = {}) const {

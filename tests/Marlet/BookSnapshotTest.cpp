@@ -4,6 +4,7 @@
 
 #include "MarletFoundation/Data/PropertyListSerializable.h"
 #include "support/Documents.h"
+#include "support/Failure.h"
 
 namespace MarletFoundation::test {
 namespace {
@@ -20,17 +21,14 @@ const std::string notAPlist = "<plist><oops></plist>";
 MarletBookSnapshot open(const Tree& tree) { return MarletBookSnapshot(tree.wrapper(), baseURL); }
 
 /// What is wrong with a document: the error's printed form, then its words where users see them.
-std::string failure(const Tree& tree) {
-  try {
-    open(tree);
-    return "opened";
-  } catch (const UserVisibleError& error) {
-    const auto words = error.errorContents();
-    return error.description() + " | " + words.localizedDescription + " | " +
-           words.localizedRecoverySuggestion;
-  } catch (const Error& error) {
-    return error.description();
-  }
+std::string failureOf(const Tree& tree) {
+  const auto error = errorOf([&] { open(tree); });
+  if (!error) return "";
+  const auto* visible = dynamic_cast<const UserVisibleError*>(error.get());
+  if (!visible) return error->description();
+  const auto words = visible->errorContents();
+  return error->description() + " | " + words.localizedDescription + " | " +
+         words.localizedRecoverySuggestion;
 }
 
 struct BadDocument {
@@ -39,7 +37,7 @@ struct BadDocument {
 };
 
 void expectFailures(const std::vector<BadDocument>& cases) {
-  for (const auto& c : cases) EXPECT_EQ(failure(c.tree), c.failure) << c.tree;
+  for (const auto& c : cases) EXPECT_EQ(failureOf(c.tree), c.failure) << c.tree;
 }
 
 Tree emptyPath(const Tree& tree, const std::string& path) {
@@ -197,28 +195,21 @@ TEST_F(BookSnapshot, EveryFailureInItsWords) {
       {good.with("Edits/UserEdits.diffpack", std::string("x")),
        R"(Error(domain: Diff, code: 3, "Invalid diffpack format, no directory contents."))"},
   });
-  EXPECT_EQ(failure(Tree{}.with("x", std::string())), failure(Tree{}));
-  try {
-    MarletBookSnapshot(FileWrapper::regularFile(Data()), baseURL);
-    ADD_FAILURE();
-  } catch (const MarletBookSnapshot::SerializationError& error) {
-    EXPECT_EQ(error.errorContents().localizedRecoverySuggestion,
-              "The marlet book is not a directory with files inside.");
-    EXPECT_EQ(error.code(), 8);
-    EXPECT_EQ(error.domain(), "MarletFoundation.MarletBookSnapshot.SerializationError");
-  }
+  EXPECT_EQ(failureOf(Tree{}.with("x", std::string())), failureOf(Tree{}));
+  const auto error = thrown<MarletBookSnapshot::SerializationError>(
+      [] { MarletBookSnapshot(FileWrapper::regularFile(Data()), baseURL); });
+  EXPECT_EQ(error.errorContents().localizedRecoverySuggestion,
+            "The marlet book is not a directory with files inside.");
+  EXPECT_EQ(error.code(), 8);
 }
 
 TEST_F(BookSnapshot, ReaderErrorsAreQuoted) {
-  try {
-    open(goodBook().with(book, notAPlist));
-    ADD_FAILURE();
-  } catch (const MarletBookSnapshot::SerializationError& error) {
-    ASSERT_EQ(error.caseName(), "invalidManifest");
-    EXPECT_EQ(
-        error.errorContents().localizedRecoverySuggestion,
-        "Manifest.plist was not able to open: " + ErrorObject(*error.error).localizedDescription() + ", nil");
-  }
+  const auto error =
+      thrown<MarletBookSnapshot::SerializationError>([] { open(goodBook().with(book, notAPlist)); });
+  ASSERT_EQ(error.caseName(), "invalidManifest");
+  EXPECT_EQ(
+      error.errorContents().localizedRecoverySuggestion,
+      "Manifest.plist was not able to open: " + ErrorObject(*error.error).localizedDescription() + ", nil");
 }
 
 TEST_F(BookSnapshot, ChapterAndPageFailuresReachTheUser) {
@@ -283,13 +274,13 @@ TEST_F(BookSnapshot, ChapterAndPageFailuresReachTheUser) {
       {good.withKey(pageA + "/Manifest.plist", "Description", A{}), page("DescriptionNotAString", 5)},
       {emptyPath(good, pageA + "/ResultInfo.plist"), page("ResultInfoNotAFile", 6)},
   });
-  const auto badChapterPlist = failure(good.with(manifest, notAPlist));
+  const auto badChapterPlist = failureOf(good.with(manifest, notAPlist));
   EXPECT_NE(
       badChapterPlist.find(
           "Invalid Chapter | One.marletchapter: The chapter Manifest.plist file could not be opened: nil"),
       std::string::npos)
       << badChapterPlist;
-  EXPECT_NE(failure(good.with(pageA + "/Manifest.plist", notAPlist)).find("error: InvalidManifest("),
+  EXPECT_NE(failureOf(good.with(pageA + "/Manifest.plist", notAPlist)).find("error: InvalidManifest("),
             std::string::npos);
 }
 
@@ -314,7 +305,7 @@ TEST_F(BookSnapshot, TheEarlierCheckWins) {
       {emptyPath(good, "Edits/KeyValueStore.plist").withKey(book, "Chapters", A{1}),
        "chapterFilenameNotAString"},
   };
-  for (const auto& [tree, expected] : cases) EXPECT_EQ(name(failure(tree)), expected) << tree;
+  for (const auto& [tree, expected] : cases) EXPECT_EQ(name(failureOf(tree)), expected) << tree;
 }
 
 TEST_F(BookSnapshot, WhatIsToleratedOpens) {
@@ -333,7 +324,7 @@ TEST_F(BookSnapshot, WhatIsToleratedOpens) {
       good.with(pageA + "/ResultInfo.plist", std::string("damaged")),
       good.without(pageA + "/ResultInfo.plist"),
   };
-  for (const auto& tree : trees) EXPECT_EQ(failure(tree), "opened") << tree;
+  for (const auto& tree : trees) EXPECT_EQ(failureOf(tree), "") << tree;
   EXPECT_FALSE(open(good.without("Edits")).userResourcesDirectoryURL);
   EXPECT_EQ(open(trees[8]).chapters[0].pages[0].resultInfoSnapshot, MarletResultInfoSnapshot());
 }
@@ -388,21 +379,19 @@ TEST_F(BookSnapshot, PackStaysSetWhenALaterCheckFails) {
 }
 
 TEST(KeyValueStore, ReadsItsWrapperInOrder) {
-  const auto failure = [](const PropertyListValue& value) -> std::string {
-    try {
-      MarletKeyValueStoreSnapshot snapshot(propertyListData(value, PropertyListFormat::xml));
-      return "read";
-    } catch (const Error& error) {
-      return error.description();
-    }
+  const std::pair<PropertyListValue, std::string> cases[] = {
+      {A{}, "WrapperNotADictionary"},
+      {D{{"Version", 1}}, "MissingVersion"},
+      {D{{"Version", "x"}}, "InvalidVersion"},
+      {D{{"Version", "2.0"}}, "VersionTooNew"},
+      {D{{"Version", "1.3"}}, "MissingContents"},
+      {D{{"Version", "1.3"}, {"Contents", "x"}}, "ContentsNotADictionary"},
+      {D{{"Version", "1.3"}, {"Contents", D{}}}, ""},
   };
-  EXPECT_EQ(failure(A{}), "WrapperNotADictionary");
-  EXPECT_EQ(failure(D{{"Version", 1}}), "MissingVersion");
-  EXPECT_EQ(failure(D{{"Version", "x"}}), "InvalidVersion");
-  EXPECT_EQ(failure(D{{"Version", "2.0"}}), "VersionTooNew");
-  EXPECT_EQ(failure(D{{"Version", "1.3"}}), "MissingContents");
-  EXPECT_EQ(failure(D{{"Version", "1.3"}, {"Contents", "x"}}), "ContentsNotADictionary");
-  EXPECT_EQ(failure(D{{"Version", "1.3"}, {"Contents", D{}}}), "read");
+  for (const auto& [value, expected] : cases) {
+    const auto data = propertyListData(value, PropertyListFormat::xml);
+    EXPECT_EQ(failure([&] { MarletKeyValueStoreSnapshot snapshot(data); }), expected);
+  }
   EXPECT_THROW(MarletKeyValueStoreSnapshot(Data(std::string("x"))),
                MarletKeyValueStoreSnapshot::SerializationError);
 }

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "MarletFoundation/Platform/Text.h"
+#include "support/Failure.h"
 #include "support/Fatal.h"
 #include "support/Tree.h"
 
@@ -18,13 +19,15 @@ std::string described(const MarletParser::Document& document) {
   return text;
 }
 
+MarletParser::Document parsed(const Tree& tree) {
+  return MarletParser(tree.wrapper(), URL::file("/D.marlet", true)).parse();
+}
+
 /// What a document's parse gives, or the words of its failure.
 std::string outcome(const Tree& tree) {
-  try {
-    return described(MarletParser(tree.wrapper(), URL::file("/D.marlet", true)).parse());
-  } catch (const ErrorObject& error) {
-    return error.localizedDescription();
-  }
+  std::string text;
+  const auto error = errorOf([&] { text = described(parsed(tree)); });
+  return error ? ErrorObject(*error).localizedDescription() : text;
 }
 
 struct Row {
@@ -179,14 +182,7 @@ TEST(MarletParser, SaysWhatIsWrongWithTheManifest) {
 }
 
 TEST(MarletParser, ErrorObjects) {
-  const auto error = [](const Tree& tree) {
-    try {
-      MarletParser(tree.wrapper(), URL::file("/D.marlet", true)).parse();
-    } catch (const ErrorObject& object) {
-      return object;
-    }
-    return ErrorObject("none", 0);
-  };
+  const auto error = [](const Tree& tree) { return thrown<ErrorObject>([&] { parsed(tree); }); };
   EXPECT_EQ(error(Tree{}),
             ErrorObject("MarletSerialization", 0,
                         {{"LocalizedDescription", "Unable to get file wrapper for contents.wbmarlet."}}));
@@ -204,23 +200,19 @@ TEST(MarletParser, ErrorObjects) {
 }
 
 TEST(MarletParser, PageURLs) {
-  const auto base = URL::file("/D.marlet", true);
   const auto tree = newStyle("")
                         .with("Pages/A.wbmarletpage/Resources/", "")
                         .with("Pages/B.wbmarletpage/Sources/", "")
                         .with("Resources/", "")
                         .with("Sources/", "");
-  const auto pages = MarletParser(tree.wrapper(), base).parse().pages;
+  const auto pages = parsed(tree).pages;
   EXPECT_EQ(pages[0].resourcesDirectoryURL(), URL::file("/D.marlet/Pages/A.wbmarletpage/Resources", true));
   EXPECT_EQ(pages[0].sourcesDirectoryURL(), std::nullopt);
   EXPECT_EQ(pages[1].sourcesDirectoryURL(), URL::file("/D.marlet/Pages/B.wbmarletpage/Sources", true));
-  const auto rootPage = MarletParser(tree.without("Pages").wrapper(), base).parse().pages[0];
+  const auto rootPage = parsed(tree.without("Pages")).pages[0];
   EXPECT_EQ(rootPage.resourcesDirectoryURL(), URL::file("/D.marlet/Resources", true));
   EXPECT_EQ(rootPage.sourcesDirectoryURL(), URL::file("/D.marlet/Sources", true));
-  const auto joined =
-      MarletParser(oldStyle(twoSections).with("Resources/", "").with("Sources/", "").wrapper(), base)
-          .parse()
-          .pages[0];
+  const auto joined = parsed(oldStyle(twoSections).with("Resources/", "").with("Sources/", "")).pages[0];
   EXPECT_EQ(joined.resourcesDirectoryURL(), URL::file("/D.marlet/Resources", true));
   EXPECT_EQ(joined.sourcesDirectoryURL(), std::nullopt);
 }

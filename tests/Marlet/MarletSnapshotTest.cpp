@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "MarletFoundation/Marlet/Marlet.h"
+#include "support/Failure.h"
 #include "support/Fatal.h"
 #include "support/Tree.h"
 
@@ -133,12 +134,7 @@ TEST(MarletSnapshot, LeavesOutWhatCannotBeRead) {
 TEST(MarletSnapshot, Errors) {
   const auto url = URL::file("/D.marlet", true);
   const auto contents = [&](const FileWrapper& wrapper) {
-    try {
-      MarletSnapshot(wrapper, url);
-    } catch (const MarletSnapshot::SerializationError& error) {
-      return error.errorContents();
-    }
-    return UserVisibleErrorContents{};
+    return thrown<MarletSnapshot::SerializationError>([&] { MarletSnapshot(wrapper, url); }).errorContents();
   };
   EXPECT_EQ(contents(FileWrapper::regularFile(Data())),
             (UserVisibleErrorContents{"Marlet Error", "File is not a marlet (it is not a directory)."}));

@@ -6,8 +6,8 @@
 #include "MarletFoundation/Data/PropertyListSerializable.h"
 #include "MarletFoundation/Marlet/LegacyTimelineXMLParser.h"
 #include "MarletFoundation/Marlet/MarletResultInfo.h"
-#include "MarletFoundation/Platform/HostEnvironment.h"
-#include "support/Tree.h"
+#include "support/ChangedHost.h"
+#include "support/Failure.h"
 
 namespace MarletFoundation {
 
@@ -42,15 +42,10 @@ Data stored(const PropertyListValue& value) {
 /// Collects what is printed and logged for as long as it lives.
 struct Sinks {
   std::vector<std::string> printed, logged;
-  HostEnvironment former = HostEnvironment::current();
-
-  Sinks() {
-    auto environment = former;
+  const ChangedHost host{[this](HostEnvironment& environment) {
     environment.diagnostics = [this](std::string_view line) { printed.emplace_back(line); };
     environment.systemLog = [this](std::string_view entry) { logged.emplace_back(entry); };
-    HostEnvironment::setCurrent(environment);
-  }
-  ~Sinks() { HostEnvironment::setCurrent(former); }
+  }};
 };
 
 TEST(ResultInfo, storesAllButCharacterOffsets) {
@@ -109,12 +104,7 @@ TEST(ResultInfo, refusesWrongRootsAndVersions) {
       {D{{"Version", "1.0.7"}, {"AssessmentInformation", D{{"Status", D{}}}}}, "missingStatus"},
   };
   for (const auto& [value, description] : cases) {
-    try {
-      Snapshot(stored(value), ResultInfo);
-      ADD_FAILURE() << description;
-    } catch (const Error& error) {
-      EXPECT_EQ(error.description(), description);
-    }
+    EXPECT_EQ(failure([&v = value] { Snapshot(stored(v), ResultInfo); }), description);
   }
   EXPECT_THROW(Snapshot(Data(std::string("bplist00")), ResultInfo), ErrorObject);
 }

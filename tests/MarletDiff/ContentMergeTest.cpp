@@ -5,6 +5,7 @@
 #include "MarletDiff/ContentDiff.h"
 #include "MarletDiff/Texts.h"
 #include "MarletFoundation/Platform/ErrorObject.h"
+#include "support/Failure.h"
 
 namespace MarletFoundation::test {
 namespace {
@@ -109,16 +110,13 @@ TEST(ContentMerge, JoinsTwoSidesUnlessTheyMeet) {
 }
 
 TEST(ContentMerge, ConflictNamesThePlaceAndTheThreeTexts) {
-  try {
-    mergeContent(u"let x = 1", Hunks{hunk(8, u"1", u"2")}, Hunks{hunk(8, u"1", u"\U0001F600")});
-    FAIL();
-  } catch (const ErrorObject& error) {
-    EXPECT_EQ(error.value(MarletDiff::LocationKey), UserInfoValue(std::int64_t{8}));
-    EXPECT_EQ(error.value(MarletDiff::LengthKey), UserInfoValue(std::int64_t{1}));
-    EXPECT_EQ(error.value(MarletDiff::BaseTextKey), UserInfoValue("1"));
-    EXPECT_EQ(error.value(MarletDiff::TextKey), UserInfoValue("2"));
-    EXPECT_EQ(error.value(MarletDiff::OtherTextKey), UserInfoValue("\U0001F600"));
-  }
+  const auto error = thrown<ErrorObject>(
+      [] { mergeContent(u"let x = 1", Hunks{hunk(8, u"1", u"2")}, Hunks{hunk(8, u"1", u"\U0001F600")}); });
+  EXPECT_EQ(error.value(MarletDiff::LocationKey), UserInfoValue(std::int64_t{8}));
+  EXPECT_EQ(error.value(MarletDiff::LengthKey), UserInfoValue(std::int64_t{1}));
+  EXPECT_EQ(error.value(MarletDiff::BaseTextKey), UserInfoValue("1"));
+  EXPECT_EQ(error.value(MarletDiff::TextKey), UserInfoValue("2"));
+  EXPECT_EQ(error.value(MarletDiff::OtherTextKey), UserInfoValue("\U0001F600"));
 }
 
 TEST(ContentMerge, SidesAreAlikeAndAgreeWithThemselves) {

@@ -5,25 +5,17 @@
 #include "MarletFoundation/PathUtilities/DocumentPath.h"
 #include "MarletFoundation/PathUtilities/PathUniquifier.h"
 #include "MarletFoundation/PathUtilities/URLExtensions.h"
-#include "MarletFoundation/Platform/FatalError.h"
-#include "MarletFoundation/Platform/HostEnvironment.h"
+#include "support/ChangedHost.h"
+#include "support/Fatal.h"
 #include "support/Tree.h"
 
 namespace MarletFoundation::test {
 namespace {
 
 /// Another documents directory for the length of a test.
-class Documents {
- public:
-  explicit Documents(std::optional<URL> directory) {
-    auto environment = before_;
-    environment.documentsDirectory = std::move(directory);
-    HostEnvironment::setCurrent(std::move(environment));
-  }
-  ~Documents() { HostEnvironment::setCurrent(before_); }
-
- private:
-  HostEnvironment before_ = HostEnvironment::current();
+struct Documents : ChangedHost {
+  explicit Documents(const std::optional<URL>& directory)
+      : ChangedHost([&](HostEnvironment& host) { host.documentsDirectory = directory; }) {}
 };
 
 std::string uniqueString(std::vector<std::string> strings) {
@@ -59,15 +51,8 @@ TEST(PathUniquifier, OutlivesAMoveOfTheDocumentsDirectory) {
 }
 
 TEST(PathUniquifier, NeedsAPath) {
-  const auto before = setFatalErrorHandler(
-      [](std::string_view message, const SourceLocation&) { throw std::string(message); });
-  try {
-    pathUniquifier(*URL::parse("http://host"));
-    ADD_FAILURE() << "went on";
-  } catch (const std::string& message) {
-    EXPECT_EQ(message, "URLs must have a path to have a pathUniquifier!");
-  }
-  setFatalErrorHandler(before);
+  EXPECT_EQ(fatalMessage([] { pathUniquifier(*URL::parse("http://host")); }),
+            "URLs must have a path to have a pathUniquifier!");
 }
 
 TEST(DocumentPath, IsRelativeToTheContent) {

@@ -13,6 +13,8 @@
 #include "MarletFoundation/Platform/FileManager.h"
 #include "MarletFoundation/Platform/HostEnvironment.h"
 #include "MarletFoundation/Platform/SecurityScope.h"
+#include "support/ChangedHost.h"
+#include "support/Failure.h"
 #include "support/Tree.h"
 
 namespace MarletFoundation::test {
@@ -27,12 +29,10 @@ class SandboxedResource : public testing::Test {
     std::ofstream(directory_.path() / "page") << "text";
     fs::create_symlink("page", directory_.path() / "link");
   }
-  ~SandboxedResource() override { HostEnvironment::setCurrent(HostEnvironment::defaults()); }
 
   void useSupport(const char* name) {
-    auto environment = HostEnvironment::defaults();
-    environment.applicationSupportDirectory = directory_.url(name);
-    HostEnvironment::setCurrent(environment);
+    host_.reset();
+    host_.emplace([&](HostEnvironment& host) { host.applicationSupportDirectory = directory_.url(name); });
   }
   /// Exit status of another process that opens what the property list holds.
   int openElsewhere(const PropertyListValue& object) const {
@@ -44,6 +44,7 @@ class SandboxedResource : public testing::Test {
     return WEXITSTATUS(std::system(command.c_str()));
   }
 
+  std::optional<ChangedHost> host_;
   const TemporaryDirectory directory_;
   const URL page_ = directory_.url("page");
 };
@@ -140,12 +141,7 @@ TEST_F(SandboxedResource, OpensInAnotherProcessUnlessForged) {
 
 TEST_F(SandboxedResource, IsRefusedForLinksAndWhatIsNotThere) {
   const auto failure = [&](const char* name) {
-    try {
-      MLFSandboxedResource resource(directory_.url(name));
-    } catch (const ErrorObject& error) {
-      return error;
-    }
-    return ErrorObject("none", 0);
+    return thrown<ErrorObject>([&] { MLFSandboxedResource resource(directory_.url(name)); });
   };
   const auto link = failure("link");
   EXPECT_EQ(link.localizedDescription(), "Unable to create sandbox extension for symlink");

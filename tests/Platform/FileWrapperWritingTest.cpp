@@ -19,6 +19,7 @@
 #include "MarletFoundation/Platform/ErrorObject.h"
 #include "MarletFoundation/Platform/FileManager.h"
 #include "MarletFoundation/Platform/FileWrapper.h"
+#include "support/Failure.h"
 #include "support/Tree.h"
 
 namespace MarletFoundation::test {
@@ -44,12 +45,8 @@ std::vector<std::string> names(const TemporaryDirectory& directory) {
 
 int errorOfWriting(const FileWrapper& wrapper, const URL& url,
                    ExistingItem existing = ExistingItem::Replaced) {
-  try {
-    wrapper.write(url, existing);
-  } catch (const ErrorObject& error) {
-    return error.code();
-  }
-  return 0;
+  const auto error = errorOf([&] { wrapper.write(url, existing); });
+  return error ? error->code() : 0;
 }
 
 ino_t number(const fs::path& path) {

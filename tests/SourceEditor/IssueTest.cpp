@@ -4,6 +4,7 @@
 #include <rapidcheck.h>
 
 #include "MarletFoundation/SourceEditor/CodeTokenType.h"
+#include "support/Failure.h"
 
 namespace MarletFoundation::test {
 namespace {
@@ -26,13 +27,9 @@ Dictionary without(Dictionary dictionary, std::string_view key) {
 
 /// What reading ends in, and its code.
 template <class Value>
-std::pair<std::string, int> failure(const PropertyListValue& value) {
-  try {
-    Value read(value);
-    return {"none", -1};
-  } catch (const Error& error) {
-    return {error.description(), error.code()};
-  }
+std::pair<std::string, int> outcome(const PropertyListValue& value) {
+  const auto error = errorOf([&] { Value read(value); });
+  return error ? std::pair(error->description(), error->code()) : std::pair(std::string("none"), -1);
 }
 
 TEST(Issue, ReadsInTheStatedOrder) {
@@ -60,7 +57,7 @@ TEST(Issue, ReadsInTheStatedOrder) {
       {with(with(with(goodIssue, "identifier", 1), "location", 1), "fixIts", "x"), "none", -1},
   };
   for (const auto& [value, description, code] : cases) {
-    EXPECT_EQ(failure<Issue>(value), (std::pair<std::string, int>(description, code)));
+    EXPECT_EQ(outcome<Issue>(value), (std::pair<std::string, int>(description, code)));
   }
 }
 
@@ -78,7 +75,7 @@ TEST(FixIt, ReadsInTheStatedOrder) {
       {goodFixIt, "none", -1},
   };
   for (const auto& [value, description, code] : cases) {
-    EXPECT_EQ(failure<FixIt>(value), (std::pair<std::string, int>(description, code)));
+    EXPECT_EQ(outcome<FixIt>(value), (std::pair<std::string, int>(description, code)));
   }
 }
 

@@ -6,6 +6,7 @@
 #include <limits>
 
 #include "MarletFoundation/Utils/Functional.h"
+#include "support/Failure.h"
 #include "support/Fatal.h"
 
 namespace MarletFoundation::test {
@@ -123,14 +124,10 @@ TEST(SourceEditorRange, propertyLists) {
       {D{{"start", good}, {"end", D{{"line", 1}, {"column", true}}}}, "EndInvalid(MissingColumn)", 4},
   };
   for (const auto& [value, description, code] : cases) {
-    try {
-      Range{value};
-      ADD_FAILURE() << description;
-    } catch (const Range::PropertyListSerializationError& error) {
-      EXPECT_EQ(error.description(), description);
-      EXPECT_EQ(error.code(), code);
-      EXPECT_EQ(ErrorObject(error).code(), code);
-    }
+    const auto error = thrown<Range::PropertyListSerializationError>([&v = value] { Range{v}; });
+    EXPECT_EQ(error.description(), description);
+    EXPECT_EQ(error.code(), code);
+    EXPECT_EQ(ErrorObject(error).code(), code);
   }
 }
 

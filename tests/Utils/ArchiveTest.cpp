@@ -6,9 +6,10 @@
 #include <thread>
 
 #include "ArcCopier/ArcCopier.h"
-#include "MarletFoundation/Platform/HostEnvironment.h"
 #include "MarletFoundation/Platform/Progress.h"
 #include "MarletFoundation/Utils/MLFUnzipCopier.h"
+#include "support/ChangedHost.h"
+#include "support/Failure.h"
 #include "support/Tree.h"
 #include "support/Zip.h"
 
@@ -72,26 +73,17 @@ TEST_F(ArchiveTest, GivesTheFirstItemAndReportsIntoTheTree) {
 
 TEST_F(ArchiveTest, FailsInItsOwnWords) {
   write(zip({}));
-  try {
-    unarchive();
-    FAIL();
-  } catch (const UnarchiveError& error) {
-    EXPECT_EQ(error, UnarchiveError(UnarchiveErrorCase::UnzipFailed));
-  }
+  EXPECT_EQ(thrown<UnarchiveError>([&] { unarchive(); }), UnarchiveError(UnarchiveErrorCase::UnzipFailed));
   const auto web = *URL::parse("https://example.org");
   EXPECT_THROW(Archive::unarchiveFile(web, directory_.url()), UnarchiveError);
   EXPECT_THROW(Archive::unarchiveFile(directory_.url("a.zip"), web), UnarchiveError);
 
   write(zip({{.name = "a"}, {.name = "/b"}}));
-  try {
-    unarchive();
-    FAIL();
-  } catch (const ErrorObject& error) {
-    EXPECT_EQ(error, ErrorObject("com.quorvex.ArcCopier", ArcCopierSomeFilesFailed,
-                                 {{"Source Path", directory_.url("a.zip").path()},
-                                  {"Dest Path", directory_.url("out").path()},
-                                  {"errno", std::int64_t{EINVAL}}}));
-  }
+  EXPECT_EQ(thrown<ErrorObject>([&] { unarchive(); }),
+            ErrorObject("com.quorvex.ArcCopier", ArcCopierSomeFilesFailed,
+                        {{"Source Path", directory_.url("a.zip").path()},
+                         {"Dest Path", directory_.url("out").path()},
+                         {"errno", std::int64_t{EINVAL}}}));
 }
 
 TEST_F(ArchiveTest, IsCancelledFromAnotherThread) {
@@ -99,25 +91,20 @@ TEST_F(ArchiveTest, IsCancelledFromAnotherThread) {
   const auto parent = Progress::make(1);
   parent->setObserver([&](double) { std::thread([&] { parent->cancel(); }).join(); });
   const Progress::CurrentScope scope(parent, 1);
-  try {
-    unarchive();
-    FAIL();
-  } catch (const ErrorObject& error) {
-    EXPECT_EQ(error.code(), ArcCopierCancelled);
-  }
+  EXPECT_EQ(thrown<ErrorObject>([&] { unarchive(); }).code(), ArcCopierCancelled);
   EXPECT_TRUE(std::filesystem::is_empty(directory_.path() / "out"));
 }
 
 TEST_F(ArchiveTest, HostsSetTheLimits) {
   write(files(3));
-  const auto before = HostEnvironment::current();
-  auto environment = before;
-  environment.userDefault = [](std::string_view key) {
-    return key == "ArchiveEntryLimit" ? std::optional<std::int64_t>(2) : std::nullopt;
-  };
-  HostEnvironment::setCurrent(environment);
-  EXPECT_THROW(unarchive(), ErrorObject);
-  HostEnvironment::setCurrent(before);
+  {
+    const ChangedHost host([](HostEnvironment& environment) {
+      environment.userDefault = [](std::string_view key) {
+        return key == "ArchiveEntryLimit" ? std::optional<std::int64_t>(2) : std::nullopt;
+      };
+    });
+    EXPECT_THROW(unarchive(), ErrorObject);
+  }
   EXPECT_EQ(unarchive(), "file 0");
 }
 

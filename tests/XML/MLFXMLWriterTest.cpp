@@ -6,6 +6,7 @@
 #include "MarletFoundation/Platform/FileManager.h"
 #include "MarletFoundation/Platform/Text.h"
 #include "MarletFoundation/Platform/XMLParser.h"
+#include "support/Failure.h"
 #include "support/Fatal.h"
 #include "support/Tree.h"
 
@@ -71,11 +72,8 @@ TEST(MLFXMLWriter, RefusesWhatXMLCannotCarryAndASecondRoot) {
     EXPECT_THROW(withElement([&](auto& e) { e.addChildElementWithName(name); }), ErrorObject) << name;
     EXPECT_THROW(withElement([&](auto& e) { e.addChildElementWithName("b", {{name, ""}}); }), ErrorObject);
   }
-  try {
-    withElement([](auto& e) { e.addText("a\x01"); });
-  } catch (const ErrorObject& error) {
-    EXPECT_EQ(error.localizedDescription(), "XML has no form for \"a\\u{01}\".");
-  }
+  const auto error = thrown<ErrorObject>([&] { withElement([](auto& e) { e.addText("a\x01"); }); });
+  EXPECT_EQ(error.localizedDescription(), "XML has no form for \"a\\u{01}\".");
   for (const char* comment : {"a--b", "a-"})
     EXPECT_THROW(withElement([&](auto& e) { e.addComment(comment); }), ErrorObject) << comment;
   EXPECT_EQ(fatalMessage([] {

@@ -6,6 +6,8 @@
 
 #include "MarletFoundation/MarletFoundation.h"
 #include "docs/FormatPage.h"
+#include "support/ChangedHost.h"
+#include "support/Failure.h"
 
 namespace MarletFoundation::test {
 namespace {
@@ -42,22 +44,16 @@ std::string openPacks(const TemporaryDirectory& directory) {
 
 /// Also what is only logged.
 std::string openRecord(const TemporaryDirectory& directory) {
-  const auto former = HostEnvironment::current();
-  auto environment = former;
   std::string logged;
-  environment.diagnostics = [](std::string_view) {};
-  environment.systemLog = [&](std::string_view entry) { logged = entry; };
-  HostEnvironment::setCurrent(environment);
-  std::string answer;
-  try {
+  const ChangedHost host([&](HostEnvironment& environment) {
+    environment.diagnostics = [](std::string_view) {};
+    environment.systemLog = [&](std::string_view entry) { logged = entry; };
+  });
+  const auto answer = failure([&] {
     MarletResultInfoSnapshot(contents(directory, "ResultInfo.plist"),
                              MarletResultInfoSnapshot::Format::ResultInfo);
-    if (!logged.empty()) answer = logged.substr(logged.rfind(' ') + 1);
-  } catch (const Error& error) {
-    answer = error.description();
-  }
-  HostEnvironment::setCurrent(former);
-  return answer;
+  });
+  return logged.empty() ? answer : logged.substr(logged.rfind(' ') + 1);
 }
 
 std::string openStore(const TemporaryDirectory& directory) {
