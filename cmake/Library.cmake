@@ -28,9 +28,10 @@ set_target_properties(MarletFoundation PROPERTIES VERSION ${PROJECT_VERSION} SOV
 target_include_directories(MarletFoundation PUBLIC $<BUILD_INTERFACE:${CMAKE_SOURCE_DIR}>
                                                    $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
 target_compile_features(MarletFoundation PUBLIC cxx_std_20)
-target_compile_definitions(
-  MarletFoundation PRIVATE MARLET_VERSION_STRING="${PROJECT_VERSION}"
-                           MARLET_BUILD_RESOURCES="${CMAKE_SOURCE_DIR}/Resources")
+target_compile_definitions(MarletFoundation PRIVATE MARLET_VERSION_STRING="${PROJECT_VERSION}")
+# A build is laid out as what is installed, so that the library finds its resources in the same way.
+file(MAKE_DIRECTORY ${CMAKE_BINARY_DIR}/share)
+file(CREATE_LINK ${CMAKE_SOURCE_DIR}/Resources ${CMAKE_BINARY_DIR}/share/marlet-foundation SYMBOLIC)
 # The library's own calls of what it exports go straight there.
 target_compile_options(MarletFoundation PRIVATE -fno-semantic-interposition)
 target_link_options(MarletFoundation PRIVATE -Wl,-Bsymbolic-functions

@@ -37,8 +37,8 @@ bool isDirectory(const URL& url) {
   }
 }
 
-/// The resources of an installed library lie in the prefix that it was installed to, one or, where the system
-/// has a directory for each architecture, two directories up.
+/// The resources lie in the prefix that the library was installed to, or built in, one or, where the system has a
+/// directory for each architecture, two directories up.
 std::optional<URL> installedResources() {
   Dl_info library{};
   if (!::dladdr(reinterpret_cast<const void*>(&installedResources), &library) || !library.dli_fname) {
@@ -57,9 +57,7 @@ std::optional<URL> findResources() {
   if (const char* path = std::getenv("MARLET_RESOURCES"); path && *path) {
     if (auto named = URL::file(path, true); isDirectory(named)) return named;
   }
-  if (auto installed = installedResources()) return installed;
-  if (auto built = URL::file(MARLET_BUILD_RESOURCES, true); isDirectory(built)) return built;
-  return std::nullopt;
+  return installedResources();
 }
 
 std::optional<std::int64_t> userDefaultFromEnvironment(std::string_view key) {

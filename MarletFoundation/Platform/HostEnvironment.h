@@ -20,8 +20,8 @@ struct MARLET_EXPORT HostEnvironment {
   /// The shared container of an app group, or nothing. Default: a directory of that name in the support
   /// directory.
   std::function<std::optional<URL>(std::string_view identifier)> groupContainer;
-  /// Where "Targets" and "Toolchain" lie. Default: MARLET_RESOURCES, else the installed resources beside the
-  /// library, else those of the source tree that it was built from.
+  /// Where "Targets" and "Toolchain" lie. Default: MARLET_RESOURCES, else those installed, or built, with the
+  /// library.
   std::optional<URL> resourcesDirectory;
   /// The integer under a user-default key, or nothing. Default: the environment variable
   /// MARLET_DEFAULTS_<key>.
