@@ -48,7 +48,10 @@ std::size_t commonSuffix(std::u16string_view a, std::u16string_view b) {
   return length;
 }
 
-enum class Level { lines, words, characters };
+enum class Level { lines, stretches, words, characters };
+
+/// From this length on, units, a part is compared by stretches of words before it is by words.
+constexpr std::uint32_t longPart = 1 << 14;
 
 class ContentDiff {
  public:
@@ -72,12 +75,15 @@ class ContentDiff {
 
  private:
   static bool isEmpty(const Change& c) { return c.original == c.originalEnd && c.modified == c.modifiedEnd; }
+  static Level levelBelow(Level level, const Change& change);
+  static bool replaces(const Change& c) { return c.original < c.originalEnd && c.modified < c.modifiedEnd; }
 
   Change withoutEqualLines() const;
   void compare(const Change& part, Level level);
   void add(const Change& change, Level level);
   void joinTouching();
-  Change trimmed(Change change);
+  Change trimmed(Change change, Level level);
+  static bool startsToken(Text& text, std::size_t offset, Level level);
   DiffDescriptor descriptor(const Change& change) const;
 
   static void cut(Text& text, std::uint32_t start, std::uint32_t end, Level level, Tokens& tokens);
@@ -94,7 +100,7 @@ class ContentDiff {
   bool smallerHunks_;
   std::int64_t budget_;
   TokenNumbers numbers_;
-  std::array<Workspace, 3> workspaces_;
+  std::array<Workspace, 4> workspaces_;
   std::vector<Change> changes_;
 };
 
@@ -114,6 +120,8 @@ void ContentDiff::cut(Text& text, std::uint32_t start, std::uint32_t end, Level 
   switch (level) {
     case Level::lines:
       return tokens.cutLines(start, end);
+    case Level::stretches:
+      return tokens.cutStretches(start, end);
     case Level::words:
       return tokens.cutWords(text.characters, start, end);
     case Level::characters:
@@ -129,22 +137,31 @@ void ContentDiff::compare(const Change& part, Level level) {
   numbers_.number(original, modified);
   const auto& changes = comparison.changes(original.numbers, modified.numbers, numbers_.size(), budget_);
   for (const auto& change : changes) {
-    add({original.starts[change.original], original.starts[change.originalEnd],
-         modified.starts[change.modified], modified.starts[change.modifiedEnd]},
-        level);
+    Change inside{original.starts[change.original], original.starts[change.originalEnd],
+                  modified.starts[change.modified], modified.starts[change.modifiedEnd]};
+    // What took the place of as many tokens mostly has all words but a few in common with them. Where there are more
+    // on one side, words can't tell at which end those are.
+    const bool isAsMany = change.originalEnd - change.original == change.modifiedEnd - change.modified;
+    if (smallerHunks_ && level < Level::words && isAsMany) inside = trimmed(inside, Level::words);
+    add(inside, level);
   }
 }
 
 /// Adds a change that was found at a level, or what it comes to at the levels below.
 void ContentDiff::add(const Change& change, Level level) {
-  const bool replaces = change.original < change.originalEnd && change.modified < change.modifiedEnd;
-  if (!smallerHunks_ || !replaces) {
+  if (!smallerHunks_ || !replaces(change)) {
     changes_.push_back(change);
   } else if (level == Level::characters || budget_ <= 0) {
-    changes_.push_back(trimmed(change));
+    changes_.push_back(trimmed(change, Level::characters));
   } else {
-    compare(change, level == Level::lines ? Level::words : Level::characters);
+    compare(change, levelBelow(level, change));
   }
+}
+
+Level ContentDiff::levelBelow(Level level, const Change& change) {
+  if (level == Level::words) return Level::characters;
+  const auto length = std::min(change.originalEnd - change.original, change.modifiedEnd - change.modified);
+  return level == Level::lines && length >= longPart ? Level::stretches : Level::words;
 }
 
 void ContentDiff::joinTouching() {
@@ -157,17 +174,17 @@ void ContentDiff::joinTouching() {
     auto& last = joined.back();
     last.originalEnd = change.originalEnd;
     last.modifiedEnd = change.modifiedEnd;
-    if (smallerHunks_) last = trimmed(last);
+    if (smallerHunks_) last = trimmed(last, Level::characters);
   }
   changes_ = std::move(joined);
 }
 
-/// The change without the whole characters that both its texts start and end with.
-Change ContentDiff::trimmed(Change change) {
+/// The change without the whole words, or characters, that both its texts start and end with.
+Change ContentDiff::trimmed(Change change, Level level) {
   const auto a = original_.view.substr(change.original, change.originalEnd - change.original);
   const auto b = modified_.view.substr(change.modified, change.modifiedEnd - change.modified);
   const auto bothStartAt = [&](std::size_t offset, std::size_t otherOffset) {
-    return original_.characters.startAt(offset) && modified_.characters.startAt(otherOffset);
+    return startsToken(original_, offset, level) && startsToken(modified_, otherOffset, level);
   };
   auto prefix = static_cast<std::uint32_t>(commonPrefix(a, b));
   while (prefix > 0 && !bothStartAt(change.original + prefix, change.modified + prefix)) --prefix;
@@ -175,6 +192,13 @@ Change ContentDiff::trimmed(Change change) {
   while (suffix > 0 && !bothStartAt(change.originalEnd - suffix, change.modifiedEnd - suffix)) --suffix;
   return {change.original + prefix, change.originalEnd - suffix, change.modified + prefix,
           change.modifiedEnd - suffix};
+}
+
+bool ContentDiff::startsToken(Text& text, std::size_t offset, Level level) {
+  if (!text.characters.startAt(offset)) return false;
+  const bool isWithin = offset > 0 && offset < text.view.size();
+  return level == Level::characters || !isWithin || !isWordUnit(text.view[offset - 1]) ||
+         !isWordUnit(text.view[offset]);
 }
 
 DiffDescriptor ContentDiff::descriptor(const Change& change) const {

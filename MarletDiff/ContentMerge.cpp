@@ -197,6 +197,11 @@ std::u16string mergeContent(std::u16string_view base, Hunks diff, Hunks otherDif
   };
 
   std::u16string merged;
+  auto longest = base.size();
+  for (const auto hunks : {diff, otherDiff}) {
+    for (const auto& hunk : hunks) longest += hunk.modifiedContent.size();
+  }
+  merged.reserve(longest);
   std::int64_t copied = 0;
   while (auto* next = first()) {
     Cluster cluster(base, next->next()->originalRange.location);

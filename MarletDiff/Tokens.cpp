@@ -46,6 +46,8 @@ const std::uint64_t seed = [] {
   return (std::uint64_t{device()} << 32 | device()) | 1;
 }();
 
+constexpr std::uint64_t hashConstants[] = {0x9E3779B97F4A7C15, 0xC2B2AE3D27D4EB4F};
+
 std::uint64_t mixed(std::uint64_t a, std::uint64_t b) {
   __extension__ using Wide = unsigned __int128;
   const Wide product = static_cast<Wide>(a) * b;
@@ -70,6 +72,21 @@ void Tokens::cutLines(std::uint32_t start, std::uint32_t end) {
     if (endsLine(text[at])) endAt(at);
   }
   if (starts.back() != end) starts.push_back(end);
+}
+
+void Tokens::cutStretches(std::uint32_t start, std::uint32_t end) {
+  constexpr std::uint32_t beside = 4;
+  starts.assign(1, start);
+  for (auto at = start + beside; at + beside <= end; ++at) {
+    const char16_t before = text[at - 1], after = text[at];
+    const bool startsWord = isWordUnit(after) & !isWordUnit(before);
+    if (!startsWord || (before | after) >= 0x80) continue;
+    std::uint64_t left, right;
+    std::memcpy(&left, &text[at - beside], sizeof left);
+    std::memcpy(&right, &text[at], sizeof right);
+    if (mixed(left ^ hashConstants[0], right ^ hashConstants[1]) % 16 == 0) starts.push_back(at);
+  }
+  starts.push_back(end);
 }
 
 void Tokens::cutWords(Characters& characters, std::uint32_t start, std::uint32_t end) {
@@ -165,12 +182,11 @@ TokenNumbers::Slot& TokenNumbers::slot(std::u16string_view token, std::uint64_t 
 }
 
 std::uint64_t TokenNumbers::hash(std::u16string_view token) {
-  constexpr std::uint64_t first = 0x9E3779B97F4A7C15, second = 0xC2B2AE3D27D4EB4F;
   const auto* bytes = reinterpret_cast<const char*>(token.data());
   const auto size = token.size() * sizeof(char16_t);
   std::uint64_t result = seed ^ size;
   std::uint64_t words[2] = {0, 0};
-  const auto mix = [&] { result = mixed(words[0] ^ first ^ result, words[1] ^ second); };
+  const auto mix = [&] { result = mixed(words[0] ^ hashConstants[0] ^ result, words[1] ^ hashConstants[1]); };
   std::size_t at = 0;
   for (; at + sizeof words < size; at += sizeof words) {
     std::memcpy(words, bytes + at, sizeof words);

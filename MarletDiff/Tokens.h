@@ -22,6 +22,9 @@ struct Tokens {
 
   /// Cuts into lines with their ends.
   void cutLines(std::uint32_t start, std::uint32_t end);
+  /// Cuts into stretches of about 16 words. Where one starts depends on nothing but the units beside that place, so
+  /// that equal texts are cut alike wherever they stand.
+  void cutStretches(std::uint32_t start, std::uint32_t end);
   /// Cuts into words, and every other character by itself.
   void cutWords(Characters& characters, std::uint32_t start, std::uint32_t end);
   void cutCharacters(Characters& characters, std::uint32_t start, std::uint32_t end);

@@ -75,6 +75,23 @@ TEST(ContentDiff, LeadsThroughSmallChangesOfAText) {
   }));
 }
 
+/// Long lines are not compared by words at once.
+TEST(ContentDiff, LeadsThroughSmallChangesOfALongLine) {
+  constexpr std::u16string_view words = u"foo f(x) /*#-e*/ \u00e9t\u00e9 a_1 ";
+  std::u16string line;
+  for (std::size_t i = 0; i < 4000; ++i) line += words.substr(i * i % 23);
+  EXPECT_TRUE(rc::check([&] {
+    auto edited = line;
+    const auto places =
+        *rc::gen::container<std::vector<std::size_t>>(rc::gen::inRange<std::size_t>(0, 40000));
+    for (const auto place : places)
+      edited.replace(place, *rc::gen::inRange<std::size_t>(0, 60), *similarText());
+    expectLaws(line, edited);
+  }));
+  const auto edited = std::u16string(line).replace(20000, 0, u"new ").replace(30000, 3, u"");
+  EXPECT_LE(diffContent(line, edited, smaller).size(), 3u);
+}
+
 TEST(ContentDiff, HunksAreLinesOrSmaller) {
   struct {
     std::u16string original, modified;
