@@ -75,7 +75,7 @@ class ContentDiff {
 
  private:
   static bool isEmpty(const Change& c) { return c.original == c.originalEnd && c.modified == c.modifiedEnd; }
-  static Level levelBelow(Level level, const Change& change);
+  Level levelBelow(Level level, const Change& change) const;
   static bool replaces(const Change& c) { return c.original < c.originalEnd && c.modified < c.modifiedEnd; }
 
   Change withoutEqualLines() const;
@@ -158,8 +158,14 @@ void ContentDiff::add(const Change& change, Level level) {
   }
 }
 
-Level ContentDiff::levelBelow(Level level, const Change& change) {
-  if (level == Level::words) return Level::characters;
+Level ContentDiff::levelBelow(Level level, const Change& change) const {
+  const auto isOneWord = [](std::u16string_view text, std::uint32_t start, std::uint32_t end) {
+    return std::all_of(text.begin() + start, text.begin() + end, isWordUnit);
+  };
+  if (level == Level::words || (isOneWord(original_.view, change.original, change.originalEnd) &&
+                                isOneWord(modified_.view, change.modified, change.modifiedEnd))) {
+    return Level::characters;
+  }
   const auto length = std::min(change.originalEnd - change.original, change.modifiedEnd - change.modified);
   return level == Level::lines && length >= longPart ? Level::stretches : Level::words;
 }
