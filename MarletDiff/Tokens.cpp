@@ -79,8 +79,7 @@ void Tokens::cutStretches(std::uint32_t start, std::uint32_t end) {
   starts.assign(1, start);
   for (auto at = start + beside; at + beside <= end; ++at) {
     const char16_t before = text[at - 1], after = text[at];
-    const bool startsWord = isWordUnit(after) & !isWordUnit(before);
-    if (!startsWord || (before | after) >= 0x80) continue;
+    if (isWordUnit(before) || !isWordUnit(after) || after >= 0x80) continue;
     std::uint64_t left, right;
     std::memcpy(&left, &text[at - beside], sizeof left);
     std::memcpy(&right, &text[at], sizeof right);
