@@ -75,12 +75,12 @@ class ContentDiff {
 
  private:
   static bool isEmpty(const Change& c) { return c.original == c.originalEnd && c.modified == c.modifiedEnd; }
-  Level levelBelow(Level level, const Change& change) const;
   static bool replaces(const Change& c) { return c.original < c.originalEnd && c.modified < c.modifiedEnd; }
 
   Change withoutEqualLines() const;
   void compare(const Change& part, Level level);
   void add(const Change& change, Level level);
+  Level levelBelow(Level level, const Change& change) const;
   void joinTouching();
   Change trimmed(Change change, Level level);
   static bool startsToken(Text& text, std::size_t offset, Level level);
