@@ -122,10 +122,10 @@ PropertyListObjectPointer anyObject(int depth) {
 }
 
 TEST(JSON, ReadsWhatItWrote) {
-  rc::check([] {
+  EXPECT_TRUE(rc::check([] {
     const auto object = anyObject(3);
     RC_ASSERT(JSON(Data(JSONSerialization::write(*object))) == JSON(*object));
-  });
+  }));
 }
 
 }  // namespace

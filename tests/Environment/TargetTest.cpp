@@ -38,7 +38,7 @@ TEST(Target, LoadsWhatItsDirectorySays) {
   EXPECT_TRUE(target->targetTripleForHostArchitecture().ends_with("-quorvex-slateos10.0"));
   const auto paths = target->librarySearchPath().searchPaths();
   ASSERT_EQ(paths.size(), 4u);
-  EXPECT_EQ(paths[0].path(), url.path() + "/Tools/usr/lib");
+  EXPECT_EQ(paths[0], url.appendingPathComponent("Tools/usr/lib", true));
   const auto& global = *Toolchain::globalToolchain();
   EXPECT_EQ(paths[2], global.librarySearchPath().searchPaths()[0]);
   EXPECT_EQ(global.effectiveLibrarySearchPath(), global.librarySearchPath());

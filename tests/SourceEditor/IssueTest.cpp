@@ -95,7 +95,7 @@ Issue anyIssue(int depth) {
 }
 
 TEST(Issue, ReadsWhatItWrote) {
-  rc::check([] {
+  EXPECT_TRUE(rc::check([] {
     const auto issue = anyIssue(2);
     const auto value = issue.propertyListValue();
     RC_ASSERT(Issue(value) == issue);
@@ -103,7 +103,7 @@ TEST(Issue, ReadsWhatItWrote) {
       RC_ASSERT(value.dictionary()->contains(key));
     RC_ASSERT(value.dictionary()->contains("identifier") == issue.identifier.has_value());
     RC_ASSERT(value.dictionary()->contains("location") == issue.location.has_value());
-  });
+  }));
   EXPECT_EQ(Issue(Issue::Severity::Warning, std::nullopt, "unused variable").description(),
             "<Issue:Warning:unused variable>");
 }

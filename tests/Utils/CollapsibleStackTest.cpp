@@ -70,7 +70,7 @@ void expectSame(const Stack& stack, const Naive& naive) {
 }
 
 TEST(CollapsibleStack, DoesAsANaiveOneUnderRandomOperations) {
-  rc::check([] {
+  EXPECT_TRUE(rc::check([] {
     Stack stack;
     Naive naive;
     const auto steps = *rc::gen::container<std::vector<int>>(rc::gen::inRange(0, 100));
@@ -109,7 +109,7 @@ TEST(CollapsibleStack, DoesAsANaiveOneUnderRandomOperations) {
       }
       expectSame(stack, naive);
     }
-  });
+  }));
 }
 
 TEST(CollapsibleStack, OfAMillionEntriesGoesWithoutUsingUpTheStack) {
