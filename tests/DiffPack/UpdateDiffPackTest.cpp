@@ -161,6 +161,8 @@ TEST_F(UpdateDiffPack, MergeFailsInAFixedOrderAndChangesNothing) {
   EXPECT_EQ(merge(url, updatePack({{FileDiff::Modified{"Resources"}}})), "Diff 1: Missing file Resources");
   EXPECT_TRUE(merge(url, updatePack({{FileDiff::Modified{page, {{{0, 1}, {}, u"x", u"y"}}}}}))
                   .starts_with("MarletDiff 4: "));
+  EXPECT_TRUE(merge(url, updatePack({{FileDiff::Modified{page, {{{0, 0}, {}, u"", u"\xD800"}}}}}))
+                  .starts_with("POSIX " + std::to_string(EILSEQ) + ": "));
   for (const auto& [path, contents] : before) {
     EXPECT_EQ(snapshotOf(directory_.path()).at(path), contents) << path;
   }

@@ -93,18 +93,27 @@ TEST_F(ArchiveTest, IsCancelledFromAnotherThread) {
   const Progress::CurrentScope scope(parent, 1);
   EXPECT_EQ(thrown<ErrorObject>([&] { unarchive(); }).code(), ArcCopierCancelled);
   EXPECT_TRUE(std::filesystem::is_empty(directory_.path() / "out"));
+
+  MLFUnzipCopier copier;
+  copier.cancel();
+  const auto unzip = [&] {
+    return copier.unzip((directory_.path() / "a.zip").string(), (directory_.path() / "again").string(),
+                        nullptr);
+  };
+  EXPECT_FALSE(unzip());
+  EXPECT_TRUE(unzip()) << "a run is cancelled once";
 }
 
 TEST_F(ArchiveTest, HostsSetTheLimits) {
   write(files(3));
-  {
-    const ChangedHost host([](HostEnvironment& environment) {
-      environment.userDefault = [](std::string_view key) {
-        return key == "ArchiveEntryLimit" ? std::optional<std::int64_t>(2) : std::nullopt;
-      };
-    });
-    EXPECT_THROW(unarchive(), ErrorObject);
-  }
+  std::int64_t limit = 2;
+  const ChangedHost host([&](HostEnvironment& environment) {
+    environment.userDefault = [&](std::string_view key) {
+      return key == "ArchiveEntryLimit" ? std::optional(limit) : std::nullopt;
+    };
+  });
+  EXPECT_THROW(unarchive(), ErrorObject);
+  limit = 0;  // none
   EXPECT_EQ(unarchive(), "file 0");
 }
 
