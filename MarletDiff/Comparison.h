@@ -20,8 +20,8 @@ struct Change {
 class Comparison {
  public:
   /// The changes that lead from one list to the other, ascending, with an equal token between any two of
-  /// them. A number is less than `numbers`, or that itself for a modified token without a partner. Takes its work off `budget`; where that ends, a change takes
-  /// in all that isn't compared yet.
+  /// them. A number is less than `numbers`, or that itself for a modified token without a partner. Takes its
+  /// work off `budget`; where that ends, a change takes in all that isn't compared yet.
   const std::vector<Change>& changes(std::span<const std::uint32_t> original,
                                      std::span<const std::uint32_t> modified, std::size_t numbers,
                                      std::int64_t& budget);

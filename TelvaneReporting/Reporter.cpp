@@ -23,7 +23,7 @@ using namespace MarletFoundation;
 URL directory() {
   const auto& support = HostEnvironment::current().applicationSupportDirectory;
   if (!support) throw ErrorObject::posix(ENOENT, "application support");
-  auto url = support->appendingPathComponent("TelvaneReporting", true);
+  auto url = support->appendingPathComponent("TelvaneReporting");
   std::error_code failure;
   std::filesystem::create_directories(url.path(), failure);
   return url;

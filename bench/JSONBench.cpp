@@ -1,5 +1,5 @@
-/// Reading JSON into values, beside simdjson's own document over the same bytes: a parser that leaves strings and numbers
-/// where they stand, so the ratio shows what values of one's own cost.
+/// Reading JSON into values, beside simdjson's own document over the same bytes: a parser that leaves strings
+/// and numbers where they stand, so the ratio shows what values of one's own cost.
 
 #include <benchmark/benchmark.h>
 #include <simdjson.h>

@@ -2,7 +2,7 @@
 
 #include <gtest/gtest.h>
 
-#include "MarletFoundation/Platform/FileManager.h"
+#include "MarletFoundation/Platform/Host.h"
 #include "support/Tree.h"
 
 namespace MarletFoundation::test {
@@ -78,6 +78,8 @@ TEST(TargetRegistry, BundledTargetsAreThereAndOthersAreAddedOnce) {
   ASSERT_TRUE(Target::targetWithIdentifier("slateos"));
   ASSERT_TRUE(Target::targetWithIdentifier("desk"));
   EXPECT_FALSE(Target::targetWithIdentifier("slate"));
+  const auto desk = libraryResourcesURL()->appendingPathComponent("Targets/desk.target", true);
+  EXPECT_EQ(Target::loadFrom(desk, false), Target::targetWithIdentifier("desk"));
   const auto bundled = Target::allTargets();
   EXPECT_LT(std::find(bundled.begin(), bundled.end(), Target::targetWithIdentifier("desk")),
             std::find(bundled.begin(), bundled.end(), Target::targetWithIdentifier("slateos")));

@@ -65,7 +65,8 @@ TEST(WithoutMemory, Readers) {
 TEST(WithoutMemory, TagsAndDiffs) {
   const std::u16string source =
       u"//#-editable-code Tap here to write\nlet x = 1\n//#-end-editable-code\n"
-      u"//#-code-completion(everything, hide)\n//#-hidden-code\n//#-unknown\nlet y = /*#-editable-code y*/2/*#-end-editable-code*/\n";
+      u"//#-code-completion(everything, hide)\n//#-hidden-code\n//#-unknown\n"
+      u"let y = /*#-editable-code y*/2/*#-end-editable-code*/\n";
   expectNothingWrongWithoutMemory("tags", [&] { return SourceTag::parseStringForValidTags(source); });
   const std::u16string left = u"one two three\nfour\nfive six\n" + source,
                        right = source + u"seven\neight nine\n";

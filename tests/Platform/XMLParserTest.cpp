@@ -138,7 +138,8 @@ TEST(XMLParser, anAbortEndsTheParse) {
   parser.delegate = &recorder;
   EXPECT_FALSE(parser.parse());
   EXPECT_EQ(recorder.events, "<a>\n<b>");
-  EXPECT_TRUE(parser.parserError());
+  ASSERT_TRUE(parser.parserError());
+  EXPECT_EQ(parser.parserError()->localizedDescription(), "The parse was aborted.");
   recorder.abortAt.clear();
   EXPECT_TRUE(parser.parse());
   EXPECT_FALSE(parser.parserError());

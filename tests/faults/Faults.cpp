@@ -1,7 +1,7 @@
-/// Preloaded into a command, lets one of its calls to the file system go wrong. $FAULT_AT counts the calls that can go wrong so, from
-/// 1; $FAULT is `error` (EIO), `short` (a write of one byte less) or `exit` (the process ends ahead of the call).
-/// $NO_EXCHANGE makes the file system one that can't exchange two names. The number of calls made goes to
-/// $FAULT_COUNT, a file.
+/// Preloaded into a command, lets one of its calls to the file system go wrong. $FAULT_AT counts the calls that
+/// can go wrong so, from 1; $FAULT is `error` (EIO), `short` (a write of one byte less) or `exit` (the process
+/// ends ahead of the call). $NO_EXCHANGE makes the file system one that can't exchange two names. The number of
+/// calls made goes to $FAULT_COUNT, a file.
 
 #include <dlfcn.h>
 #include <fcntl.h>
@@ -34,7 +34,8 @@ Function next(Function, const char* name) {
 
 enum class Call { look, change, write };
 
-/// Whether the fault that is asked for can befall a call. A process that ends at a look might as well end at the change after it.
+/// Whether the fault that is asked for can befall a call. A process that ends at a look might as well end at the
+/// change after it.
 bool counts(Call call) {
   static const std::string_view fault = setting("FAULT");
   return fault == "short" ? call == Call::write : fault == "exit" ? call != Call::look : true;

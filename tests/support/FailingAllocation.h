@@ -22,9 +22,9 @@ class FailingAllocation {
 /// How many allocations this thread has made since the last call.
 long takeAllocationCount();
 
-/// Lets the allocations of `work` fail, one after the other: it must throw an `Error` or `std::bad_alloc`, or give what it
-/// gives otherwise, and nothing may stay behind that changes what it gives afterwards. Of more than `most` allocations only
-/// some fail, spread evenly.
+/// Lets the allocations of `work` fail, one after the other: it must throw an `Error` or `std::bad_alloc`, or
+/// give what it gives otherwise, and nothing may stay behind that changes what it gives afterwards. Of more than
+/// `most` allocations only some fail, spread evenly.
 template <class Work>
 void expectNothingWrongWithoutMemory(const char* name, Work work, long most = 500) {
   SCOPED_TRACE(name);
