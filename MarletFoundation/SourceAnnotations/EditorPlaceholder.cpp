@@ -68,11 +68,9 @@ std::optional<TextRange> matchRange(const TextRange& openingRange,
 
 std::vector<EditorPlaceholder> parseStringForPlaceholders(std::u16string_view text) {
   std::vector<EditorPlaceholder> placeholders;
-  const auto closings = rangesOfString(closing, text);
-  if (closings.empty()) return placeholders;
   const auto openings = rangesOfString(opening, text);
   std::size_t next = 0;
-  for (const auto& end : closings) {
+  for (const auto& end : rangesOfString(closing, text)) {
     for (; next < openings.size() && openings[next].location < end.location; ++next) {
       const auto following =
           next + 1 < openings.size() ? std::optional<TextRange>(openings[next + 1]) : std::nullopt;

@@ -53,6 +53,7 @@ TEST(Result, CarriesAValueOrTheVeryError) {
 
   const auto foreign = catchResult([]() -> int { throw std::out_of_range("far"); });
   EXPECT_EQ(foreign.failure()->description(), "far");
+  EXPECT_EQ(foreign.failure()->code(), 0);
   EXPECT_THROW(foreign.get(), std::out_of_range);
   EXPECT_THROW(catchResult([] { throw 5; }).get(), int);
 }

@@ -48,9 +48,12 @@ class DerivedData : public testing::Test {
 
 TEST_F(DerivedData, IsWipedWhereAnotherVersionMadeIt) {
   const DerivedDataManager first;
-  EXPECT_EQ(first.moduleCacheURL.path(),
-            directory_.url("group.CompilerDerivedData/Library/Caches/ModuleCache").path());
-  EXPECT_EQ(first.privateDerivedDataURL.path(), directory_.url("support/PrivateDerivedData").path());
+  const auto container = directory_.url("group.CompilerDerivedData");
+  EXPECT_EQ(first.moduleCacheURL, container.appendingPathComponent("Library/Caches/ModuleCache", true));
+  EXPECT_EQ(first.codeCompletionCacheURL,
+            container.appendingPathComponent("Library/Caches/CodeCompletionCache", true));
+  EXPECT_EQ(first.privateDerivedDataURL,
+            directory_.url("support").appendingPathComponent("PrivateDerivedData", true));
   const auto good = *PropertyListSerialization::read(FileManager::readFile(info())).dictionary();
   EXPECT_EQ(good,
             (PropertyListDictionary{{"MarletFoundationVersion", MarletFoundationVersionString},

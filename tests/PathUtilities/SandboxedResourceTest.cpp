@@ -144,11 +144,13 @@ TEST_F(SandboxedResource, IsRefusedForLinksAndWhatIsNotThere) {
     return thrown<ErrorObject>([&] { MLFSandboxedResource resource(directory_.url(name)); });
   };
   const auto link = failure("link");
+  EXPECT_EQ(link.code(), 1);
   EXPECT_EQ(link.localizedDescription(), "Unable to create sandbox extension for symlink");
   EXPECT_EQ(link.localizedFailureReason(),
             "Sandbox extensions cannot be issued for symlinks for security purposes.");
   const auto missing = failure("missing");
   EXPECT_EQ(missing.domain(), MarletFoundationErrorDomain);
+  EXPECT_EQ(missing.code(), 0);
   EXPECT_EQ(missing.localizedDescription(), "Unable to determine if file is a symlink");
   EXPECT_EQ(missing.underlyingError()->code(), ENOENT);
   // Of another machine, though a file here has the same path.
