@@ -67,7 +67,7 @@ void MLFXMLWriter::writeXMLToURL(const URL& url, const MLFXMLDocumentWriter& doc
 }
 
 void MLFXMLWriter::writeXMLToFile(std::string_view path, const MLFXMLDocumentWriter& documentWriter) {
-  writeXMLToURL(URL::file(path, false), documentWriter);
+  writeXMLToURL(URL::file(path), documentWriter);
 }
 
 MLFXMLWriter::MLFXMLWriter() {

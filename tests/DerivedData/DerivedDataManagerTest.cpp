@@ -131,7 +131,12 @@ TEST_F(DerivedData, WhatStandsInTheWayIsReported) {
       0u);
 }
 
-TEST_F(DerivedData, WithoutAContainerIsFatal) {
+TEST_F(DerivedData, WithoutItsPlacesIsFatal) {
+  environment_.applicationSupportDirectory = std::nullopt;
+  HostEnvironment::setCurrent(environment_);
+  EXPECT_EQ(fatalMessage([] { DerivedDataManager manager; }),
+            "Unable to get the private derived data URL: " +
+                ErrorObject::posix(ENOENT, "application support").description());
   environment_.groupContainer = [](std::string_view) { return std::nullopt; };
   HostEnvironment::setCurrent(environment_);
   EXPECT_EQ(fatalMessage([] { DerivedDataManager manager; }),
