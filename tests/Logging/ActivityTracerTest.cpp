@@ -10,6 +10,7 @@
 #include "MarletFoundation/Logging/UserDefaultBoolKey.h"
 #include "MarletFoundation/Platform/HostEnvironment.h"
 #include "support/ChangedHost.h"
+#include "support/Failure.h"
 #include "support/Tree.h"
 
 namespace MarletFoundation::test {
@@ -109,7 +110,8 @@ TEST_F(ActivityTracerTest, SpoolStaysBounded) {
   ASSERT_TRUE(failure);
   EXPECT_EQ(failure->code(), EISDIR);
   reporting.finishSession();
-  EXPECT_THROW(reporting.sendMessage(1, 1, StringObject("x")), ErrorObject);
+  EXPECT_EQ(thrown<ErrorObject>([&] { reporting.sendMessage(1, 1, StringObject("x")); }).domain(),
+            "TelvaneReporting");
 }
 
 TEST_F(ActivityTracerTest, IdentifiersPersistUntilRegenerated) {
