@@ -2,8 +2,10 @@
 
 #include <gtest/gtest.h>
 
+#include <array>
 #include <atomic>
 #include <chrono>
+#include <functional>
 #include <latch>
 #include <memory>
 #include <stdexcept>
@@ -241,43 +243,21 @@ TEST(DispatchQueue, Stress) {
     ++sharedCount;
   };
   const auto count = [&] { ++serialCount; };
+  const std::array<std::function<void(int)>, 9> steps{
+      [&](int) { serial.async(count); },
+      [&](int) { serial.sync(count); },
+      [&](int) { shared.sync(read); },
+      [&](int) { shared.async(read); },
+      [&](int) { shared.asyncBarrier(write); },
+      [&](int) { shared.syncBarrier(write); },
+      [&](int) { serial.sync([&] { shared.sync(read), ++serialCount; }); },
+      [&](int) { serial.async([&] { shared.syncBarrier(write), ++serialCount; }); },
+      [&](int i) { serial.asyncAfter(0.0001 * (i % 10), [&] { ++serialCount, ++delayed; }); },
+  };
   std::vector<std::thread> all;
   for (int t = 0; t < threads; ++t) {
     all.emplace_back([&, t] {
-      for (int i = 0; i < rounds; ++i) {
-        switch ((i * 7 + t) % 9) {
-          case 0:
-            serial.async(count);
-            break;
-          case 1:
-            serial.sync(count);
-            break;
-          case 2:
-            shared.sync(read);
-            break;
-          case 3:
-            shared.async(read);
-            break;
-          case 4:
-            shared.asyncBarrier(write);
-            break;
-          case 5:
-            shared.syncBarrier(write);
-            break;
-          case 6:
-            serial.sync([&] { shared.sync(read), ++serialCount; });
-            break;
-          case 7:
-            serial.async([&] { shared.syncBarrier(write), ++serialCount; });
-            break;
-          case 8:
-            serial.asyncAfter(0.0001 * (i % 10), [&] {
-              ++serialCount;
-              ++delayed;
-            });
-            break;
-        }
-      }
+      for (int i = 0; i < rounds; ++i) steps[static_cast<std::size_t>(i * 7 + t) % steps.size()](i);
     });
   }
   for (auto& thread : all) thread.join();

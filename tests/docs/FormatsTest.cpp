@@ -139,28 +139,6 @@ INSTANTIATE_TEST_SUITE_P(, Formats,
                            return name;
                          });
 
-TEST(FormatExamples, Book) {
-  const TemporaryDirectory directory;
-  FormatPage("book.md").example().writeTo(directory.path());
-  const auto url = directory.url("Tides.marletbook");
-  const MarletBookSnapshot book(FileWrapper(url), url);
-  EXPECT_EQ(book.name, "Tides");
-  EXPECT_EQ(book.contentVersion.versionString(), "1.0.0");
-  EXPECT_EQ(book.imageReference, "Tide.svg");
-  ASSERT_EQ(book.chapters.size(), 1u);
-  EXPECT_EQ(book.chapters[0].filename, "Moon");
-  ASSERT_EQ(book.chapters[0].pages.size(), 2u);
-  EXPECT_EQ(book.chapters[0].pages[0].name, "The sea");
-  const auto pageURL = url.appendingPathComponent("Contents/Chapters/Moon/Pages/Pull.marletpage", true);
-  const MarletBookPageSnapshot page(FileWrapper(pageURL), pageURL, std::nullopt);
-  EXPECT_EQ(page.liveViewMode(), LiveViewMode::HiddenByDefault);
-  const std::vector<MarletHint> hints{
-      {MarletHint::Contents{"Look up at night."}, MarletHint::AlwaysVisible{}},
-      {MarletHint::FileReference{"It is the *moon*.\n", "Pull.md"},
-       MarletHint::HiddenWithSpoilerInstruction{"Show me"}}};
-  EXPECT_EQ(page.hints(), hints);
-}
-
 /// The update goes into the book under the learner's edits.
 TEST(FormatExamples, DiffPack) {
   const TemporaryDirectory directory;
@@ -197,43 +175,6 @@ TEST(FormatExamples, ResultInfo) {
                                           MarletResultInfoSnapshot::Format::LegacyInlineResultsTimeline);
   const Record::VisibleState small = Record::Visible{Record::AtMost{240, 120}, Record::DisplayMode::graph};
   EXPECT_EQ(timeline.inlineResults(), (InlineResults{{3, Record(3, 12, small)}}));
-}
-
-TEST(FormatExamples, KeyValueStore) {
-  const TemporaryDirectory directory;
-  FormatPage("key-value-store.md").example().writeTo(directory.path());
-  const MarletKeyValueStoreSnapshot store(contents(directory, "KeyValueStore.plist"));
-  EXPECT_EQ(
-      description(store.contents()),
-      R"(dictionary(["beaches": array([string("North"), string("South")]), "highest": floatingPoint(4.2), )"
-      R"("seen": date(495478800), "sound": boolean(true)]))");
-}
-
-TEST(FormatExamples, Target) {
-  const TemporaryDirectory directory;
-  FormatPage("target.md").example().writeTo(directory.path());
-  const auto url = directory.url("wrist.target");
-  const auto target = Target::loadFrom(url, false);
-  ASSERT_TRUE(target);
-  EXPECT_EQ(target->identifier, "wrist");
-  EXPECT_EQ(target->targetTriple("x86_64"), "x86_64-quorvex-wristos3.0");
-  EXPECT_EQ(target->executableSearchPath.searchPaths()[1].path(), url.path() + "/SDK/usr/bin");
-  EXPECT_EQ(target->librarySearchPath().searchPaths()[0].path(), url.path() + "/Toolchain/usr/lib");
-}
-
-TEST(FormatExamples, Classic) {
-  const TemporaryDirectory directory;
-  FormatPage("classic.md").example().writeTo(directory.path());
-  const auto url = directory.url("Tides.marlet"), oldURL = directory.url("Old.marlet");
-  const MarletSnapshot marlet(FileWrapper(url), url), old(FileWrapper(oldURL), oldURL);
-  std::vector<std::string> names;
-  for (const auto& page : marlet.pages) names.push_back(page.name().value());
-  EXPECT_EQ(names, (std::vector<std::string>{"Neap tide", "Spring tide", "Storm tide"}));
-  EXPECT_TRUE(marlet.requiresFullEnvironment);
-  EXPECT_TRUE(marlet.sharedSourcesDirectoryURL);
-  EXPECT_EQ(old.target->identifier, "slateos");
-  ASSERT_EQ(old.pages.size(), 1u);
-  EXPECT_EQ(old.pages[0].text(), u"let tides = 2\n\nprint(tides)\n");
 }
 
 }  // namespace MarletFoundation::test
