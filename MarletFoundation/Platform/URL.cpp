@@ -212,8 +212,6 @@ std::string URL::path() const {
   return percentDecoded(withoutTrailingSlashes(Parts(whole).path));
 }
 
-bool URL::hasDirectoryPath() const { return isDirectory_; }
-
 std::string URL::absoluteString() const {
   if (isFile_) {
     auto string = "file://" + percentEncoded(text_);

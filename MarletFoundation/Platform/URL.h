@@ -31,8 +31,6 @@ class MARLET_EXPORT URL {
   std::optional<std::string> scheme() const;
   /// The decoded path, without a slash at its end but for the root; empty when the URL has none.
   std::string path() const;
-  /// Whether the URL is marked as a directory's, by its maker or a slash at its end.
-  bool hasDirectoryPath() const;
   /// The whole URL as a string, percent-encoded, resolved against the base: how a URL prints.
   std::string absoluteString() const;
   /// The string without the base: for a file URL, its absolute string.

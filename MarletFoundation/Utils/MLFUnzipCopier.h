@@ -21,7 +21,8 @@ inline constexpr std::string_view ArcCopierErrorDomain = "com.quorvex.ArcCopier"
 ///
 /// A host raises the bounds of an archive with the user-default keys "ArchiveEntryLimit" (100,000),
 /// "ArchiveByteLimit" (bytes of all files, 4 GiB) and "ArchiveExpansionLimit" (bytes of all files for each
-/// byte of the archive, 200).
+/// byte of the archive, 200; looked at from 16 MiB on). Other values than
+/// positive ones leave these.
 class MARLET_EXPORT MLFUnzipCopier {
  public:
   /// Called in steps of at least 5 percent of the items, with 100 always among them, unless their number can't

@@ -9,6 +9,7 @@
 
 #include "MarletFoundation/Logging/Log.h"
 #include "MarletFoundation/Logging/PercentFormat.h"
+#include "MarletFoundation/Utils/Continuation.h"
 
 namespace MarletFoundation::test {
 namespace {
@@ -48,6 +49,16 @@ TEST_F(PerformanceMetricTest, LabelsTakeNoMoreThanTheTimesOfTheirLine) {
   PerformanceMetricStop(metric);
   EXPECT_TRUE(recorder_->lines[0].ends_with(" sec elapsed -- %f %n %s% completed.")) << recorder_->lines[0];
   EXPECT_TRUE(recorder_->lines[2].ends_with(" sec -- %f%5.1f")) << recorder_->lines[2];
+}
+
+TEST_F(PerformanceMetricTest, TakesTheTimeOfAContinuation) {
+  const auto run = [&](const Continuation<int>& work) {
+    return work.runWithPerformanceMetrics([] { return "Work"; }, aspect_, LogLevel::Normal);
+  };
+  EXPECT_EQ(run(Continuation<int>([] { return 7; })), 7);
+  EXPECT_EQ(recorder_->lines.size(), 3u);
+  EXPECT_EQ(run(Continuation<int>::fail()), std::nullopt);
+  EXPECT_EQ(recorder_->lines.size(), 6u);
 }
 
 TEST_F(PerformanceMetricTest, ReportsNothingThatWasNeverStarted) {

@@ -237,6 +237,15 @@ TEST(MarletParser, CountsWhatItReads) {
   EXPECT_EQ(outcome(tree), "Unable to load marlet page: unable to load Contents.swift.");
 }
 
+TEST(MarletParser, TellsTheOldStyle) {
+  for (const auto& [tree, isOldStyle] : {std::pair(oldStyle(""), true), std::pair(newStyle(""), false)}) {
+    MarletParser parser(tree.wrapper(), URL::file("/D.marlet", true));
+    EXPECT_EQ(parser.isOldStyleMarlet(), std::nullopt);
+    errorOf([&] { parser.parse(); });
+    EXPECT_EQ(parser.isOldStyleMarlet(), isOldStyle);
+  }
+}
+
 TEST(MarletParser, FatalConditions) {
   // The one that a file can reach.
   EXPECT_EQ(fatalMessage([] { outcome(oldStyle("<sections/>")); }),

@@ -62,12 +62,14 @@ RC_GTEST_PROP(RangeConverter, AgreesWithTheNaiveWalkInAnyOrder, ()) {
   const auto buffer = std::make_shared<const LineIndexedBuffer>(text);
   UTF8RangeConverter toUTF16(text);
   SourceEditorUTF8RangeConverter both(buffer);
+  const auto& units = both.utf16RangeConverter();
   for (const auto target : targets) {
     const auto expected = naive(places, &ConvertedIndex::utf8Index, target);
     RC_ASSERT(toUTF16.utf16IndexFromUTF8Index(target) == expected.utf16Index);
     // The cache keeps what it has passed, so a target inside the last character finds the same place.
     RC_ASSERT(toUTF16.lastConversion() == expected);
     const auto unit = std::clamp<std::int64_t>(target, 0, static_cast<std::int64_t>(text.size()));
+    RC_ASSERT(units.indexFromSourceEditorPosition(buffer->positionFromIndex(unit, target)) == unit);
     const auto back = both.indexFromSourceEditorPosition(buffer->positionFromIndex(unit, target));
     RC_ASSERT(back == naive(places, &ConvertedIndex::utf16Index, unit).utf8Index);
     const OffsetRange range{std::min(back, expected.utf8Index), std::max(back, expected.utf8Index)};

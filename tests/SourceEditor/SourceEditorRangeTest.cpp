@@ -77,6 +77,7 @@ TEST(SourceEditorPosition, overflowAndNegativeHashesAreFatal) {
 
 TEST(SourceEditorRange, predicates) {
   const Range range({1, 2}, {3, 4}), empty({1, 2}, {1, 2});
+  EXPECT_TRUE(empty.isEmptyRange() && !range.isEmptyRange());
   EXPECT_TRUE(empty.touchesPosition({1, 2}));
   EXPECT_FALSE(empty.enclosesPosition({1, 2}));
   EXPECT_TRUE(range.touchesPosition({3, 4}));

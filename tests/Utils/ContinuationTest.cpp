@@ -7,6 +7,7 @@
 
 #include "MarletFoundation/Platform/Host.h"
 #include "MarletFoundation/SourceEditor/CodeCompletionResponder.h"
+#include "MarletFoundation/Utils/ClosureActionTarget.h"
 #include "MarletFoundation/Utils/ContinuationScheduler.h"
 #include "MarletFoundation/Utils/TimeoutContinuation.h"
 
@@ -49,8 +50,17 @@ TEST(Continuation, SchedulerRunsTheLastOfAName) {
     ran += 'b';
     scheduler.scheduleContinuationWithName("one", [&] { ran += 'c'; });
   });
+  scheduler.scheduleMainAsyncContinuationWithName("two", [&] { ran += 'd'; });
   EXPECT_EQ(ran, "");
-  EXPECT_TRUE(runUntil([&] { return ran == "bc"; }, 10));
+  EXPECT_TRUE(runUntil([&] { return ran == "bdc" || ran == "bcd"; }, 10)) << ran;
+}
+
+TEST(ClosureActionTarget, IsPerformedByItsSelector) {
+  std::string heard;
+  const ClosureActionTarget target(
+      [&](const auto& sender) { heard += dynamic_cast<const StringObject&>(*sender).value; });
+  (target.*ClosureActionTarget::actionSelector)(std::make_shared<StringObject>("sender"));
+  EXPECT_EQ(heard, "sender");
 }
 
 TEST(Continuation, TimeoutFiresOnceAfterTheLastReset) {
@@ -84,6 +94,15 @@ struct Editor final : SourceEditorCodeCompletionDelegate {
     return Work::nothing();
   }
 };
+
+TEST(CodeCompletion, RelevanceHasItsRawValue) {
+  for (std::int64_t rawValue = -1; rawValue <= 6; ++rawValue) {
+    const bool exists = rawValue >= 0 && rawValue <= 5;
+    EXPECT_EQ(
+        relevanceFromRawValue(rawValue),
+        exists ? std::optional(static_cast<SourceEditorCodeCompletionRelevance>(rawValue)) : std::nullopt);
+  }
+}
 
 TEST(CodeCompletionResponder, AnswersOnTheMainThreadAndIsSilentWhenTheRequesterIsGone) {
   auto editor = std::make_shared<Editor>();

@@ -80,5 +80,14 @@ void printManualPage(const std::vector<CommandRow>& table, std::ostream& out) {
   out << ".SH ENVIRONMENT\n";
   printVariable("MARLET_RESOURCES",
                 "The directory of the targets and the toolchain, where not that of the installation.", out);
+  printVariable("MARLET_DEFAULTS_ArchiveEntryLimit",
+                "How many entries an archive may have that unzip takes: 100000 if unset.", out);
+  printVariable("MARLET_DEFAULTS_ArchiveByteLimit",
+                "How many bytes its files may have together: 4 GiB if unset.", out);
+  printVariable(
+      "MARLET_DEFAULTS_ArchiveExpansionLimit",
+      "How many bytes its files may have for each byte of the archive: 200 if unset. Looked at from 16 MiB "
+      "on.",
+      out);
   printVariable("NO_COLOR", "Where it is set and not empty, nothing is coloured unless asked for.", out);
 }

@@ -252,7 +252,9 @@ int run(int argc, char** argv) {
   });
 
   std::string directory;
-  auto* unzipCommand = app.add_subcommand("unzip", "Expand a zip archive, whoever made it, into a directory");
+  auto* unzipCommand = app.add_subcommand(
+      "unzip",
+      "Expand a zip archive, whoever made it, into a directory, within limits (see ENVIRONMENT in the manual page)");
   unzipCommand->add_option("ARCHIVE", path, "The archive")->required()->type_name("FILE");
   unzipCommand->add_option("DIR", directory, "The directory, which is made when missing")
       ->required()
