@@ -21,18 +21,15 @@ ErrorObject failure(std::string message) {
 }
 ErrorObject missingFile(const std::string& path) { return failure("Missing file " + path); }
 
-/// The names of a pack's path; none for the empty path, which stands for the tree itself.
-PathNames namesOf(const std::string& path) {
-  if (path.empty()) return {};
-  auto names = relativePathComponents(path);
-  if (!names) throw missingFile(path);
-  return *std::move(names);
-}
-
 FileWrapper fileAt(const FileWrapper& root, const std::string& path) {
   auto node = path.empty() ? std::optional(root) : descendant(root, path);
   if (!node) throw missingFile(path);
   return *std::move(node);
+}
+
+/// The names of a path at which there is a file; none for the empty path, which stands for the tree itself.
+PathNames namesOf(const std::string& path) {
+  return path.empty() ? PathNames() : relativePathComponents(path).value();
 }
 
 /// Applies the entries of one pack to a book's tree, and carries the learner's entries over.
@@ -68,7 +65,10 @@ class BookMerge {
   std::vector<FileDiffDescriptor> takeUserEdits() { return std::move(userEdits_); }
 
  private:
-  void carry(const std::string& path) { addDescendant(contents_, namesOf(path), fileAt(source_, path)); }
+  void carry(const std::string& path) {
+    auto file = fileAt(source_, path);
+    addDescendant(contents_, namesOf(path), std::move(file));
+  }
 
   /// Both changes start from the text before the update; where they can't be combined the whole merge ends.
   void rebaseUserEdit(const FileDiffDescriptor::Modified& update, std::u16string_view text,

@@ -60,7 +60,8 @@ TEST(JSON, RefusesObjectsOfOtherKinds) {
     EXPECT_THROW(JSONSerialization::write(*object), ErrorObject);
   }
   EXPECT_THROW(JSONSerialization::write(*NumberObject::real(1.0 / 0.0)), ErrorObject);
-  PropertyListObjectPointer nested = std::make_shared<ArrayObject>(PropertyListObjects{std::make_shared<NullObject>()});
+  PropertyListObjectPointer nested =
+      std::make_shared<ArrayObject>(PropertyListObjects{std::make_shared<NullObject>()});
   for (int i = 1; i < 512; ++i) nested = std::make_shared<ArrayObject>(PropertyListObjects{nested});
   EXPECT_NO_THROW(JSON{*JSONSerialization::read(Data(JSONSerialization::write(*nested)))});
   nested = std::make_shared<ArrayObject>(PropertyListObjects{nested});
