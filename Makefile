@@ -49,7 +49,9 @@ embed:
 	scripts/install-dependencies --develop
 	$(call configure,debug)
 	cmake --build --preset debug
-	scripts/test-install
+	rm -f build/debug/*.deb
+	cmake --build --preset debug --target package
+	scripts/test-install build/debug/*.deb
 
 package: marlet
 	scripts/install-dependencies --develop
