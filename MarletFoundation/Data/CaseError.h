@@ -1,5 +1,6 @@
 #pragma once
 
+#include <functional>
 #include <memory>
 #include <optional>
 #include <span>
@@ -96,3 +97,11 @@ class MARLET_EXPORT UserVisibleCaseError final
 };
 
 }  // namespace MarletFoundation
+
+/// By case.
+template <class Case>
+struct std::hash<MarletFoundation::CaseError<Case>> {
+  std::size_t operator()(const MarletFoundation::CaseError<Case>& error) const {
+    return std::hash<Case>()(error.kind);
+  }
+};

@@ -4,8 +4,13 @@ namespace MarletFoundation {
 
 CodeTokenType CodeTokenType::placeholder(const CodeTokenType& held) {
   CodeTokenType type(Kind::Placeholder);
-  type.held_ = std::make_shared<const CodeTokenType>(held);
+  type.held_ = std::make_shared<CodeTokenType>(held);
   return type;
+}
+
+CodeTokenType::~CodeTokenType() {
+  // A long chain that nothing else holds goes link by link, not in a recursion.
+  while (held_ && held_.use_count() == 1) held_ = std::shared_ptr(std::move(held_->held_));
 }
 
 std::string_view CodeTokenType::description() const {

@@ -61,6 +61,9 @@ class MARLET_EXPORT CodeTokenType {
   CodeTokenType(Kind kind) : kind_(kind) {}
   /// A placeholder for a token of type `held`.
   static CodeTokenType placeholder(const CodeTokenType& held);
+  CodeTokenType(const CodeTokenType&) = default;
+  CodeTokenType& operator=(const CodeTokenType&) = default;
+  ~CodeTokenType();
 
   Kind kind() const { return kind_; }
   /// What a placeholder stands for; null where that isn't known, and for all other kinds.
@@ -73,7 +76,7 @@ class MARLET_EXPORT CodeTokenType {
 
  private:
   Kind kind_;
-  std::shared_ptr<const CodeTokenType> held_;
+  std::shared_ptr<CodeTokenType> held_;
 };
 
 }  // namespace MarletFoundation

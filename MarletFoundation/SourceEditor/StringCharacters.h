@@ -3,6 +3,7 @@
 #include <string_view>
 
 #include "MarletFoundation/SourceEditor/OffsetRange.h"
+#include "MarletFoundation/Utils/CheckedArithmetic.h"
 
 /// @file
 /// Strings by user-perceived characters (extended grapheme clusters). Each call walks the string from its
@@ -15,7 +16,7 @@ MARLET_EXPORT std::int64_t length(std::string_view string);
 MARLET_EXPORT std::string_view subscript(std::string_view string, const OffsetRange& range);
 /// The one character at a character offset.
 inline std::string_view subscript(std::string_view string, std::int64_t index) {
-  return subscript(string, {index, index + 1});
+  return subscript(string, {index, checkedSum(index, 1)});
 }
 
 }  // namespace MarletFoundation

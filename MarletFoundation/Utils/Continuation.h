@@ -2,6 +2,7 @@
 
 #include <concepts>
 #include <functional>
+#include <memory>
 #include <optional>
 #include <vector>
 
@@ -17,13 +18,13 @@ template <class T>
 class Continuation {
  public:
   /// Work that can't fail.
-  explicit Continuation(std::function<T()> f) : f_(std::move(f)) {}
+  explicit Continuation(std::function<T()> f) : f_(std::make_shared<const Work>(std::move(f))) {}
   /// Work that always fails.
   static Continuation fail() { return Continuation(); }
   /// Work whose next stage is made when it runs; no next stage is a failure.
   static Continuation failable(std::function<std::optional<Continuation>()> stage) {
     Continuation continuation;
-    continuation.failable_ = std::move(stage);
+    continuation.failable_ = std::make_shared<const Stage>(std::move(stage));
     return continuation;
   }
 
@@ -44,11 +45,11 @@ class Continuation {
     auto current = *this;
     while (!current.f_) {
       if (!current.failable_) return std::nullopt;
-      auto next = current.failable_();
+      auto next = (*current.failable_)();
       if (!next) return std::nullopt;
       current = *std::move(next);
     }
-    return current.f_();
+    return (*current.f_)();
   }
 
   /// This work, and behind it what `g` makes of its value.
@@ -73,6 +74,9 @@ class Continuation {
   }
 
  private:
+  using Work = std::function<T()>;
+  using Stage = std::function<std::optional<Continuation>()>;
+
   Continuation() = default;
 
   static Continuation onQueue(const DispatchQueue& queue, std::function<Continuation()> f) {
@@ -82,9 +86,9 @@ class Continuation {
     });
   }
 
-  // At most one is there.
-  std::function<T()> f_;
-  std::function<std::optional<Continuation>()> failable_;
+  // At most one is there. Copies share it, so that a long chain is as cheap to copy as a short one.
+  std::shared_ptr<const Work> f_;
+  std::shared_ptr<const Stage> failable_;
 };
 
 /// Runs all in order on one thread, up to the first that fails, and yields their values.

@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include <thread>
+#include <unordered_set>
 
 #include "MarletFoundation/Data/CaseError.h"
 #include "support/Failure.h"
@@ -73,6 +74,8 @@ TEST(CaseError, IsNamedByItsCaseAndPrintsItsPayload) {
   }
   EXPECT_FALSE(invalidVersion == LoadError(LoadCase::invalidVersion, "2.1"));
   EXPECT_FALSE(missingName == LoadError(LoadCase::wrapped));
+  const PlainError first(PlainCase::first), second(PlainCase::second);
+  EXPECT_EQ(std::unordered_set({first, second, first}).size(), 2u);
 }
 
 TEST_F(RegisteredErrors, WordsHoldThePayloadAndTheWordsOfTheWrappedError) {

@@ -132,6 +132,9 @@ TEST(CodeTokenType, ComparesWhatPlaceholdersHold) {
   EXPECT_EQ(CodeTokenType(Kind::AsConversionOperator).description(), "Conversion Operator");
   EXPECT_EQ(CodeTokenType(Kind::BinaryOperator).description(), "Binary Operator");
   EXPECT_EQ(CodeTokenType(Kind::Identifier).description(), "Identifier");
+  auto deep = nested;
+  for (int i = 0; i < 300000; ++i) deep = CodeTokenType::placeholder(deep);
+  EXPECT_NE(deep, nested);
 }
 
 }  // namespace

@@ -110,6 +110,7 @@ TEST(StringCharacters, CountExtendedGraphemeClusters) {
   EXPECT_EQ(subscript(text, OffsetRange{1, 4}), text.substr(1));
   EXPECT_EQ(subscript(text, OffsetRange{4, 4}), "");
   EXPECT_NE(fatalMessage([&] { subscript(text, 4); }), "");
+  EXPECT_NE(fatalMessage([&] { subscript(text, INT64_MAX); }), "");
   EXPECT_NE(fatalMessage([&] { subscript(text, -1); }), "");
 }
 

@@ -31,6 +31,10 @@ TEST(Continuation, ChainsAndStopsAtTheFirstFailure) {
   EXPECT_EQ(sequence<int>({step('p'), step('q')}).run(), (std::vector<int>{'p', 'q'}));
   EXPECT_EQ(sequence<int>({}).run(), std::vector<int>());
   EXPECT_TRUE(sequence_<int>({}).run());
+  auto chain = Continuation<int>([] { return 0; });
+  for (int i = 0; i < 5000; ++i)
+    chain = chain.flatMap([](int value) { return Continuation<int>([=] { return value + 1; }); });
+  EXPECT_EQ(chain.run(), 5000);
 }
 
 TEST(Continuation, SubmissionRunsAFunctionAndWhatItYields) {
@@ -119,6 +123,7 @@ TEST(CodeCompletionResponder, AnswersOnTheMainThreadAndIsSilentWhenTheRequesterI
   editor.reset();
   EXPECT_EQ(responder.maxCompletions(), 0);
   EXPECT_TRUE(responder.completionUnavailable().run());
+  EXPECT_TRUE(responder.offerSuggestions(SourceEditorCodeCompletionSuggestions(1), true).run());
   runUntil([] { return false; }, 0.02);
 }
 
