@@ -91,8 +91,9 @@ TEST_F(ActivityTracerTest, TriesAgainWhereNoReporterCouldBeSetUp) {
 
 TEST_F(ActivityTracerTest, SpoolStaysBounded) {
   MLFReporting reporting;
-  reporting.startConfiguration(
-      [](const std::vector<std::string>& results) { EXPECT_FALSE(results.empty()); });
+  std::vector<std::string> parts;
+  reporting.startConfiguration([&](const auto& results) { parts = results; });
+  EXPECT_EQ(parts, (std::vector<std::string>{"spool", "framework MarletFoundation"}));
   std::optional<ErrorObject> failure;
   const auto flush = [&] { reporting.flushMessages([&](const auto& error) { failure = error; }); };
   flush();

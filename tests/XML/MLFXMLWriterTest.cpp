@@ -74,6 +74,7 @@ TEST(MLFXMLWriter, RefusesWhatXMLCannotCarryAndASecondRoot) {
   }
   const auto error = thrown<ErrorObject>([&] { withElement([](auto& e) { e.addText("a\x01"); }); });
   EXPECT_EQ(error.localizedDescription(), "XML has no form for \"a\\u{01}\".");
+  EXPECT_EQ(error.code(), 0);
   for (const char* comment : {"a--b", "a-"})
     EXPECT_THROW(withElement([&](auto& e) { e.addComment(comment); }), ErrorObject) << comment;
   EXPECT_EQ(fatalMessage([] {
