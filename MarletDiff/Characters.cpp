@@ -4,19 +4,15 @@
 
 namespace MarletDiff {
 
-bool isLineStart(std::u16string_view text, std::size_t offset) {
-  if (offset == 0) return true;
-  const char16_t before = text[offset - 1];
-  return before == u'\r' ? offset == text.size() || text[offset] != u'\n' : endsLine(before);
-}
-
-bool Characters::alwaysStartsAt(std::size_t offset) const {
+template <class Unit>
+bool Characters<Unit>::alwaysStartsAt(std::size_t offset) const {
   if (offset == 0 || offset == text_.size()) return true;
-  const char16_t before = text_[offset - 1], after = text_[offset];
-  return (before | after) < 0x80 || endsLine(before) || endsLine(after);
+  const auto before = text_[offset - 1], after = text_[offset];
+  return (isASCII(before) && isASCII(after)) || endsLine(before) || endsLine(after);
 }
 
-bool Characters::startsInStretch(std::size_t offset) {
+template <class Unit>
+bool Characters<Unit>::startsInStretch(std::size_t offset) {
   if (offset < stretch_ || offset >= stretch_ + starts_.size()) {
     auto end = offset;
     for (stretch_ = offset; !alwaysStartsAt(stretch_);) --stretch_;
@@ -25,5 +21,8 @@ bool Characters::startsInStretch(std::size_t offset) {
   }
   return starts_[offset - stretch_];
 }
+
+template class Characters<char>;
+template class Characters<char16_t>;
 
 }  // namespace MarletDiff

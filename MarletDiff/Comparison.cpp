@@ -10,38 +10,41 @@ constexpr auto none = std::numeric_limits<std::uint32_t>::max();
 
 }  // namespace
 
-void Comparison::countOccurrences(std::span<const std::uint32_t> original,
-                                  std::span<const std::uint32_t> modified, std::size_t numbers) {
+/// Takes the tokens without a partner out of both lists.
+void Comparison::dropUnmatched(std::vector<std::uint32_t>& original, std::vector<std::uint32_t>& modified,
+                               std::size_t numbers) {
   occurrences_.assign(numbers + 1, {});
-  for (const auto number : original) ++occurrences_[number].original;
-  for (const auto number : modified) ++occurrences_[number].modified;
-  original_.resize(original.size()), originalPlaces_.resize(original.size());
-  modified_.resize(modified.size()), modifiedPlaces_.resize(modified.size());
+  for (const auto number : original) occurrences_[number].original.add();
+  for (const auto number : modified) occurrences_[number].modified.add();
+  originalPlaces_.resize(original.size());
+  modifiedPlaces_.resize(modified.size());
   std::uint32_t count = 0;
   for (std::uint32_t i = 0; i < original.size(); ++i) {
-    original_[count] = original[i];
+    const auto number = original[i];
+    original[count] = number;
     originalPlaces_[count] = i;
-    count += occurrences_[original[i]].modified != 0;
+    count += occurrences_[number].modified.any();
   }
-  original_.resize(count), originalPlaces_.resize(count);
+  original.resize(count);
   count = 0;
   for (std::uint32_t i = 0; i < modified.size(); ++i) {
-    auto& occurrences = occurrences_[modified[i]];
-    modified_[count] = modified[i];
+    const auto number = modified[i];
+    auto& occurrences = occurrences_[number];
+    modified[count] = number;
     modifiedPlaces_[count] = i;
     occurrences.lastModified = count;
-    count += occurrences.original != 0;
+    count += occurrences.original.any();
   }
-  modified_.resize(count), modifiedPlaces_.resize(count);
+  modified.resize(count);
 }
 
 /// Leaves in `anchors_` the longest row of tokens that are unique in both lists and ascend in both.
-void Comparison::findAnchors() {
+void Comparison::findAnchors(const std::vector<std::uint32_t>& original) {
   anchors_.clear();
   rowEnds_.clear();
-  for (std::uint32_t i = 0; i < original_.size(); ++i) {
-    const auto& occurrences = occurrences_[original_[i]];
-    if (occurrences.original != 1 || occurrences.modified != 1) continue;
+  for (std::uint32_t i = 0; i < original.size(); ++i) {
+    const auto& occurrences = occurrences_[original[i]];
+    if (!occurrences.original.one() || !occurrences.modified.one()) continue;
     const auto place = occurrences.lastModified;
     auto row = rowEnds_.end();
     if (!rowEnds_.empty() && anchors_[rowEnds_.back()].modified > place) {
@@ -67,24 +70,30 @@ void Comparison::findAnchors() {
   anchors_.resize(rowEnds_.size());
 }
 
-const std::vector<Change>& Comparison::changes(std::span<const std::uint32_t> original,
-                                               std::span<const std::uint32_t> modified, std::size_t numbers,
+const std::vector<Change>& Comparison::changes(std::vector<std::uint32_t>& original,
+                                               std::vector<std::uint32_t>& modified, std::size_t numbers,
                                                std::int64_t& budget) {
-  countOccurrences(original, modified, numbers);
-  findAnchors();
+  const auto originalSize = static_cast<std::uint32_t>(original.size());
+  const auto modifiedSize = static_cast<std::uint32_t>(modified.size());
+  dropUnmatched(original, modified, numbers);
+  findAnchors(original);
 
   runs_.clear();
-  shortestEdit_.start(original_, modified_);
+  shortestEdit_.start(original, modified);
   std::uint32_t originalDone = 0, modifiedDone = 0;
+  const auto compareUpTo = [&](std::size_t originalEnd, std::size_t modifiedEnd) {
+    const ShortestEdit::Box box{originalDone, static_cast<std::uint32_t>(originalEnd), modifiedDone,
+                                static_cast<std::uint32_t>(modifiedEnd)};
+    const bool isEmpty = box.original == box.originalEnd || box.modified == box.modifiedEnd;
+    if (!isEmpty) shortestEdit_.appendRuns(box, runs_, budget);
+  };
   for (const auto& anchor : anchors_) {
-    shortestEdit_.appendRuns({originalDone, anchor.original, modifiedDone, anchor.modified}, runs_, budget);
+    compareUpTo(anchor.original, anchor.modified);
     appendRun(runs_, {anchor.original, anchor.modified, 1});
     originalDone = anchor.original + 1;
     modifiedDone = anchor.modified + 1;
   }
-  shortestEdit_.appendRuns({originalDone, static_cast<std::uint32_t>(original_.size()), modifiedDone,
-                            static_cast<std::uint32_t>(modified_.size())},
-                           runs_, budget);
+  compareUpTo(original.size(), modified.size());
 
   changes_.clear();
   Change gap{0, 0, 0, 0};
@@ -100,7 +109,7 @@ const std::vector<Change>& Comparison::changes(std::span<const std::uint32_t> or
       match(originalPlaces_[run.original + i], modifiedPlaces_[run.modified + i]);
     }
   }
-  match(static_cast<std::uint32_t>(original.size()), static_cast<std::uint32_t>(modified.size()));
+  match(originalSize, modifiedSize);
   return changes_;
 }
 

@@ -1,7 +1,6 @@
 #pragma once
 
 #include <cstdint>
-#include <span>
 #include <vector>
 
 #include "MarletDiff/ShortestEdit.h"
@@ -21,16 +20,26 @@ class Comparison {
  public:
   /// The changes that lead from one list to the other, ascending, with an equal token between any two of
   /// them. A number is less than `numbers`, or that itself for a modified token without a partner. Takes its
-  /// work off `budget`; where that ends, a change takes in all that isn't compared yet.
-  const std::vector<Change>& changes(std::span<const std::uint32_t> original,
-                                     std::span<const std::uint32_t> modified, std::size_t numbers,
-                                     std::int64_t& budget);
+  /// work off `budget`; where that ends, a change takes in all that isn't compared yet. Leaves in the lists just
+  /// the tokens that have a partner in the other.
+  const std::vector<Change>& changes(std::vector<std::uint32_t>& original, std::vector<std::uint32_t>& modified,
+                                     std::size_t numbers, std::int64_t& budget);
 
  private:
+  /// None, one or more.
+  class Count {
+   public:
+    void add() { count_ += count_ < 2; }
+    bool any() const { return count_ != 0; }
+    bool one() const { return count_ == 1; }
+
+   private:
+    std::uint8_t count_ = 0;
+  };
   /// What is known of the tokens of one number.
   struct Occurrences {
-    std::uint32_t original = 0;
-    std::uint32_t modified = 0;
+    Count original;
+    Count modified;
     /// Where it is among the modified tokens that have a partner.
     std::uint32_t lastModified = 0;
   };
@@ -42,13 +51,13 @@ class Comparison {
     std::uint32_t previous;
   };
 
-  void countOccurrences(std::span<const std::uint32_t> original, std::span<const std::uint32_t> modified,
-                        std::size_t numbers);
-  void findAnchors();
+  void dropUnmatched(std::vector<std::uint32_t>& original, std::vector<std::uint32_t>& modified,
+                     std::size_t numbers);
+  void findAnchors(const std::vector<std::uint32_t>& original);
 
   std::vector<Occurrences> occurrences_;
-  /// The tokens with a partner in the other list, and their places in the whole lists.
-  std::vector<std::uint32_t> original_, originalPlaces_, modified_, modifiedPlaces_;
+  /// Where in the whole lists the tokens stand that have a partner.
+  std::vector<std::uint32_t> originalPlaces_, modifiedPlaces_;
   std::vector<Anchor> anchors_;
   std::vector<std::uint32_t> rowEnds_;
   ShortestEdit shortestEdit_;

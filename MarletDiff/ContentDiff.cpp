@@ -5,6 +5,7 @@
 #include <cstring>
 
 #include "MarletDiff/Comparison.h"
+#include "MarletDiff/Encoding.h"
 #include "MarletDiff/Sliding.h"
 #include "MarletDiff/Tokens.h"
 
@@ -21,24 +22,26 @@ constexpr std::size_t longestText = std::size_t{1} << 30;
 
 constexpr std::size_t blockLength = 2048;
 
-std::size_t commonPrefix(std::u16string_view a, std::u16string_view b) {
+template <class Unit>
+std::size_t commonPrefix(View<Unit> a, View<Unit> b) {
   const auto shorter = std::min(a.size(), b.size());
   std::size_t length = 0;
   while (length + blockLength <= shorter &&
-         std::memcmp(a.data() + length, b.data() + length, blockLength * sizeof(char16_t)) == 0) {
+         std::memcmp(a.data() + length, b.data() + length, blockLength * sizeof(Unit)) == 0) {
     length += blockLength;
   }
   while (length < shorter && a[length] == b[length]) ++length;
   return length;
 }
 
-std::size_t commonSuffix(std::u16string_view a, std::u16string_view b) {
+template <class Unit>
+std::size_t commonSuffix(View<Unit> a, View<Unit> b) {
   const auto shorter = std::min(a.size(), b.size());
   const auto *aEnd = a.data() + a.size(), *bEnd = b.data() + b.size();
   std::size_t length = 0;
   while (length + blockLength <= shorter &&
          std::memcmp(aEnd - length - blockLength, bEnd - length - blockLength,
-                     blockLength * sizeof(char16_t)) == 0) {
+                     blockLength * sizeof(Unit)) == 0) {
     length += blockLength;
   }
   while (length < shorter &&
@@ -50,16 +53,31 @@ std::size_t commonSuffix(std::u16string_view a, std::u16string_view b) {
 
 enum class Level { lines, stretches, words, characters };
 
-/// From this length on, units, a part is compared by stretches of words before it is by words.
-constexpr std::uint32_t longPart = 1 << 14;
+/// From this length on, UTF-16 units, a part is compared by stretches of words before it is by words.
+constexpr std::size_t longPart = 1 << 14;
 
+template <class Unit>
+bool isLong(View<Unit> text) {
+  return text.size() >= longPart && utf16Length(text) >= longPart;
+}
+
+template <class Unit>
+bool isOneWord(View<Unit> text) {
+  std::size_t at = 0;
+  while (at < text.size() && isWordAt(text, at)) ++at;
+  return at == text.size();
+}
+
+/// Whatever is decided by a length counts UTF-16 units, so that the hunks don't depend on the texts' encoding.
+template <class Unit>
 class ContentDiff {
  public:
-  ContentDiff(std::u16string_view original, std::u16string_view modified, bool smallerHunks)
+  /// `length` is that of both texts together, UTF-16 units.
+  ContentDiff(View<Unit> original, View<Unit> modified, std::size_t length, bool smallerHunks)
       : original_(original),
         modified_(modified),
         smallerHunks_(smallerHunks),
-        budget_(leastBudget + budgetPerUnit * static_cast<std::int64_t>(original.size() + modified.size())) {}
+        budget_(leastBudget + budgetPerUnit * static_cast<std::int64_t>(length)) {}
 
   std::vector<DiffDescriptor> run() {
     const auto differing = withoutEqualLines();
@@ -67,10 +85,7 @@ class ContentDiff {
     compare(differing, Level::lines);
     slideChanges(original_, modified_, changes_);
     joinTouching();
-    std::vector<DiffDescriptor> result;
-    result.reserve(changes_.size());
-    for (const auto& change : changes_) result.push_back(descriptor(change));
-    return result;
+    return descriptors();
   }
 
  private:
@@ -83,29 +98,30 @@ class ContentDiff {
   Level levelBelow(Level level, const Change& change) const;
   void joinTouching();
   Change trimmed(Change change, Level level);
-  static bool startsToken(Text& text, std::size_t offset, Level level);
-  DiffDescriptor descriptor(const Change& change) const;
+  static bool startsToken(Text<Unit>& text, std::size_t offset, Level level);
+  std::vector<DiffDescriptor> descriptors() const;
 
-  static void cut(Text& text, std::uint32_t start, std::uint32_t end, Level level, Tokens& tokens);
+  static void cut(Text<Unit>& text, std::uint32_t start, std::uint32_t end, Level level, Tokens<Unit>& tokens);
 
   /// Kept from part to part, for each level that is under way.
   struct Workspace {
-    Tokens original;
-    Tokens modified;
+    Tokens<Unit> original;
+    Tokens<Unit> modified;
     Comparison comparison;
   };
 
-  Text original_;
-  Text modified_;
+  Text<Unit> original_;
+  Text<Unit> modified_;
   bool smallerHunks_;
   std::int64_t budget_;
-  TokenNumbers numbers_;
+  TokenNumbers<Unit> numbers_;
   std::array<Workspace, 4> workspaces_;
   std::vector<Change> changes_;
 };
 
 /// The part that is left when the whole lines that both texts start and end with are taken off.
-Change ContentDiff::withoutEqualLines() const {
+template <class Unit>
+Change ContentDiff<Unit>::withoutEqualLines() const {
   const auto a = original_.view, b = modified_.view;
   auto prefix = commonPrefix(a, b);
   while (!isLineStart(a, prefix) || !isLineStart(b, prefix)) --prefix;
@@ -115,7 +131,8 @@ Change ContentDiff::withoutEqualLines() const {
   return {offset(prefix), offset(a.size() - suffix), offset(prefix), offset(b.size() - suffix)};
 }
 
-void ContentDiff::cut(Text& text, std::uint32_t start, std::uint32_t end, Level level, Tokens& tokens) {
+template <class Unit>
+void ContentDiff<Unit>::cut(Text<Unit>& text, std::uint32_t start, std::uint32_t end, Level level, Tokens<Unit>& tokens) {
   tokens.text = text.view;
   switch (level) {
     case Level::lines:
@@ -130,7 +147,8 @@ void ContentDiff::cut(Text& text, std::uint32_t start, std::uint32_t end, Level 
 }
 
 /// Adds the changes within a part of the texts, compared token by token.
-void ContentDiff::compare(const Change& part, Level level) {
+template <class Unit>
+void ContentDiff<Unit>::compare(const Change& part, Level level) {
   auto& [original, modified, comparison] = workspaces_[static_cast<std::size_t>(level)];
   cut(original_, part.original, part.originalEnd, level, original);
   cut(modified_, part.modified, part.modifiedEnd, level, modified);
@@ -148,7 +166,8 @@ void ContentDiff::compare(const Change& part, Level level) {
 }
 
 /// Adds a change that was found at a level, or what it comes to at the levels below.
-void ContentDiff::add(const Change& change, Level level) {
+template <class Unit>
+void ContentDiff<Unit>::add(const Change& change, Level level) {
   if (!smallerHunks_ || !replaces(change)) {
     changes_.push_back(change);
   } else if (level == Level::characters || budget_ <= 0) {
@@ -158,19 +177,16 @@ void ContentDiff::add(const Change& change, Level level) {
   }
 }
 
-Level ContentDiff::levelBelow(Level level, const Change& change) const {
-  const auto isOneWord = [](std::u16string_view text, std::uint32_t start, std::uint32_t end) {
-    return std::all_of(text.begin() + start, text.begin() + end, isWordUnit);
-  };
-  if (level == Level::words || (isOneWord(original_.view, change.original, change.originalEnd) &&
-                                isOneWord(modified_.view, change.modified, change.modifiedEnd))) {
-    return Level::characters;
-  }
-  const auto length = std::min(change.originalEnd - change.original, change.modifiedEnd - change.modified);
-  return level == Level::lines && length >= longPart ? Level::stretches : Level::words;
+template <class Unit>
+Level ContentDiff<Unit>::levelBelow(Level level, const Change& change) const {
+  const auto a = original_.view.substr(change.original, change.originalEnd - change.original);
+  const auto b = modified_.view.substr(change.modified, change.modifiedEnd - change.modified);
+  if (level == Level::words || (isOneWord(a) && isOneWord(b))) return Level::characters;
+  return level == Level::lines && isLong(a) && isLong(b) ? Level::stretches : Level::words;
 }
 
-void ContentDiff::joinTouching() {
+template <class Unit>
+void ContentDiff<Unit>::joinTouching() {
   std::vector<Change> joined;
   for (const auto& change : changes_) {
     if (joined.empty() || joined.back().originalEnd < change.original) {
@@ -186,7 +202,8 @@ void ContentDiff::joinTouching() {
 }
 
 /// The change without the whole words, or characters, that both its texts start and end with.
-Change ContentDiff::trimmed(Change change, Level level) {
+template <class Unit>
+Change ContentDiff<Unit>::trimmed(Change change, Level level) {
   const auto a = original_.view.substr(change.original, change.originalEnd - change.original);
   const auto b = modified_.view.substr(change.modified, change.modifiedEnd - change.modified);
   const auto bothStartAt = [&](std::size_t offset, std::size_t otherOffset) {
@@ -200,20 +217,37 @@ Change ContentDiff::trimmed(Change change, Level level) {
           change.modifiedEnd - suffix};
 }
 
-bool ContentDiff::startsToken(Text& text, std::size_t offset, Level level) {
+template <class Unit>
+bool ContentDiff<Unit>::startsToken(Text<Unit>& text, std::size_t offset, Level level) {
   if (!text.characters.startAt(offset)) return false;
   const bool isWithin = offset > 0 && offset < text.view.size();
-  return level == Level::characters || !isWithin || !isWordUnit(text.view[offset - 1]) ||
-         !isWordUnit(text.view[offset]);
+  return level == Level::characters || !isWithin || !isWordAt(text.view, offset - 1) ||
+         !isWordAt(text.view, offset);
 }
 
-DiffDescriptor ContentDiff::descriptor(const Change& change) const {
-  const auto range = [](std::uint32_t start, std::uint32_t end) {
-    return MarletFoundation::TextRange{start, end - start};
-  };
-  return {range(change.original, change.originalEnd), range(change.modified, change.modifiedEnd),
-          std::u16string(original_.view.substr(change.original, change.originalEnd - change.original)),
-          std::u16string(modified_.view.substr(change.modified, change.modifiedEnd - change.modified))};
+template <class Unit>
+std::vector<DiffDescriptor> ContentDiff<Unit>::descriptors() const {
+  std::vector<DiffDescriptor> result;
+  result.reserve(changes_.size());
+  std::uint32_t done = 0;
+  std::int64_t at = 0, modifiedAt = 0;
+  for (const auto& change : changes_) {
+    // The text since the last change is equal, and as long on both sides.
+    const auto between = static_cast<std::int64_t>(utf16Length(original_.view.substr(done, change.original - done)));
+    auto content = utf16(original_.view.substr(change.original, change.originalEnd - change.original));
+    auto modified = utf16(modified_.view.substr(change.modified, change.modifiedEnd - change.modified));
+    const MarletFoundation::TextRange range{at + between, std::ssize(content)};
+    const MarletFoundation::TextRange modifiedRange{modifiedAt + between, std::ssize(modified)};
+    result.push_back({range, modifiedRange, std::move(content), std::move(modified)});
+    done = change.originalEnd;
+    at = range.end();
+    modifiedAt = modifiedRange.end();
+  }
+  return result;
+}
+
+bool asksForSmallerHunks(const std::optional<DiffOptions>& options) {
+  return options && options->contains(DiffOptions::SmallerHunks);
 }
 
 }  // namespace
@@ -227,7 +261,16 @@ std::vector<DiffDescriptor> diffContent(std::u16string_view original, std::u16st
              std::u16string(original),
              std::u16string(modified)}};
   }
-  return ContentDiff(original, modified, options && options->contains(DiffOptions::SmallerHunks)).run();
+  return ContentDiff(original, modified, original.size() + modified.size(), asksForSmallerHunks(options)).run();
+}
+
+std::vector<DiffDescriptor> diffContent(std::string_view original, std::string_view modified,
+                                        std::optional<DiffOptions> options) {
+  const auto length = checkedUTF16Length(original) + checkedUTF16Length(modified);
+  if (original.size() > longestText || modified.size() > longestText) {
+    return diffContent(utf16(original), utf16(modified), options);
+  }
+  return ContentDiff(original, modified, length, asksForSmallerHunks(options)).run();
 }
 
 }  // namespace MarletDiff

@@ -21,4 +21,9 @@ MARLET_EXPORT std::vector<DiffDescriptor> diffContent(std::u16string_view origin
                                                       std::u16string_view modified,
                                                       std::optional<DiffOptions> options = std::nullopt);
 
+/// The same hunks of texts in UTF-8, as files hold them, found with half the memory. Ranges count UTF-16 units all
+/// the same. Throws a `MarletFoundation::ErrorObject` of the POSIX domain (EILSEQ) for ill-formed UTF-8.
+MARLET_EXPORT std::vector<DiffDescriptor> diffContent(std::string_view original, std::string_view modified,
+                                                      std::optional<DiffOptions> options = std::nullopt);
+
 }  // namespace MarletDiff

@@ -3,9 +3,8 @@
 #include <algorithm>
 #include <cstdint>
 
-#include "MarletDiff/Characters.h"
+#include "MarletDiff/Encoding.h"
 #include "MarletFoundation/Platform/ErrorObject.h"
-#include "MarletFoundation/Platform/Text.h"
 
 namespace MarletDiff {
 namespace {
@@ -13,7 +12,6 @@ namespace {
 using MarletFoundation::ErrorObject;
 using MarletFoundation::TextRange;
 using MarletFoundation::UserInfo;
-using MarletFoundation::utf8FromUTF16Lossy;
 using Hunks = std::span<const DiffDescriptor>;
 
 struct MergeErrorWords {
@@ -47,175 +45,200 @@ ErrorObject mergeError(MergeErrorCode code, const TextRange& place, UserInfo det
   return {std::string(ErrorDomain), static_cast<int>(code), std::move(details)};
 }
 
-std::u16string_view textAt(std::u16string_view base, std::int64_t start, std::int64_t end) {
-  return base.substr(static_cast<std::size_t>(start), static_cast<std::size_t>(end - start));
-}
+/// A hunk, by its place in the base's own units.
+struct Edit {
+  std::size_t start;
+  std::size_t end;
+  std::u16string_view text;
+};
+using Edits = std::span<const Edit>;
 
-bool dividesCharacter(std::u16string_view base, std::int64_t at) {
-  if (at <= 0 || at >= std::ssize(base)) return false;
-  const auto offset = static_cast<std::size_t>(at);
-  return (base[offset - 1] & 0xFC00) == 0xD800 && (base[offset] & 0xFC00) == 0xDC00;
-}
-
-void validate(std::u16string_view base, Hunks hunks) {
-  std::int64_t end = 0;
+/// The hunks once they are checked.
+template <class Unit>
+std::vector<Edit> validEdits(View<Unit> base, std::size_t length, Hunks hunks) {
+  std::vector<Edit> edits;
+  edits.reserve(hunks.size());
+  Offsets<Unit> offsets(base);
+  std::int64_t done = 0;
   for (const auto& hunk : hunks) {
     const auto& place = hunk.originalRange;
-    if (place.location < 0 || place.location > std::ssize(base) || place.length < 0 ||
-        place.length > std::ssize(base) - place.location) {
+    if (place.location < 0 || place.length < 0 || static_cast<std::size_t>(place.location) > length ||
+        static_cast<std::size_t>(place.length) > length - static_cast<std::size_t>(place.location)) {
       throw mergeError(MergeErrorCode::OutOfBounds, place);
     }
-    if (place.location < end) throw mergeError(MergeErrorCode::OutOfOrder, place);
-    end = place.end();
-    if (dividesCharacter(base, place.location) || dividesCharacter(base, end)) {
-      throw mergeError(MergeErrorCode::DividedCharacter, place);
-    }
-    if (textAt(base, place.location, end) != hunk.originalContent) {
+    if (place.location < done) throw mergeError(MergeErrorCode::OutOfOrder, place);
+    done = place.end();
+    const auto start = offsets.at(static_cast<std::size_t>(place.location));
+    const auto end = start ? offsets.at(static_cast<std::size_t>(done)) : std::nullopt;
+    if (!end) throw mergeError(MergeErrorCode::DividedCharacter, place);
+    if (!isEqual(base.substr(*start, *end - *start), hunk.originalContent)) {
       throw mergeError(MergeErrorCode::DifferentText, place);
     }
+    edits.push_back({*start, *end, hunk.modifiedContent});
   }
+  return edits;
 }
 
-bool isWordUnitAt(std::u16string_view text, std::int64_t at) {
-  return at >= 0 && at < std::ssize(text) && isWordUnit(text[static_cast<std::size_t>(at)]);
+/// Whether there is a word's unit at an offset that may lie outside the text.
+template <class Unit>
+bool hasWordAt(View<Unit> text, std::size_t at) {
+  return at < text.size() && isWordAt(text, at);
 }
 
-/// Whether the word ahead of a hunk's place becomes another one, since it goes on into the place, before the
+/// Whether the word ahead of an edit's place becomes another one, since it goes on into the place, before the
 /// change or after it.
-bool changesWordBefore(std::u16string_view base, const DiffDescriptor& hunk) {
-  const auto& place = hunk.originalRange;
-  const auto& text = hunk.modifiedContent;
-  const bool joins = text.empty() ? isWordUnitAt(base, place.end()) : isWordUnit(text.front());
-  return isWordUnitAt(base, place.location) || joins;
+template <class Unit>
+bool changesWordBefore(View<Unit> base, const Edit& edit) {
+  const bool joins = edit.text.empty() ? hasWordAt(base, edit.end) : isWordAt(edit.text, 0);
+  return hasWordAt(base, edit.start) || joins;
 }
 
-/// The same for the word behind the place.
-bool changesWordBehind(std::u16string_view base, const DiffDescriptor& hunk) {
-  const auto& place = hunk.originalRange;
-  const auto& text = hunk.modifiedContent;
-  const bool joins = text.empty() ? isWordUnitAt(base, place.location - 1) : isWordUnit(text.back());
-  return isWordUnitAt(base, place.end() - 1) || joins;
+/// The same for the word behind the place. (The offset ahead of 0 is beyond all texts.)
+template <class Unit>
+bool changesWordBehind(View<Unit> base, const Edit& edit) {
+  const bool joins = edit.text.empty() ? hasWordAt(base, edit.start - 1) : isWordAt(edit.text, edit.text.size() - 1);
+  return hasWordAt(base, edit.end - 1) || joins;
 }
 
-/// Hunks of both sides that must be taken together, and the span of the base that they change.
+/// Edits of both sides that must be taken together, and the span of the base that they change.
+template <class Unit>
 class Cluster {
  public:
-  Cluster(std::u16string_view base, std::int64_t start)
-      : base_(base), start_(start), end_(start), wordsEnd_(start) {}
+  using String = std::basic_string<Unit>;
 
-  /// Whether a hunk that doesn't start ahead of those taken in belongs to them.
-  bool meets(const DiffDescriptor& hunk) const {
-    auto at = hunk.originalRange.location;
+  Cluster(View<Unit> base, std::size_t start) : base_(base), start_(start), end_(start), wordsEnd_(start) {}
+
+  /// Whether an edit that doesn't start ahead of those taken in belongs to them.
+  bool meets(const Edit& edit) const {
+    auto at = edit.start;
     if (at <= end_) return true;
-    if (changesWordBefore(base_, hunk)) {
-      while (at >= wordsEnd_ && isWordUnitAt(base_, at - 1)) --at;
+    if (changesWordBefore(base_, edit)) {
+      while (at >= wordsEnd_ && hasWordAt(base_, at - 1)) --at;
     }
     return at < wordsEnd_;
   }
 
-  void add(const DiffDescriptor& hunk) {
-    const auto hunkEnd = hunk.originalRange.end();
-    end_ = std::max(end_, hunkEnd);
+  void add(const Edit& edit) {
+    end_ = std::max(end_, edit.end);
     // A word that reaches `wordsEnd_` from within ends there, so that none is walked twice.
-    if (hunkEnd < wordsEnd_) return;
-    wordsEnd_ = hunkEnd;
-    if (changesWordBehind(base_, hunk)) {
-      while (isWordUnitAt(base_, wordsEnd_)) ++wordsEnd_;
+    if (edit.end < wordsEnd_) return;
+    wordsEnd_ = edit.end;
+    if (changesWordBehind(base_, edit)) {
+      while (hasWordAt(base_, wordsEnd_)) ++wordsEnd_;
     }
   }
 
-  std::int64_t start() const { return start_; }
-  std::int64_t end() const { return end_; }
+  std::size_t start() const { return start_; }
+  std::size_t end() const { return end_; }
 
-  /// The text of the cluster's span as one side's `hunks` make it.
-  std::u16string render(Hunks hunks) const {
-    std::u16string text;
-    auto at = start_;
-    for (const auto& hunk : hunks) {
-      text += textAt(base_, at, hunk.originalRange.location);
-      text += hunk.modifiedContent;
-      at = hunk.originalRange.end();
-    }
-    text += textAt(base_, at, end_);
-    return text;
-  }
-
-  std::u16string merge(Hunks hunks, Hunks otherHunks) const {
-    if (otherHunks.empty()) return render(hunks);
-    if (hunks.empty()) return render(otherHunks);
-    auto text = render(hunks), otherText = render(otherHunks);
-    const auto original = textAt(base_, start_, end_);
-    if (text == otherText || otherText == original) return text;
-    if (text == original) return otherText;
-    throw mergeError(MergeErrorCode::Conflict, {start_, end_ - start_},
-                     {{std::string(BaseTextKey), utf8FromUTF16Lossy(original)},
-                      {std::string(TextKey), utf8FromUTF16Lossy(text)},
-                      {std::string(OtherTextKey), utf8FromUTF16Lossy(otherText)}});
+  /// Appends what becomes of the cluster's span.
+  void appendMerged(Edits edits, Edits otherEdits, String& merged) const {
+    if (otherEdits.empty()) return appendRendered(edits, merged);
+    if (edits.empty()) return appendRendered(otherEdits, merged);
+    String text, otherText;
+    appendRendered(edits, text);
+    appendRendered(otherEdits, otherText);
+    const auto original = base_.substr(start_, end_ - start_);
+    if (text != otherText && text != original && otherText != original) throw conflict(text, otherText);
+    merged += text == original ? otherText : text;
   }
 
  private:
-  std::u16string_view base_;
-  std::int64_t start_;
-  std::int64_t end_;
+  /// The text of the span as one side's edits make it.
+  void appendRendered(Edits edits, String& text) const {
+    auto at = start_;
+    for (const auto& edit : edits) {
+      text += base_.substr(at, edit.start - at);
+      append(text, edit.text);
+      at = edit.end;
+    }
+    text += base_.substr(at, end_ - at);
+  }
+
+  ErrorObject conflict(const String& text, const String& otherText) const {
+    const auto original = base_.substr(start_, end_ - start_);
+    const TextRange place{static_cast<std::int64_t>(utf16Length(base_.substr(0, start_))),
+                          static_cast<std::int64_t>(utf16Length(original))};
+    return mergeError(MergeErrorCode::Conflict, place,
+                      {{std::string(BaseTextKey), printableUTF8(original)},
+                       {std::string(TextKey), printableUTF8(View<Unit>(text))},
+                       {std::string(OtherTextKey), printableUTF8(View<Unit>(otherText))}});
+  }
+
+  View<Unit> base_;
+  std::size_t start_;
+  std::size_t end_;
   /// `end_`, or the end of the word that is changed beyond it.
-  std::int64_t wordsEnd_;
+  std::size_t wordsEnd_;
 };
 
-/// One side's hunks, taken off from the front.
+/// One side's edits, taken off from the front.
 class Side {
  public:
-  explicit Side(Hunks hunks) : hunks_(hunks) {}
-  const DiffDescriptor* next() const { return taken_ < hunks_.size() ? &hunks_[taken_] : nullptr; }
+  explicit Side(Edits edits) : edits_(edits) {}
+  const Edit* next() const { return taken_ < edits_.size() ? &edits_[taken_] : nullptr; }
   void take() { ++taken_; }
   /// What was taken since the last call.
-  Hunks taken() {
-    const auto result = hunks_.first(taken_);
-    hunks_ = hunks_.subspan(taken_);
+  Edits taken() {
+    const auto result = edits_.first(taken_);
+    edits_ = edits_.subspan(taken_);
     taken_ = 0;
     return result;
   }
 
  private:
-  Hunks hunks_;
+  Edits edits_;
   std::size_t taken_ = 0;
 };
 
-}  // namespace
+/// The most units that the hunks' text takes.
+template <class Unit>
+std::size_t longestText(Hunks hunks) {
+  constexpr std::size_t bytesPerUnit = 3;
+  std::size_t length = 0;
+  for (const auto& hunk : hunks) length += hunk.modifiedContent.size();
+  return sizeof(Unit) == 1 ? bytesPerUnit * length : length;
+}
 
-std::u16string mergeContent(std::u16string_view base, Hunks diff, Hunks otherDiff) {
-  validate(base, diff);
-  validate(base, otherDiff);
-
-  Side side(diff), otherSide(otherDiff);
+template <class Unit>
+std::basic_string<Unit> merge(View<Unit> base, Hunks diff, Hunks otherDiff) {
+  const auto length = checkedUTF16Length(base);
+  const auto edits = validEdits(base, length, diff), otherEdits = validEdits(base, length, otherDiff);
+  Side side(edits), otherSide(otherEdits);
   const auto first = [&]() -> Side* {
     const auto *a = side.next(), *b = otherSide.next();
     if (!a || !b) return a ? &side : b ? &otherSide : nullptr;
-    const auto at = a->originalRange.location, otherAt = b->originalRange.location;
-    if (at != otherAt) return at < otherAt ? &side : &otherSide;
+    if (a->start != b->start) return a->start < b->start ? &side : &otherSide;
     // The one that ties the place to what is in front comes first, whichever side it is of.
     return changesWordBefore(base, *a) ? &side : &otherSide;
   };
 
-  std::u16string merged;
-  auto longest = base.size();
-  for (const auto hunks : {diff, otherDiff}) {
-    for (const auto& hunk : hunks) longest += hunk.modifiedContent.size();
-  }
-  merged.reserve(longest);
-  std::int64_t copied = 0;
+  std::basic_string<Unit> merged;
+  merged.reserve(base.size() + longestText<Unit>(diff) + longestText<Unit>(otherDiff));
+  std::size_t copied = 0;
   while (auto* next = first()) {
-    Cluster cluster(base, next->next()->originalRange.location);
+    Cluster<Unit> cluster(base, next->next()->start);
     do {
       cluster.add(*next->next());
       next->take();
       next = first();
     } while (next && cluster.meets(*next->next()));
-    merged += textAt(base, copied, cluster.start());
-    merged += cluster.merge(side.taken(), otherSide.taken());
+    merged += base.substr(copied, cluster.start() - copied);
+    cluster.appendMerged(side.taken(), otherSide.taken(), merged);
     copied = cluster.end();
   }
-  merged += textAt(base, copied, std::ssize(base));
+  merged += base.substr(copied);
   return merged;
+}
+
+}  // namespace
+
+std::u16string mergeContent(std::u16string_view base, Hunks diff, Hunks otherDiff) {
+  return merge(base, diff, otherDiff);
+}
+
+std::string mergeContent(std::string_view base, Hunks diff, Hunks otherDiff) {
+  return merge(base, diff, otherDiff);
 }
 
 }  // namespace MarletDiff

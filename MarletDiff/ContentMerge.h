@@ -46,4 +46,9 @@ inline constexpr std::string_view OtherTextKey = "OtherText";
 MARLET_EXPORT std::u16string mergeContent(std::u16string_view base, std::span<const DiffDescriptor> diff,
                                           std::span<const DiffDescriptor> otherDiff = {});
 
+/// The same for a base in UTF-8; ranges count UTF-16 units all the same. Throws one of the POSIX domain (EILSEQ) for
+/// ill-formed UTF-8 and for an unpaired surrogate in a hunk's text.
+MARLET_EXPORT std::string mergeContent(std::string_view base, std::span<const DiffDescriptor> diff,
+                                       std::span<const DiffDescriptor> otherDiff = {});
+
 }  // namespace MarletDiff

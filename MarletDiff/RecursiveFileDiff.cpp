@@ -24,11 +24,9 @@ using Directory = std::shared_ptr<DiskDirectory>;
 using Entries = std::vector<DiskDirectory::Entry>;
 using Result = std::vector<FileDiffDescriptor>;
 
-/// A text that a delta file can carry, or nothing.
-std::optional<std::u16string> deltaText(std::string_view bytes) {
-  auto text = utf16FromUTF8(bytes);
-  if (text && PropertyListText::findInvalidXMLCharacter(bytes) != PropertyListText::npos) return std::nullopt;
-  return text;
+/// Whether it is a text that a delta file can carry.
+bool isDeltaText(std::string_view bytes) {
+  return isValidUTF8(bytes) && PropertyListText::findInvalidXMLCharacter(bytes) == PropertyListText::npos;
 }
 
 /// One of the two trees.
@@ -163,11 +161,9 @@ class TreeDiff {
     if (before.status.st_size == after.status.st_size && haveEqualBytes(before, after, path)) return;
     const auto contents = original_.contents(before, original, name);
     const auto updatedContents = contents ? updated_.contents(after, updated, name) : std::nullopt;
-    const auto text = updatedContents ? deltaText(contents->view()) : std::nullopt;
-    const auto updatedText = text ? deltaText(updatedContents->view()) : std::nullopt;
-    if (!updatedText) {
+    if (!updatedContents || !isDeltaText(contents->view()) || !isDeltaText(updatedContents->view())) {
       result_.push_back({FileDiffDescriptor::Replaced{path}});
-    } else if (auto hunks = diffContent(*text, *updatedText, options_); !hunks.empty()) {
+    } else if (auto hunks = diffContent(contents->view(), updatedContents->view(), options_); !hunks.empty()) {
       result_.push_back({FileDiffDescriptor::Modified{path, std::move(hunks)}});
     }
   }

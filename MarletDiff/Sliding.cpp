@@ -6,25 +6,35 @@
 namespace MarletDiff {
 namespace {
 
+template <class Unit>
+bool startsWith(View<Unit> text, std::string_view ascii) {
+  return text.size() >= ascii.size() && std::equal(ascii.begin(), ascii.end(), text.begin());
+}
+
+template <class Unit>
+bool endsWith(View<Unit> text, std::string_view ascii) {
+  return text.size() >= ascii.size() && std::equal(ascii.begin(), ascii.end(), text.end() - std::ssize(ascii));
+}
+
 /// Whether a place stands within a comment's delimiter. A quote beside a comment is a part of it: what is
 /// written between the quotes of a field is then not taken for text behind the field.
-bool dividesDelimiter(std::u16string_view before, std::u16string_view after) {
-  return (before.ends_with(u'/') && after.starts_with(u'*')) ||
-         (before.ends_with(u'*') && after.starts_with(u'/')) ||
-         (before.ends_with(u'"') && after.starts_with(u"/*")) ||
-         (before.ends_with(u"*/") && after.starts_with(u'"'));
+template <class Unit>
+bool dividesDelimiter(View<Unit> before, View<Unit> after) {
+  return (endsWith(before, "/") && startsWith(after, "*")) || (endsWith(before, "*") && startsWith(after, "/")) ||
+         (endsWith(before, "\"") && startsWith(after, "/*")) || (endsWith(before, "*/") && startsWith(after, "\""));
 }
 
 /// How good a place is to start or end a change at.
-int rank(std::u16string_view text, std::size_t offset) {
+template <class Unit>
+int rank(View<Unit> text, std::size_t offset) {
   if (offset == text.size() || isLineStart(text, offset)) return 5;
   const auto before = text.substr(0, offset), after = text.substr(offset);
   // If it can be helped, text beside a comment is not taken for a part of it.
   if (dividesDelimiter(before, after)) return 0;
-  const bool opens = after.starts_with(u"/*") || after.starts_with(u"\"/*");
-  const bool closes = before.ends_with(u"*/") || before.ends_with(u"*/\"");
+  const bool opens = startsWith(after, "/*") || startsWith(after, "\"/*");
+  const bool closes = endsWith(before, "*/") || endsWith(before, "*/\"");
   if (opens || closes) return 4;
-  const bool wordBefore = isWordUnit(before.back()), wordAfter = isWordUnit(after.front());
+  const bool wordBefore = isWordAt(text, offset - 1), wordAfter = isWordAt(text, offset);
   if (wordAfter) return wordBefore ? 0 : 3;
   return wordBefore ? 2 : 1;
 }
@@ -36,7 +46,8 @@ struct Score {
   auto operator<=>(const Score&) const = default;
 };
 
-Score score(Text& original, Text& modified, const Change& change, bool standsAlone) {
+template <class Unit>
+Score score(Text<Unit>& original, Text<Unit>& modified, const Change& change, bool standsAlone) {
   const bool wholeCharacters =
       original.characters.startAt(change.original) && original.characters.startAt(change.originalEnd) &&
       modified.characters.startAt(change.modified) && modified.characters.startAt(change.modifiedEnd);
@@ -52,7 +63,8 @@ Change moved(const Change& change, std::int64_t by) {
 
 }  // namespace
 
-void slideChanges(Text& original, Text& modified, std::vector<Change>& changes) {
+template <class Unit>
+void slideChanges(Text<Unit>& original, Text<Unit>& modified, std::vector<Change>& changes) {
   for (std::size_t i = 0; i < changes.size(); ++i) {
     auto& change = changes[i];
     const bool inserts = change.original == change.originalEnd;
@@ -82,5 +94,8 @@ void slideChanges(Text& original, Text& modified, std::vector<Change>& changes) 
     change = best;
   }
 }
+
+template void slideChanges(Text<char>&, Text<char>&, std::vector<Change>&);
+template void slideChanges(Text<char16_t>&, Text<char16_t>&, std::vector<Change>&);
 
 }  // namespace MarletDiff

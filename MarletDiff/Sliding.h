@@ -9,15 +9,17 @@
 namespace MarletDiff {
 
 /// A text with its characters.
+template <class Unit>
 struct Text {
-  explicit Text(std::u16string_view text) : view(text), characters(text) {}
-  std::u16string_view view;
-  Characters characters;
+  explicit Text(View<Unit> text) : view(text), characters(text) {}
+  View<Unit> view;
+  Characters<Unit> characters;
 };
 
 /// Moves each insertion and removal along equal text to where it starts and ends best in the original: at a
 /// line's start, at the outer edge of a comment, at a word's start, at a word's end. Of equally good places it
 /// takes the last. Changes are given by offsets; two may touch afterwards, but only where that is better.
-void slideChanges(Text& original, Text& modified, std::vector<Change>& changes);
+template <class Unit>
+void slideChanges(Text<Unit>& original, Text<Unit>& modified, std::vector<Change>& changes);
 
 }  // namespace MarletDiff

@@ -13,30 +13,39 @@
 namespace MarletDiff {
 namespace {
 
-/// A bit for each of 64 units, the first in the lowest, set where one ends a line.
-std::uint64_t lineEnds(const char16_t* units) {
+/// Whether a line's end may start with a unit.
+template <class Unit>
+bool mayEndLine(Unit unit) {
+  return endsLine(unit) || unit == paragraphSeparator<Unit>.front();
+}
+
+/// A bit for each of 64 units, the first in the lowest, set where one may end a line.
+template <class Unit>
+std::uint64_t lineEnds(const Unit* units) {
   std::uint64_t ends = 0;
 #ifdef __SSE2__
   const auto found = [&](int offset) {
     const auto block = _mm_loadu_si128(reinterpret_cast<const __m128i*>(units + offset));
-    const auto is = [&](char16_t end) {
+    const auto is = [&](Unit end) {
+      if constexpr (sizeof(Unit) == 1) return _mm_cmpeq_epi8(block, _mm_set1_epi8(end));
       return _mm_cmpeq_epi16(block, _mm_set1_epi16(static_cast<short>(end)));
     };
-    return _mm_or_si128(_mm_or_si128(is(u'\n'), is(u'\r')), is(ParagraphSeparator));
+    return _mm_or_si128(_mm_or_si128(is('\n'), is('\r')), is(paragraphSeparator<Unit>.front()));
   };
   for (int i = 0; i < 64; i += 16) {
-    const auto bits = static_cast<unsigned>(_mm_movemask_epi8(_mm_packs_epi16(found(i), found(i + 8))));
-    ends |= std::uint64_t{bits} << i;
+    const auto bytes = sizeof(Unit) == 1 ? found(i) : _mm_packs_epi16(found(i), found(i + 8));
+    ends |= std::uint64_t{static_cast<unsigned>(_mm_movemask_epi8(bytes))} << i;
   }
 #else
-  for (int i = 0; i < 64; ++i) ends |= std::uint64_t{endsLine(units[i])} << i;
+  for (int i = 0; i < 64; ++i) ends |= std::uint64_t{mayEndLine(units[i])} << i;
 #endif
   return ends;
 }
 
 /// Not by the traits of its characters, which compare them one by one.
-bool equal(std::u16string_view a, std::u16string_view b) {
-  return a.size() == b.size() && std::memcmp(a.data(), b.data(), a.size() * sizeof(char16_t)) == 0;
+template <class Unit>
+bool equal(View<Unit> a, View<Unit> b) {
+  return a.size() == b.size() && std::memcmp(a.data(), b.data(), a.size() * sizeof(Unit)) == 0;
 }
 
 /// Another number in each process, so that no text can be made to put all its tokens in one slot. Numbers
@@ -54,13 +63,42 @@ std::uint64_t mixed(std::uint64_t a, std::uint64_t b) {
   return static_cast<std::uint64_t>(product) ^ static_cast<std::uint64_t>(product >> 64);
 }
 
+/// Token starts on their way to a list. Each is written to a block, but counted only where one is: a processor can't
+/// foresee which are.
+class StartsWriter {
+ public:
+  explicit StartsWriter(std::vector<std::uint32_t>& starts) : starts_(starts) {}
+  void add(std::uint32_t place, bool isStart = true) {
+    block_[count_] = place;
+    count_ += isStart;
+    if (count_ == block_.size()) flush();
+  }
+  void flush() {
+    starts_.insert(starts_.end(), block_.begin(), block_.begin() + count_);
+    count_ = 0;
+  }
+
+ private:
+  std::vector<std::uint32_t>& starts_;
+  std::array<std::uint32_t, 256> block_;
+  std::size_t count_ = 0;
+};
+
 }  // namespace
 
-void Tokens::cutLines(std::uint32_t start, std::uint32_t end) {
+template <class Unit>
+void Tokens<Unit>::cutLines(std::uint32_t start, std::uint32_t end) {
   starts.assign(1, start);
+  StartsWriter writer(starts);
   const auto endAt = [&](std::uint32_t at) {
-    const bool dividesPair = text[at] == u'\r' && at + 1 < end && text[at + 1] == u'\n';
-    if (!dividesPair) starts.push_back(at + 1);
+    const auto rest = text.substr(at, end - at);
+    if (rest.front() == '\n') {
+      writer.add(at + 1);
+    } else if (rest.front() == '\r') {
+      writer.add(at + 1, rest.size() == 1 || rest[1] != '\n');
+    } else if (rest.starts_with(paragraphSeparator<Unit>)) {
+      writer.add(at + static_cast<std::uint32_t>(paragraphSeparator<Unit>.size()));
+    }
   };
   auto at = start;
   for (; at + 64 <= end; at += 64) {
@@ -69,47 +107,45 @@ void Tokens::cutLines(std::uint32_t start, std::uint32_t end) {
     }
   }
   for (; at < end; ++at) {
-    if (endsLine(text[at])) endAt(at);
+    if (mayEndLine(text[at])) endAt(at);
   }
+  writer.flush();
   if (starts.back() != end) starts.push_back(end);
 }
 
-void Tokens::cutStretches(std::uint32_t start, std::uint32_t end) {
+template <class Unit>
+void Tokens<Unit>::cutStretches(std::uint32_t start, std::uint32_t end) {
   constexpr std::uint32_t beside = 4;
   starts.assign(1, start);
   for (auto at = start + beside; at + beside <= end; ++at) {
-    const char16_t before = text[at - 1], after = text[at];
-    if (isWordUnit(before) || !isWordUnit(after) || after >= 0x80) continue;
-    std::uint64_t left, right;
-    std::memcpy(&left, &text[at - beside], sizeof left);
-    std::memcpy(&right, &text[at], sizeof right);
-    if (mixed(left ^ hashConstants[0], right ^ hashConstants[1]) % 16 == 0) starts.push_back(at);
+    if (!isASCII(text[at]) || !isWordAt(text, at) || isWordAt(text, at - 1)) continue;
+    std::uint64_t around = 0, allBits = 0;
+    for (const auto unit : text.substr(at - beside, 2 * beside)) {
+      allBits |= static_cast<std::uint64_t>(unit);
+      around = around << 8 | static_cast<unsigned char>(unit);
+    }
+    if (allBits < 0x80 && mixed(around ^ hashConstants[0], hashConstants[1]) % 16 == 0) starts.push_back(at);
   }
   starts.push_back(end);
 }
 
-void Tokens::cutWords(Characters& characters, std::uint32_t start, std::uint32_t end) {
+template <class Unit>
+void Tokens<Unit>::cutWords(Characters<Unit>& characters, std::uint32_t start, std::uint32_t end) {
   starts.clear();
-  // Each place is written and counted only where a token starts: a processor can't foresee which do.
-  std::array<std::uint32_t, 256> block;
-  std::size_t count = 0;
+  StartsWriter writer(starts);
   bool inWord = false;
   for (auto at = start; at < end; ++at) {
     const bool startsCharacter = at == start || characters.startAt(at);
-    const bool isWord = isWordUnit(text[at]);
-    block[count] = at;
-    count += startsCharacter & !(isWord & inWord);
+    const bool isWord = isWordAt(text, at);
+    writer.add(at, startsCharacter & !(isWord & inWord));
     inWord = startsCharacter ? isWord : inWord;
-    if (count == block.size()) {
-      starts.insert(starts.end(), block.begin(), block.end());
-      count = 0;
-    }
   }
-  starts.insert(starts.end(), block.begin(), block.begin() + count);
+  writer.flush();
   starts.push_back(end);
 }
 
-void Tokens::cutCharacters(Characters& characters, std::uint32_t start, std::uint32_t end) {
+template <class Unit>
+void Tokens<Unit>::cutCharacters(Characters<Unit>& characters, std::uint32_t start, std::uint32_t end) {
   starts.clear();
   for (auto at = start; at < end; ++at) {
     if (at == start || characters.startAt(at)) starts.push_back(at);
@@ -117,13 +153,15 @@ void Tokens::cutCharacters(Characters& characters, std::uint32_t start, std::uin
   starts.push_back(end);
 }
 
-void TokenNumbers::number(Tokens& original, Tokens& modified) {
+template <class Unit>
+void TokenNumbers<Unit>::number(Tokens<Unit>& original, Tokens<Unit>& modified) {
   reset(original.count());
   numberOriginal(original);
   numberModified(modified, original);
 }
 
-void TokenNumbers::reset(std::size_t tokens) {
+template <class Unit>
+void TokenNumbers<Unit>::reset(std::size_t tokens) {
   mask_ = std::bit_ceil(2 * tokens + 1) - 1;
   if (slots_.size() <= mask_) slots_.resize(mask_ + 1);
   std::fill_n(slots_.begin(), mask_ + 1, Slot{});
@@ -131,7 +169,8 @@ void TokenNumbers::reset(std::size_t tokens) {
 }
 
 /// Hashes run ahead of the look-ups, and fetch the memory that these need.
-void TokenNumbers::numberOriginal(Tokens& original) {
+template <class Unit>
+void TokenNumbers<Unit>::numberOriginal(Tokens<Unit>& original) {
   constexpr std::uint32_t ahead = 8;
   std::array<std::uint64_t, ahead> hashes;
   const auto count = original.count();
@@ -155,7 +194,8 @@ void TokenNumbers::numberOriginal(Tokens& original) {
 }
 
 /// Most tokens stand behind the same ones as in the original, so that place is tried before all others.
-void TokenNumbers::numberModified(Tokens& modified, const Tokens& original) {
+template <class Unit>
+void TokenNumbers<Unit>::numberModified(Tokens<Unit>& modified, const Tokens<Unit>& original) {
   modified.numbers.resize(modified.count());
   std::uint32_t expected = 0;
   for (std::uint32_t i = 0; i < modified.count(); ++i) {
@@ -170,8 +210,9 @@ void TokenNumbers::numberModified(Tokens& modified, const Tokens& original) {
   }
 }
 
-TokenNumbers::Slot& TokenNumbers::slot(std::u16string_view token, std::uint64_t hash,
-                                       const Tokens& original) {
+template <class Unit>
+typename TokenNumbers<Unit>::Slot& TokenNumbers<Unit>::slot(View<Unit> token, std::uint64_t hash,
+                                                            const Tokens<Unit>& original) {
   const auto hashBits = static_cast<std::uint32_t>(hash >> 32);
   for (auto place = hash & mask_;; place = (place + 1) & mask_) {
     auto& slot = slots_[place];
@@ -180,9 +221,10 @@ TokenNumbers::Slot& TokenNumbers::slot(std::u16string_view token, std::uint64_t 
   }
 }
 
-std::uint64_t TokenNumbers::hash(std::u16string_view token) {
+template <class Unit>
+std::uint64_t TokenNumbers<Unit>::hash(View<Unit> token) {
   const auto* bytes = reinterpret_cast<const char*>(token.data());
-  const auto size = token.size() * sizeof(char16_t);
+  const auto size = token.size() * sizeof(Unit);
   std::uint64_t result = seed ^ size;
   std::uint64_t words[2] = {0, 0};
   const auto mix = [&] { result = mixed(words[0] ^ hashConstants[0] ^ result, words[1] ^ hashConstants[1]); };
@@ -205,5 +247,10 @@ std::uint64_t TokenNumbers::hash(std::u16string_view token) {
   mix();
   return result;
 }
+
+template struct Tokens<char>;
+template struct Tokens<char16_t>;
+template class TokenNumbers<char>;
+template class TokenNumbers<char16_t>;
 
 }  // namespace MarletDiff

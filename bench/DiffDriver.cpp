@@ -5,7 +5,6 @@
 #include "MarletDiff/ContentMerge.h"
 #include "MarletDiff/RecursiveFileDiff.h"
 #include "MarletFoundation/Platform/FileManager.h"
-#include "MarletFoundation/Platform/Text.h"
 
 using namespace MarletDiff;
 using MarletFoundation::URL;
@@ -13,8 +12,7 @@ using MarletFoundation::URL;
 int main(int, char** argv) {
   const auto smaller = DiffOptions::SmallerHunks;
   const auto text = [&](int argument) {
-    return *MarletFoundation::utf16FromUTF8(
-        MarletFoundation::FileManager::mapFile(URL::file(argv[argument])).view());
+    return MarletFoundation::FileManager::mapFile(URL::file(argv[argument]));
   };
   const std::string_view what = argv[1];
   if (what == "trees") {
@@ -22,7 +20,7 @@ int main(int, char** argv) {
     return changes.empty() ? 0 : 1;
   }
   const auto base = text(2);
-  const auto diff = diffContent(base, text(3), smaller);
+  const auto diff = diffContent(base.view(), text(3).view(), smaller);
   if (what == "diff") return diff.empty() ? 0 : 1;
-  return mergeContent(base, diff, diffContent(base, text(4), smaller)).empty() ? 1 : 0;
+  return mergeContent(base.view(), diff, diffContent(base.view(), text(4).view(), smaller)).empty() ? 1 : 0;
 }

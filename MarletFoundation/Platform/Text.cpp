@@ -100,6 +100,18 @@ Run walk(std::string_view text, std::size_t from, std::int64_t limit) {
   return {at, count};
 }
 
+template <class Unit>
+std::vector<bool> characterStarts(std::basic_string_view<Unit> text) {
+  std::vector<bool> starts(text.size());
+  auto& characters = CharacterWalk::ofThisThread();
+  for (std::size_t base = 0; base < text.size(); base += window) {
+    const auto part = text.substr(base, window);
+    characters.start(part);
+    for (std::size_t at = 0; at < part.size(); at = characters.next()) starts[base + at] = true;
+  }
+  return starts;
+}
+
 std::optional<std::u16string> canonicalDecomposition(std::string_view text) {
   const auto source = utf16FromUTF8(text);
   if (!source || source->size() > std::numeric_limits<std::int32_t>::max() / 4) return std::nullopt;
@@ -127,16 +139,8 @@ std::size_t graphemeRunEnd(std::string_view text, std::size_t from, std::int64_t
   return walk(text, from, count).end;
 }
 
-std::vector<bool> graphemeStarts(std::u16string_view text) {
-  std::vector<bool> starts(text.size());
-  auto& characters = CharacterWalk::ofThisThread();
-  for (std::size_t base = 0; base < text.size(); base += window) {
-    const auto part = text.substr(base, window);
-    characters.start(part);
-    for (std::size_t at = 0; at < part.size(); at = characters.next()) starts[base + at] = true;
-  }
-  return starts;
-}
+std::vector<bool> graphemeStarts(std::u16string_view text) { return characterStarts(text); }
+std::vector<bool> graphemeStarts(std::string_view text) { return characterStarts(text); }
 
 bool canonicallyEquivalent(std::string_view a, std::string_view b) {
   if (a == b) return true;

@@ -15,6 +15,8 @@ namespace MarletFoundation {
 MARLET_EXPORT std::optional<std::u16string> utf16FromUTF8(std::string_view text);
 MARLET_EXPORT std::optional<std::string> utf8FromUTF16(std::u16string_view text);
 MARLET_EXPORT bool isValidUTF8(std::string_view text);
+/// How many UTF-16 units a text in UTF-8 takes; nothing for an ill-formed one.
+MARLET_EXPORT std::optional<std::size_t> utf16Length(std::string_view text);
 /// Bytes in front of the first one that isn't ASCII, or that belongs to no well-formed UTF-8 character.
 MARLET_EXPORT std::size_t asciiPrefixLength(std::string_view text);
 MARLET_EXPORT std::size_t utf8PrefixLength(std::string_view text);
@@ -29,9 +31,10 @@ MARLET_EXPORT std::int64_t graphemeCount(std::string_view text);
 /// there are fewer. Linear in the bytes passed over when called run after run.
 MARLET_EXPORT std::size_t graphemeRunEnd(std::string_view text, std::size_t from, std::int64_t count);
 
-/// For each offset of a text in UTF-16, whether a character starts there. An unpaired surrogate is a character
-/// of its own.
+/// For each offset of a text, whether a character starts there. An unpaired surrogate is a character of its own;
+/// UTF-8 must be well-formed.
 MARLET_EXPORT std::vector<bool> graphemeStarts(std::u16string_view text);
+MARLET_EXPORT std::vector<bool> graphemeStarts(std::string_view text);
 
 /// Equality by Unicode canonical equivalence.
 MARLET_EXPORT bool canonicallyEquivalent(std::string_view a, std::string_view b);

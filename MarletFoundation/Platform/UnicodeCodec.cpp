@@ -17,15 +17,8 @@ namespace {
 constexpr std::size_t blockSize = 2048;
 // What one step may write beyond the place that it moves to.
 constexpr std::size_t slack = 64;
-constexpr std::uint64_t nonASCIIBytes = 0x8080808080808080;
 
 bool isASCII(char c) { return static_cast<unsigned char>(c) < 0x80; }
-
-std::uint64_t wordAt(const char* place) {
-  std::uint64_t word;
-  std::memcpy(&word, place, sizeof word);
-  return word;
-}
 
 // `widen32` writes 32 bytes as units, `narrow16` writes 16 units as bytes; each returns how many are ASCII before the
 // first that isn't. What is written from there on means nothing.
@@ -184,6 +177,30 @@ bool decodeBlock(const char*& place, const char* end, char16_t*& outPlace, const
   return true;
 }
 
+struct Part {
+  std::size_t bytes = 0;
+  /// As many of UTF-16.
+  std::size_t units = 0;
+};
+
+/// What stands in front of the first byte that belongs to no well-formed character.
+Part wellFormedPart(std::string_view text) {
+  const auto* const end = text.data() + text.size();
+  Part part;
+  while (part.bytes < text.size()) {
+    const auto ascii = asciiPrefixLength(text.substr(part.bytes));
+    part.bytes += ascii;
+    part.units += ascii;
+    while (part.bytes < text.size() && !isASCII(text[part.bytes])) {
+      const auto scalar = decodeUTF8(text.data() + part.bytes, end);
+      if (!scalar.length) return part;
+      part.bytes += scalar.length;
+      part.units += scalar.length == 4 ? 2 : 1;
+    }
+  }
+  return part;
+}
+
 enum class Unpaired { fail, replace };
 
 /// The same the other way. False at an unpaired surrogate.
@@ -238,10 +255,11 @@ std::optional<std::string> utf8(std::u16string_view text, Unpaired unpaired) {
 
 std::optional<std::u16string> utf16FromUTF8(std::string_view text) {
   std::u16string result;
-  result.reserve(text.size());
   char16_t block[blockSize + slack];
   const auto* const end = text.data() + text.size();
-  for (const auto* at = text.data(); at < end;) {
+  const auto* at = text.data();
+  if (text.size() > blockSize) result.reserve(text.size());
+  while (at < end) {
     auto* out = block;
     if (!decodeBlock(at, end, out, block + blockSize)) return std::nullopt;
     result.append(block, out);
@@ -258,23 +276,27 @@ bool isValidUTF8(std::string_view text) { return utf8PrefixLength(text) == text.
 
 std::size_t asciiPrefixLength(std::string_view text) {
   std::size_t i = 0;
-  while (i + 8 <= text.size() && !(wordAt(text.data() + i) & nonASCIIBytes)) i += 8;
+#ifdef __SSE2__
+  for (; i + 16 <= text.size(); i += 16) {
+    const auto bytes = _mm_loadu_si128(reinterpret_cast<const __m128i*>(text.data() + i));
+    const auto others = static_cast<unsigned>(_mm_movemask_epi8(bytes));
+    if (others) return i + static_cast<std::size_t>(std::countr_zero(others));
+  }
+#else
+  for (std::uint64_t word; i + sizeof word <= text.size(); i += sizeof word) {
+    std::memcpy(&word, text.data() + i, sizeof word);
+    if (word & 0x8080808080808080) break;
+  }
+#endif
   while (i < text.size() && isASCII(text[i])) ++i;
   return i;
 }
 
-std::size_t utf8PrefixLength(std::string_view text) {
-  const auto* const end = text.data() + text.size();
-  for (std::size_t i = 0; i < text.size();) {
-    if (isASCII(text[i])) {
-      i += asciiPrefixLength(text.substr(i));
-      continue;
-    }
-    const auto scalar = decodeUTF8(text.data() + i, end);
-    if (!scalar.length) return i;
-    i += scalar.length;
-  }
-  return text.size();
+std::size_t utf8PrefixLength(std::string_view text) { return wellFormedPart(text).bytes; }
+
+std::optional<std::size_t> utf16Length(std::string_view text) {
+  const auto part = wellFormedPart(text);
+  return part.bytes == text.size() ? std::optional(part.units) : std::nullopt;
 }
 
 }  // namespace MarletFoundation
