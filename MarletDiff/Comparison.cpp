@@ -11,7 +11,7 @@ constexpr auto none = std::numeric_limits<std::uint32_t>::max();
 }  // namespace
 
 /// Takes the tokens without a partner out of both lists.
-void Comparison::dropUnmatched(std::vector<std::uint32_t>& original, std::vector<std::uint32_t>& modified,
+void Comparison::dropUnmatched(std::pmr::vector<std::uint32_t>& original, std::pmr::vector<std::uint32_t>& modified,
                                std::size_t numbers) {
   occurrences_.assign(numbers + 1, {});
   for (const auto number : original) occurrences_[number].original.add();
@@ -39,7 +39,7 @@ void Comparison::dropUnmatched(std::vector<std::uint32_t>& original, std::vector
 }
 
 /// Leaves in `anchors_` the longest row of tokens that are unique in both lists and ascend in both.
-void Comparison::findAnchors(const std::vector<std::uint32_t>& original) {
+void Comparison::findAnchors(const std::pmr::vector<std::uint32_t>& original) {
   anchors_.clear();
   rowEnds_.clear();
   for (std::uint32_t i = 0; i < original.size(); ++i) {
@@ -70,8 +70,8 @@ void Comparison::findAnchors(const std::vector<std::uint32_t>& original) {
   anchors_.resize(rowEnds_.size());
 }
 
-const std::vector<Change>& Comparison::changes(std::vector<std::uint32_t>& original,
-                                               std::vector<std::uint32_t>& modified, std::size_t numbers,
+const std::pmr::vector<Change>& Comparison::changes(std::pmr::vector<std::uint32_t>& original,
+                                               std::pmr::vector<std::uint32_t>& modified, std::size_t numbers,
                                                std::int64_t& budget) {
   const auto originalSize = static_cast<std::uint32_t>(original.size());
   const auto modifiedSize = static_cast<std::uint32_t>(modified.size());

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <memory_resource>
 #include <vector>
 
 #include "MarletDiff/ShortestEdit.h"
@@ -18,11 +19,21 @@ struct Change {
 /// Compares lists of numbered tokens. An object may be used again; it keeps its memory.
 class Comparison {
  public:
+  explicit Comparison(std::pmr::memory_resource* memory)
+      : occurrences_(memory),
+        originalPlaces_(memory),
+        modifiedPlaces_(memory),
+        anchors_(memory),
+        rowEnds_(memory),
+        shortestEdit_(memory),
+        runs_(memory),
+        changes_(memory) {}
+
   /// The changes that lead from one list to the other, ascending, with an equal token between any two of
   /// them. A number is less than `numbers`, or that itself for a modified token without a partner. Takes its
   /// work off `budget`; where that ends, a change takes in all that isn't compared yet. Leaves in the lists just
   /// the tokens that have a partner in the other.
-  const std::vector<Change>& changes(std::vector<std::uint32_t>& original, std::vector<std::uint32_t>& modified,
+  const std::pmr::vector<Change>& changes(std::pmr::vector<std::uint32_t>& original, std::pmr::vector<std::uint32_t>& modified,
                                      std::size_t numbers, std::int64_t& budget);
 
  private:
@@ -51,18 +62,18 @@ class Comparison {
     std::uint32_t previous;
   };
 
-  void dropUnmatched(std::vector<std::uint32_t>& original, std::vector<std::uint32_t>& modified,
+  void dropUnmatched(std::pmr::vector<std::uint32_t>& original, std::pmr::vector<std::uint32_t>& modified,
                      std::size_t numbers);
-  void findAnchors(const std::vector<std::uint32_t>& original);
+  void findAnchors(const std::pmr::vector<std::uint32_t>& original);
 
-  std::vector<Occurrences> occurrences_;
+  std::pmr::vector<Occurrences> occurrences_;
   /// Where in the whole lists the tokens stand that have a partner.
-  std::vector<std::uint32_t> originalPlaces_, modifiedPlaces_;
-  std::vector<Anchor> anchors_;
-  std::vector<std::uint32_t> rowEnds_;
+  std::pmr::vector<std::uint32_t> originalPlaces_, modifiedPlaces_;
+  std::pmr::vector<Anchor> anchors_;
+  std::pmr::vector<std::uint32_t> rowEnds_;
   ShortestEdit shortestEdit_;
-  std::vector<TokenRun> runs_;
-  std::vector<Change> changes_;
+  std::pmr::vector<TokenRun> runs_;
+  std::pmr::vector<Change> changes_;
 };
 
 }  // namespace MarletDiff

@@ -8,6 +8,7 @@
 #include "MarletDiff/Encoding.h"
 #include "MarletDiff/Sliding.h"
 #include "MarletDiff/Tokens.h"
+#include "MarletDiff/WorkMemory.h"
 
 namespace MarletDiff {
 namespace {
@@ -19,6 +20,9 @@ constexpr std::int64_t budgetPerUnit = 3;
 
 /// Offsets count in 32 bits, with room for differences.
 constexpr std::size_t longestText = std::size_t{1} << 30;
+
+/// What the lists of a comparison take of memory for each unit, where lines are as long as most are.
+constexpr std::size_t workBytesPerUnit = 2;
 
 constexpr std::size_t blockLength = 2048;
 
@@ -51,6 +55,22 @@ std::size_t commonSuffix(View<Unit> a, View<Unit> b) {
   return length;
 }
 
+/// The part that is left when the whole lines that both texts start and end with are taken off.
+template <class Unit>
+Change withoutEqualLines(View<Unit> a, View<Unit> b) {
+  auto prefix = commonPrefix(a, b);
+  while (!isLineStart(a, prefix) || !isLineStart(b, prefix)) --prefix;
+  auto suffix = commonSuffix(a.substr(prefix), b.substr(prefix));
+  while (suffix > 0 && (!isLineStart(a, a.size() - suffix) || !isLineStart(b, b.size() - suffix))) --suffix;
+  const auto offset = [](std::size_t value) { return static_cast<std::uint32_t>(value); };
+  return {offset(prefix), offset(a.size() - suffix), offset(prefix), offset(b.size() - suffix)};
+}
+
+/// Of both sides, in the texts' own units.
+std::size_t partLength(const Change& change) {
+  return std::size_t{change.originalEnd - change.original} + (change.modifiedEnd - change.modified);
+}
+
 enum class Level { lines, stretches, words, characters };
 
 /// From this length on, UTF-16 units, a part is compared by stretches of words before it is by words.
@@ -77,22 +97,21 @@ class ContentDiff {
       : original_(original),
         modified_(modified),
         smallerHunks_(smallerHunks),
-        budget_(leastBudget + budgetPerUnit * static_cast<std::int64_t>(length)) {}
+        budget_(leastBudget + budgetPerUnit * static_cast<std::int64_t>(length)),
+        differing_(withoutEqualLines(original, modified)),
+        memory_(workBytesPerUnit * partLength(differing_)) {}
 
   std::vector<DiffDescriptor> run() {
-    const auto differing = withoutEqualLines();
-    if (isEmpty(differing)) return {};
-    compare(differing, Level::lines);
+    if (partLength(differing_) == 0) return {};
+    compare(differing_, Level::lines);
     slideChanges(original_, modified_, changes_);
     joinTouching();
     return descriptors();
   }
 
  private:
-  static bool isEmpty(const Change& c) { return c.original == c.originalEnd && c.modified == c.modifiedEnd; }
   static bool replaces(const Change& c) { return c.original < c.originalEnd && c.modified < c.modifiedEnd; }
 
-  Change withoutEqualLines() const;
   void compare(const Change& part, Level level);
   void add(const Change& change, Level level);
   Level levelBelow(Level level, const Change& change) const;
@@ -105,6 +124,7 @@ class ContentDiff {
 
   /// Kept from part to part, for each level that is under way.
   struct Workspace {
+    explicit Workspace(std::pmr::memory_resource* memory) : original(memory), modified(memory), comparison(memory) {}
     Tokens<Unit> original;
     Tokens<Unit> modified;
     Comparison comparison;
@@ -114,22 +134,13 @@ class ContentDiff {
   Text<Unit> modified_;
   bool smallerHunks_;
   std::int64_t budget_;
-  TokenNumbers<Unit> numbers_;
-  std::array<Workspace, 4> workspaces_;
-  std::vector<Change> changes_;
+  Change differing_;
+  WorkMemory memory_;
+  TokenNumbers<Unit> numbers_{&memory_};
+  std::array<Workspace, 4> workspaces_{Workspace(&memory_), Workspace(&memory_), Workspace(&memory_),
+                                       Workspace(&memory_)};
+  std::pmr::vector<Change> changes_{&memory_};
 };
-
-/// The part that is left when the whole lines that both texts start and end with are taken off.
-template <class Unit>
-Change ContentDiff<Unit>::withoutEqualLines() const {
-  const auto a = original_.view, b = modified_.view;
-  auto prefix = commonPrefix(a, b);
-  while (!isLineStart(a, prefix) || !isLineStart(b, prefix)) --prefix;
-  auto suffix = commonSuffix(a.substr(prefix), b.substr(prefix));
-  while (suffix > 0 && (!isLineStart(a, a.size() - suffix) || !isLineStart(b, b.size() - suffix))) --suffix;
-  const auto offset = [](std::size_t value) { return static_cast<std::uint32_t>(value); };
-  return {offset(prefix), offset(a.size() - suffix), offset(prefix), offset(b.size() - suffix)};
-}
 
 template <class Unit>
 void ContentDiff<Unit>::cut(Text<Unit>& text, std::uint32_t start, std::uint32_t end, Level level, Tokens<Unit>& tokens) {
@@ -187,7 +198,7 @@ Level ContentDiff<Unit>::levelBelow(Level level, const Change& change) const {
 
 template <class Unit>
 void ContentDiff<Unit>::joinTouching() {
-  std::vector<Change> joined;
+  std::pmr::vector<Change> joined(&memory_);
   for (const auto& change : changes_) {
     if (joined.empty() || joined.back().originalEnd < change.original) {
       joined.push_back(change);

@@ -5,7 +5,7 @@
 
 namespace MarletDiff {
 
-void appendRun(std::vector<TokenRun>& runs, const TokenRun& run) {
+void appendRun(std::pmr::vector<TokenRun>& runs, const TokenRun& run) {
   if (run.length == 0) return;
   if (!runs.empty()) {
     auto& last = runs.back();
@@ -22,7 +22,7 @@ void ShortestEdit::start(std::span<const std::uint32_t> original, std::span<cons
   modified_ = modified;
 }
 
-void ShortestEdit::appendRuns(Box box, std::vector<TokenRun>& runs, std::int64_t& budget) {
+void ShortestEdit::appendRuns(Box box, std::pmr::vector<TokenRun>& runs, std::int64_t& budget) {
   const auto shorter = std::min(box.originalEnd - box.original, box.modifiedEnd - box.modified);
   std::uint32_t prefix = 0, suffix = 0;
   while (prefix < shorter && original_[box.original + prefix] == modified_[box.modified + prefix]) ++prefix;

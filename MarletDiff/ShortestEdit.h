@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <memory_resource>
 #include <span>
 #include <vector>
 
@@ -14,7 +15,7 @@ struct TokenRun {
 };
 
 /// Appends a run, to the last one where it goes on from there.
-void appendRun(std::vector<TokenRun>& runs, const TokenRun& run);
+void appendRun(std::pmr::vector<TokenRun>& runs, const TokenRun& run);
 
 /// Myers' search for the fewest insertions and removals, in linear space. An object may be used again.
 class ShortestEdit {
@@ -27,11 +28,13 @@ class ShortestEdit {
     std::uint32_t modifiedEnd;
   };
 
+  explicit ShortestEdit(std::pmr::memory_resource* memory) : forward_(memory), backward_(memory) {}
+
   /// Sets the lists, which must stay as they are while their boxes are compared.
   void start(std::span<const std::uint32_t> original, std::span<const std::uint32_t> modified);
   /// Appends the runs of equal tokens in a box, ascending. Takes the tokens and diagonals it looks at off
   /// `budget`; where that ends, nothing in the box but what its ends share counts as equal.
-  void appendRuns(Box box, std::vector<TokenRun>& runs, std::int64_t& budget);
+  void appendRuns(Box box, std::pmr::vector<TokenRun>& runs, std::int64_t& budget);
 
  private:
   struct Point {
@@ -42,7 +45,7 @@ class ShortestEdit {
 
   std::span<const std::uint32_t> original_, modified_;
   /// For each diagonal, the place in the original that a search from the box's start or end has reached.
-  std::vector<std::int32_t> forward_, backward_;
+  std::pmr::vector<std::int32_t> forward_, backward_;
 };
 
 }  // namespace MarletDiff

@@ -64,7 +64,7 @@ Change moved(const Change& change, std::int64_t by) {
 }  // namespace
 
 template <class Unit>
-void slideChanges(Text<Unit>& original, Text<Unit>& modified, std::vector<Change>& changes) {
+void slideChanges(Text<Unit>& original, Text<Unit>& modified, std::pmr::vector<Change>& changes) {
   for (std::size_t i = 0; i < changes.size(); ++i) {
     auto& change = changes[i];
     const bool inserts = change.original == change.originalEnd;
@@ -95,7 +95,7 @@ void slideChanges(Text<Unit>& original, Text<Unit>& modified, std::vector<Change
   }
 }
 
-template void slideChanges(Text<char>&, Text<char>&, std::vector<Change>&);
-template void slideChanges(Text<char16_t>&, Text<char16_t>&, std::vector<Change>&);
+template void slideChanges(Text<char>&, Text<char>&, std::pmr::vector<Change>&);
+template void slideChanges(Text<char16_t>&, Text<char16_t>&, std::pmr::vector<Change>&);
 
 }  // namespace MarletDiff

@@ -20,6 +20,6 @@ struct Text {
 /// line's start, at the outer edge of a comment, at a word's start, at a word's end. Of equally good places it
 /// takes the last. Changes are given by offsets; two may touch afterwards, but only where that is better.
 template <class Unit>
-void slideChanges(Text<Unit>& original, Text<Unit>& modified, std::vector<Change>& changes);
+void slideChanges(Text<Unit>& original, Text<Unit>& modified, std::pmr::vector<Change>& changes);
 
 }  // namespace MarletDiff

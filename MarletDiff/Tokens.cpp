@@ -67,7 +67,7 @@ std::uint64_t mixed(std::uint64_t a, std::uint64_t b) {
 /// foresee which are.
 class StartsWriter {
  public:
-  explicit StartsWriter(std::vector<std::uint32_t>& starts) : starts_(starts) {}
+  explicit StartsWriter(std::pmr::vector<std::uint32_t>& starts) : starts_(starts) {}
   void add(std::uint32_t place, bool isStart = true) {
     block_[count_] = place;
     count_ += isStart;
@@ -79,7 +79,7 @@ class StartsWriter {
   }
 
  private:
-  std::vector<std::uint32_t>& starts_;
+  std::pmr::vector<std::uint32_t>& starts_;
   std::array<std::uint32_t, 256> block_;
   std::size_t count_ = 0;
 };

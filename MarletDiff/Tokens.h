@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <memory_resource>
 #include <string_view>
 #include <vector>
 
@@ -11,10 +12,12 @@ namespace MarletDiff {
 /// A stretch of a text, cut into tokens.
 template <class Unit>
 struct Tokens {
+  explicit Tokens(std::pmr::memory_resource* memory) : starts(memory), numbers(memory) {}
+
   View<Unit> text;
   /// Where the tokens start, and behind the last one where it ends.
-  std::vector<std::uint32_t> starts;
-  std::vector<std::uint32_t> numbers;
+  std::pmr::vector<std::uint32_t> starts;
+  std::pmr::vector<std::uint32_t> numbers;
 
   std::uint32_t count() const { return static_cast<std::uint32_t>(starts.size()) - 1; }
   View<Unit> operator[](std::size_t index) const {
@@ -36,6 +39,8 @@ struct Tokens {
 template <class Unit>
 class TokenNumbers {
  public:
+  explicit TokenNumbers(std::pmr::memory_resource* memory) : slots_(memory), firstPlaces_(memory) {}
+
   /// Numbers those of the original from 0 on, in the order in which they come first; what of the modified text
   /// isn't among them is `size()`.
   void number(Tokens<Unit>& original, Tokens<Unit>& modified);
@@ -55,10 +60,10 @@ class TokenNumbers {
   /// The slot of a token of that hash, or the free one where it belongs.
   Slot& slot(View<Unit> token, std::uint64_t hash, const Tokens<Unit>& original);
 
-  std::vector<Slot> slots_;
+  std::pmr::vector<Slot> slots_;
   std::size_t mask_ = 0;
   /// Where in the original each number comes first.
-  std::vector<std::uint32_t> firstPlaces_;
+  std::pmr::vector<std::uint32_t> firstPlaces_;
 };
 
 }  // namespace MarletDiff

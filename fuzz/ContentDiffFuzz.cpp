@@ -13,6 +13,15 @@ void require(bool condition) {
   if (!condition) std::abort();
 }
 
+/// Texts that UTF-8 can hold have the same hunks in it.
+void checkInUTF8(std::u16string_view original, std::u16string_view modified, DiffOptions options,
+                 const std::vector<DiffDescriptor>& hunks) {
+  const auto before = MarletFoundation::utf8FromUTF16(original), after = MarletFoundation::utf8FromUTF16(modified);
+  if (!before || !after) return;
+  require(diffContent(*before, *after, options) == hunks);
+  require(mergeContent(*before, hunks) == *after);
+}
+
 /// What must hold of the hunks between two texts.
 std::vector<DiffDescriptor> checkedDiff(std::u16string_view original, std::u16string_view modified,
                                         DiffOptions options) {
@@ -20,6 +29,7 @@ std::vector<DiffDescriptor> checkedDiff(std::u16string_view original, std::u16st
   require(hunks == diffContent(original, modified, options));
   require(hunks.empty() == (original == modified));
   require(mergeContent(original, hunks) == modified);
+  checkInUTF8(original, modified, options, hunks);
   auto starts = MarletFoundation::graphemeStarts(original);
   starts.push_back(true);
   std::int64_t done = -1;
@@ -56,9 +66,18 @@ void applyAnything(std::u16string_view base, std::u16string_view input) {
     hunks.push_back({{location, length}, {}, content, std::u16string(input.substr(i + 2, 2))});
   }
   const auto half = std::span<const DiffDescriptor>(hunks).first(hunks.size() / 2);
+  const auto otherHalf = std::span<const DiffDescriptor>(hunks).subspan(half.size());
+  std::optional<std::u16string> result;
   try {
-    mergeContent(base, half, std::span<const DiffDescriptor>(hunks).subspan(half.size()));
+    result = mergeContent(base, half, otherHalf);
   } catch (const MarletFoundation::ErrorObject&) {
+  }
+  const auto utf8 = MarletFoundation::utf8FromUTF16(base);
+  if (!utf8) return;
+  try {
+    require(mergeContent(*utf8, half, otherHalf) == MarletFoundation::utf8FromUTF16(result.value()));
+  } catch (const MarletFoundation::ErrorObject& error) {
+    require(!result || error.domain() == MarletFoundation::PosixErrorDomain);
   }
 }
 

@@ -58,9 +58,19 @@ void expectLaws(std::u16string_view original, std::u16string_view modified, cons
   }
 }
 
+/// Fails unless the texts, with what is ill-formed replaced, give the same hunks in both encodings.
+void expectSameInUTF8(std::u16string_view original, std::u16string_view modified, DiffOptions options) {
+  const auto before = utf8FromUTF16Lossy(original), after = utf8FromUTF16Lossy(modified);
+  const auto hunks = diffContent(before, after, options);
+  RC_ASSERT(hunks == diffContent(*utf16FromUTF8(before), *utf16FromUTF8(after), options));
+  RC_ASSERT(mergeContent(before, hunks) == after);
+}
+
 void expectLaws(std::u16string_view original, std::u16string_view modified) {
   expectLaws(original, modified, diffContent(original, modified), false);
   expectLaws(original, modified, diffContent(original, modified, smaller), true);
+  expectSameInUTF8(original, modified, {});
+  expectSameInUTF8(original, modified, smaller);
 }
 
 TEST(ContentDiff, LeadsFromOneTextToTheOther) {

@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include <cerrno>
+
 #include "MarletDiff/ContentDiff.h"
 #include "MarletDiff/Texts.h"
 #include "MarletFoundation/Platform/ErrorObject.h"
@@ -15,13 +17,27 @@ using MarletDiff::mergeContent;
 using Hunks = std::vector<DiffDescriptor>;
 constexpr auto largest = std::numeric_limits<std::int64_t>::max();
 
-/// The merged text, or the error's printed form.
-std::string merged(std::u16string_view base, const Hunks& diff, const Hunks& otherDiff = {}) {
+std::string printed(std::string text) { return text; }
+std::string printed(const std::u16string& text) { return utf8FromUTF16Lossy(text); }
+
+template <class Text>
+std::string mergedIn(const Text& base, const Hunks& diff, const Hunks& otherDiff) {
   try {
-    return utf8FromUTF16Lossy(mergeContent(base, diff, otherDiff));
+    return printed(mergeContent(base, diff, otherDiff));
   } catch (const ErrorObject& error) {
     return error.description();
   }
+}
+
+/// The merged text, or the error's printed form: the same in both encodings where UTF-8 can tell.
+std::string merged(std::u16string_view base, const Hunks& diff, const Hunks& otherDiff = {}) {
+  const auto result = mergedIn(base, diff, otherDiff);
+  const auto isWellFormed = [](const DiffDescriptor& hunk) { return utf8FromUTF16(hunk.modifiedContent).has_value(); };
+  if (const auto utf8 = utf8FromUTF16(base); utf8 && std::all_of(diff.begin(), diff.end(), isWellFormed) &&
+                                             std::all_of(otherDiff.begin(), otherDiff.end(), isWellFormed)) {
+    EXPECT_EQ(mergedIn(*utf8, diff, otherDiff), result);
+  }
+  return result;
 }
 
 TEST(ContentMerge, RefusesHunksThatAreNotOfTheBase) {
@@ -53,6 +69,13 @@ TEST(ContentMerge, RefusesHunksThatAreNotOfTheBase) {
     EXPECT_EQ(merged(base, hunks), failure);
     EXPECT_EQ(merged(base, {hunk(0, u"abc", u"")}, hunks), failure);
   }
+}
+
+TEST(ContentMerge, RefusesWhatUTF8CannotHold) {
+  const auto notUTF8 = ErrorObject(std::string(PosixErrorDomain), EILSEQ).description();
+  EXPECT_EQ(mergedIn(std::string("a\xff"), {}, {}), notUTF8);
+  EXPECT_EQ(mergedIn(std::string("a"), {hunk(0, u"a", {char16_t{0xD83D}})}, {}), notUTF8);
+  EXPECT_THROW(MarletDiff::diffContent("a", "a\xff"), ErrorObject);
 }
 
 TEST(ContentMerge, AppliesOneDiffByItsOriginalRanges) {

@@ -15,19 +15,20 @@ using namespace MarletFoundation;
 
 namespace {
 
-constexpr auto smaller = MarletDiff::DiffOptions::SmallerHunks;
-
 bool isDirectory(const std::string& path) {
   return orFailWith(ExitStatus::unreadablePath, path,
                     [&] { return FileManager::isDirectory(URL::file(path)); });
 }
 
-std::u16string readText(const std::string& path) {
-  const auto data =
+Data readText(const std::string& path) {
+  auto data =
       orFailWith(ExitStatus::unreadablePath, path, [&] { return FileManager::readFile(URL::file(path)); });
-  auto text = utf16FromUTF8(data.view());
-  if (!text) throw CommandFailure{ExitStatus::negative, path + ": this is not text in UTF-8."};
-  return *std::move(text);
+  if (!isValidUTF8(data.view())) throw CommandFailure{ExitStatus::negative, path + ": this is not text in UTF-8."};
+  return data;
+}
+
+std::vector<MarletDiff::DiffDescriptor> smallerHunks(const Data& original, const Data& updated) {
+  return MarletDiff::diffContent(original.view(), updated.view(), MarletDiff::DiffOptions::SmallerHunks);
 }
 
 ExitStatus diffTexts(const std::string& original, const std::string& updated, const BookDiffOptions& options,
@@ -36,7 +37,8 @@ ExitStatus diffTexts(const std::string& original, const std::string& updated, co
     throw CommandFailure{ExitStatus::wrongUsage,
                          *options.output + ": a pack is made of two books, not of files."};
   }
-  const auto hunks = MarletDiff::diffContent(readText(original), readText(updated), smaller);
+  const auto before = readText(original), after = readText(updated);
+  const auto hunks = smallerHunks(before, after);
   if (options.asJSON) {
     std::cout << dumped(hunksJSON(hunks)) << "\n";
   } else {
@@ -46,7 +48,7 @@ ExitStatus diffTexts(const std::string& original, const std::string& updated, co
 }
 
 /// The place and the three texts of a conflict.
-void printConflict(const ErrorObject& error, std::u16string_view base, const std::string& path,
+void printConflict(const ErrorObject& error, const std::u16string& base, const std::string& path,
                    const Terminal& terminal) {
   const auto location = std::get<std::int64_t>(error.value(MarletDiff::LocationKey).value());
   const auto line = 1 + std::count(base.begin(), base.begin() + location, u'\n');
@@ -74,11 +76,9 @@ ExitStatus merge(const std::string& base, const std::string& ours, const std::st
     const auto text = readText(base), ourText = readText(ours), theirText = readText(theirs);
     std::string merged;
     try {
-      merged =
-          utf8FromUTF16Lossy(MarletDiff::mergeContent(text, MarletDiff::diffContent(text, ourText, smaller),
-                                                      MarletDiff::diffContent(text, theirText, smaller)));
+      merged = MarletDiff::mergeContent(text.view(), smallerHunks(text, ourText), smallerHunks(text, theirText));
     } catch (const ErrorObject& error) {
-      printConflict(error, text, base, terminal);
+      printConflict(error, *utf16FromUTF8(text.view()), base, terminal);
       return ExitStatus::negative;
     }
     if (!output) {
