@@ -47,7 +47,8 @@ bool isOfParagraphSeparator(View<Unit> text, std::size_t offset) {
 template <class Unit>
 bool isWordAt(View<Unit> text, std::size_t offset) {
   const auto unit = text[offset];
-  return isASCII(unit) ? asciiWordUnits[static_cast<std::size_t>(unit)] : !isOfParagraphSeparator(text, offset);
+  return isASCII(unit) ? asciiWordUnits[static_cast<std::size_t>(unit)]
+                       : !isOfParagraphSeparator(text, offset);
 }
 
 /// Whether a unit ends a line by itself.

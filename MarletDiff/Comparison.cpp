@@ -11,8 +11,8 @@ constexpr auto none = std::numeric_limits<std::uint32_t>::max();
 }  // namespace
 
 /// Takes the tokens without a partner out of both lists.
-void Comparison::dropUnmatched(std::pmr::vector<std::uint32_t>& original, std::pmr::vector<std::uint32_t>& modified,
-                               std::size_t numbers) {
+void Comparison::dropUnmatched(std::pmr::vector<std::uint32_t>& original,
+                               std::pmr::vector<std::uint32_t>& modified, std::size_t numbers) {
   occurrences_.assign(numbers + 1, {});
   for (const auto number : original) occurrences_[number].original.add();
   for (const auto number : modified) occurrences_[number].modified.add();
@@ -71,8 +71,8 @@ void Comparison::findAnchors(const std::pmr::vector<std::uint32_t>& original) {
 }
 
 const std::pmr::vector<Change>& Comparison::changes(std::pmr::vector<std::uint32_t>& original,
-                                               std::pmr::vector<std::uint32_t>& modified, std::size_t numbers,
-                                               std::int64_t& budget) {
+                                                    std::pmr::vector<std::uint32_t>& modified,
+                                                    std::size_t numbers, std::int64_t& budget) {
   const auto originalSize = static_cast<std::uint32_t>(original.size());
   const auto modifiedSize = static_cast<std::uint32_t>(modified.size());
   dropUnmatched(original, modified, numbers);

@@ -33,8 +33,9 @@ class Comparison {
   /// them. A number is less than `numbers`, or that itself for a modified token without a partner. Takes its
   /// work off `budget`; where that ends, a change takes in all that isn't compared yet. Leaves in the lists just
   /// the tokens that have a partner in the other.
-  const std::pmr::vector<Change>& changes(std::pmr::vector<std::uint32_t>& original, std::pmr::vector<std::uint32_t>& modified,
-                                     std::size_t numbers, std::int64_t& budget);
+  const std::pmr::vector<Change>& changes(std::pmr::vector<std::uint32_t>& original,
+                                          std::pmr::vector<std::uint32_t>& modified, std::size_t numbers,
+                                          std::int64_t& budget);
 
  private:
   /// None, one or more.

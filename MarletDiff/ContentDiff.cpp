@@ -44,8 +44,8 @@ std::size_t commonSuffix(View<Unit> a, View<Unit> b) {
   const auto *aEnd = a.data() + a.size(), *bEnd = b.data() + b.size();
   std::size_t length = 0;
   while (length + blockLength <= shorter &&
-         std::memcmp(aEnd - length - blockLength, bEnd - length - blockLength,
-                     blockLength * sizeof(Unit)) == 0) {
+         std::memcmp(aEnd - length - blockLength, bEnd - length - blockLength, blockLength * sizeof(Unit)) ==
+             0) {
     length += blockLength;
   }
   while (length < shorter &&
@@ -120,11 +120,13 @@ class ContentDiff {
   static bool startsToken(Text<Unit>& text, std::size_t offset, Level level);
   std::vector<DiffDescriptor> descriptors() const;
 
-  static void cut(Text<Unit>& text, std::uint32_t start, std::uint32_t end, Level level, Tokens<Unit>& tokens);
+  static void cut(Text<Unit>& text, std::uint32_t start, std::uint32_t end, Level level,
+                  Tokens<Unit>& tokens);
 
   /// Kept from part to part, for each level that is under way.
   struct Workspace {
-    explicit Workspace(std::pmr::memory_resource* memory) : original(memory), modified(memory), comparison(memory) {}
+    explicit Workspace(std::pmr::memory_resource* memory)
+        : original(memory), modified(memory), comparison(memory) {}
     Tokens<Unit> original;
     Tokens<Unit> modified;
     Comparison comparison;
@@ -143,7 +145,8 @@ class ContentDiff {
 };
 
 template <class Unit>
-void ContentDiff<Unit>::cut(Text<Unit>& text, std::uint32_t start, std::uint32_t end, Level level, Tokens<Unit>& tokens) {
+void ContentDiff<Unit>::cut(Text<Unit>& text, std::uint32_t start, std::uint32_t end, Level level,
+                            Tokens<Unit>& tokens) {
   tokens.text = text.view;
   switch (level) {
     case Level::lines:
@@ -244,7 +247,8 @@ std::vector<DiffDescriptor> ContentDiff<Unit>::descriptors() const {
   std::int64_t at = 0, modifiedAt = 0;
   for (const auto& change : changes_) {
     // The text since the last change is equal, and as long on both sides.
-    const auto between = static_cast<std::int64_t>(utf16Length(original_.view.substr(done, change.original - done)));
+    const auto between =
+        static_cast<std::int64_t>(utf16Length(original_.view.substr(done, change.original - done)));
     auto content = utf16(original_.view.substr(change.original, change.originalEnd - change.original));
     auto modified = utf16(modified_.view.substr(change.modified, change.modifiedEnd - change.modified));
     const MarletFoundation::TextRange range{at + between, std::ssize(content)};
@@ -272,7 +276,8 @@ std::vector<DiffDescriptor> diffContent(std::u16string_view original, std::u16st
              std::u16string(original),
              std::u16string(modified)}};
   }
-  return ContentDiff(original, modified, original.size() + modified.size(), asksForSmallerHunks(options)).run();
+  return ContentDiff(original, modified, original.size() + modified.size(), asksForSmallerHunks(options))
+      .run();
 }
 
 std::vector<DiffDescriptor> diffContent(std::string_view original, std::string_view modified,

@@ -96,7 +96,8 @@ bool changesWordBefore(View<Unit> base, const Edit& edit) {
 /// The same for the word behind the place. (The offset ahead of 0 is beyond all texts.)
 template <class Unit>
 bool changesWordBehind(View<Unit> base, const Edit& edit) {
-  const bool joins = edit.text.empty() ? hasWordAt(base, edit.start - 1) : isWordAt(edit.text, edit.text.size() - 1);
+  const bool joins =
+      edit.text.empty() ? hasWordAt(base, edit.start - 1) : isWordAt(edit.text, edit.text.size() - 1);
   return hasWordAt(base, edit.end - 1) || joins;
 }
 

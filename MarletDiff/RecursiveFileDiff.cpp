@@ -163,7 +163,8 @@ class TreeDiff {
     const auto updatedContents = contents ? updated_.contents(after, updated, name) : std::nullopt;
     if (!updatedContents || !isDeltaText(contents->view()) || !isDeltaText(updatedContents->view())) {
       result_.push_back({FileDiffDescriptor::Replaced{path}});
-    } else if (auto hunks = diffContent(contents->view(), updatedContents->view(), options_); !hunks.empty()) {
+    } else if (auto hunks = diffContent(contents->view(), updatedContents->view(), options_);
+               !hunks.empty()) {
       result_.push_back({FileDiffDescriptor::Modified{path, std::move(hunks)}});
     }
   }

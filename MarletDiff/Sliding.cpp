@@ -13,15 +13,18 @@ bool startsWith(View<Unit> text, std::string_view ascii) {
 
 template <class Unit>
 bool endsWith(View<Unit> text, std::string_view ascii) {
-  return text.size() >= ascii.size() && std::equal(ascii.begin(), ascii.end(), text.end() - std::ssize(ascii));
+  return text.size() >= ascii.size() &&
+         std::equal(ascii.begin(), ascii.end(), text.end() - std::ssize(ascii));
 }
 
 /// Whether a place stands within a comment's delimiter. A quote beside a comment is a part of it: what is
 /// written between the quotes of a field is then not taken for text behind the field.
 template <class Unit>
 bool dividesDelimiter(View<Unit> before, View<Unit> after) {
-  return (endsWith(before, "/") && startsWith(after, "*")) || (endsWith(before, "*") && startsWith(after, "/")) ||
-         (endsWith(before, "\"") && startsWith(after, "/*")) || (endsWith(before, "*/") && startsWith(after, "\""));
+  return (endsWith(before, "/") && startsWith(after, "*")) ||
+         (endsWith(before, "*") && startsWith(after, "/")) ||
+         (endsWith(before, "\"") && startsWith(after, "/*")) ||
+         (endsWith(before, "*/") && startsWith(after, "\""));
 }
 
 /// How good a place is to start or end a change at.

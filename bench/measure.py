@@ -29,9 +29,8 @@ def benchmarks(program, repetitions):
 
 
 def in_turns(commands, rounds, directory):
-    """The median seconds of processor time and the most bytes of memory of each command, run one after the other ROUNDS
-    times."""
-    seconds, memory = [[] for _ in commands], [0 for _ in commands]
+    """The median seconds of processor time of each command, run one after the other ROUNDS times."""
+    seconds = [[] for _ in commands]
     for _ in range(rounds):
         for i, command in enumerate(commands):
             process = subprocess.Popen([str(word) for word in command], cwd=directory, stdout=subprocess.DEVNULL)
@@ -39,8 +38,17 @@ def in_turns(commands, rounds, directory):
             if os.waitstatus_to_exitcode(status) not in (0, 1):
                 raise SystemExit(f"{command} failed")
             seconds[i].append(usage.ru_utime + usage.ru_stime)
-            memory[i] = max(memory[i], usage.ru_maxrss * 1024)
-    return [(statistics.median(s), m) for s, m in zip(seconds, memory)]
+    return [statistics.median(s) for s in seconds]
+
+
+def peak_memory(command, directory):
+    """The most bytes of memory that a command held. A small program starts it, for what a process held before it became another
+    one counts, and this one holds more than some that are measured."""
+    with tempfile.NamedTemporaryFile("r") as out:
+        words = ["/usr/bin/time", "-f", "%M", "-o", out.name, *map(str, command)]
+        if subprocess.run(words, cwd=directory, stdout=subprocess.DEVNULL, check=False).returncode not in (0, 1):
+            raise SystemExit(f"{command} failed")
+        return int(out.read().split()[-1]) * 1024
 
 
 def system_calls(command, opened):

@@ -16,7 +16,8 @@ void require(bool condition) {
 /// Texts that UTF-8 can hold have the same hunks in it.
 void checkInUTF8(std::u16string_view original, std::u16string_view modified, DiffOptions options,
                  const std::vector<DiffDescriptor>& hunks) {
-  const auto before = MarletFoundation::utf8FromUTF16(original), after = MarletFoundation::utf8FromUTF16(modified);
+  const auto before = MarletFoundation::utf8FromUTF16(original),
+             after = MarletFoundation::utf8FromUTF16(modified);
   if (!before || !after) return;
   require(diffContent(*before, *after, options) == hunks);
   require(mergeContent(*before, hunks) == *after);

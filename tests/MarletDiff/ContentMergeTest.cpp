@@ -32,7 +32,9 @@ std::string mergedIn(const Text& base, const Hunks& diff, const Hunks& otherDiff
 /// The merged text, or the error's printed form: the same in both encodings where UTF-8 can tell.
 std::string merged(std::u16string_view base, const Hunks& diff, const Hunks& otherDiff = {}) {
   const auto result = mergedIn(base, diff, otherDiff);
-  const auto isWellFormed = [](const DiffDescriptor& hunk) { return utf8FromUTF16(hunk.modifiedContent).has_value(); };
+  const auto isWellFormed = [](const DiffDescriptor& hunk) {
+    return utf8FromUTF16(hunk.modifiedContent).has_value();
+  };
   if (const auto utf8 = utf8FromUTF16(base); utf8 && std::all_of(diff.begin(), diff.end(), isWellFormed) &&
                                              std::all_of(otherDiff.begin(), otherDiff.end(), isWellFormed)) {
     EXPECT_EQ(mergedIn(*utf8, diff, otherDiff), result);

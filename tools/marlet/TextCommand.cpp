@@ -23,7 +23,8 @@ bool isDirectory(const std::string& path) {
 Data readText(const std::string& path) {
   auto data =
       orFailWith(ExitStatus::unreadablePath, path, [&] { return FileManager::readFile(URL::file(path)); });
-  if (!isValidUTF8(data.view())) throw CommandFailure{ExitStatus::negative, path + ": this is not text in UTF-8."};
+  if (!isValidUTF8(data.view()))
+    throw CommandFailure{ExitStatus::negative, path + ": this is not text in UTF-8."};
   return data;
 }
 
@@ -76,7 +77,8 @@ ExitStatus merge(const std::string& base, const std::string& ours, const std::st
     const auto text = readText(base), ourText = readText(ours), theirText = readText(theirs);
     std::string merged;
     try {
-      merged = MarletDiff::mergeContent(text.view(), smallerHunks(text, ourText), smallerHunks(text, theirText));
+      merged =
+          MarletDiff::mergeContent(text.view(), smallerHunks(text, ourText), smallerHunks(text, theirText));
     } catch (const ErrorObject& error) {
       printConflict(error, *utf16FromUTF8(text.view()), base, terminal);
       return ExitStatus::negative;
