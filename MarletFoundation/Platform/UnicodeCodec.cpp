@@ -177,30 +177,6 @@ bool decodeBlock(const char*& place, const char* end, char16_t*& outPlace, const
   return true;
 }
 
-struct Part {
-  std::size_t bytes = 0;
-  /// As many of UTF-16.
-  std::size_t units = 0;
-};
-
-/// What stands in front of the first byte that belongs to no well-formed character.
-Part wellFormedPart(std::string_view text) {
-  const auto* const end = text.data() + text.size();
-  Part part;
-  while (part.bytes < text.size()) {
-    const auto ascii = asciiPrefixLength(text.substr(part.bytes));
-    part.bytes += ascii;
-    part.units += ascii;
-    while (part.bytes < text.size() && !isASCII(text[part.bytes])) {
-      const auto scalar = decodeUTF8(text.data() + part.bytes, end);
-      if (!scalar.length) return part;
-      part.bytes += scalar.length;
-      part.units += scalar.length == 4 ? 2 : 1;
-    }
-  }
-  return part;
-}
-
 enum class Unpaired { fail, replace };
 
 /// The same the other way. False at an unpaired surrogate.
@@ -272,7 +248,7 @@ std::optional<std::string> utf8FromUTF16(std::u16string_view text) { return utf8
 
 std::string utf8FromUTF16Lossy(std::u16string_view text) { return *utf8(text, Unpaired::replace); }
 
-bool isValidUTF8(std::string_view text) { return utf8PrefixLength(text) == text.size(); }
+bool isValidUTF8(std::string_view text) { return utf16Length(text).has_value(); }
 
 std::size_t asciiPrefixLength(std::string_view text) {
   std::size_t i = 0;
@@ -292,11 +268,30 @@ std::size_t asciiPrefixLength(std::string_view text) {
   return i;
 }
 
-std::size_t utf8PrefixLength(std::string_view text) { return wellFormedPart(text).bytes; }
+std::size_t utf8PrefixLength(std::string_view text) {
+  const auto* const end = text.data() + text.size();
+  for (std::size_t i = 0; i < text.size();) {
+    if (isASCII(text[i])) {
+      i += asciiPrefixLength(text.substr(i));
+      continue;
+    }
+    const auto scalar = decodeUTF8(text.data() + i, end);
+    if (!scalar.length) return i;
+    i += scalar.length;
+  }
+  return text.size();
+}
 
 std::optional<std::size_t> utf16Length(std::string_view text) {
-  const auto part = wellFormedPart(text);
-  return part.bytes == text.size() ? std::optional(part.units) : std::nullopt;
+  char16_t block[blockSize + slack];
+  std::size_t length = 0;
+  const auto* const end = text.data() + text.size();
+  for (const auto* at = text.data(); at < end;) {
+    auto* out = block;
+    if (!decodeBlock(at, end, out, block + blockSize)) return std::nullopt;
+    length += static_cast<std::size_t>(out - block);
+  }
+  return length;
 }
 
 }  // namespace MarletFoundation
