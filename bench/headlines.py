@@ -133,7 +133,7 @@ GROWTH = {
 EXPONENT_ASKED = 1.1
 GROWTH_WHY = ("Where more is seen: blocks beyond 32 MB come as fresh pages from the kernel at each run, and the tables of tokens outgrow the "
               "processor's caches. With an allocator that keeps blocks (`GLIBC_TUNABLES=glibc.malloc.mmap_max=0:"
-              "glibc.malloc.trim_threshold=17179869184`) diffing grew with 1.15 and merging with 1.12, in the first step with 1.05 and 1.06. "
+              "glibc.malloc.trim_threshold=17179869184`) diffing grew with 1.17 and merging with 1.12. "
               "Scanning takes little longer than the memory takes to give the text: the smallest lies in the caches, the largest, some "
               "68 MB, doesn't, and between runs the exponent was 0.99 to 1.18. "
               "Memory of the smallest size is hardly more than what the process has anyway.")

@@ -248,7 +248,7 @@ std::optional<std::string> utf8FromUTF16(std::u16string_view text) { return utf8
 
 std::string utf8FromUTF16Lossy(std::u16string_view text) { return *utf8(text, Unpaired::replace); }
 
-bool isValidUTF8(std::string_view text) { return utf16Length(text).has_value(); }
+bool isValidUTF8(std::string_view text) { return utf8PrefixLength(text) == text.size(); }
 
 std::size_t asciiPrefixLength(std::string_view text) {
   std::size_t i = 0;
@@ -258,12 +258,11 @@ std::size_t asciiPrefixLength(std::string_view text) {
     const auto others = static_cast<unsigned>(_mm_movemask_epi8(bytes));
     if (others) return i + static_cast<std::size_t>(std::countr_zero(others));
   }
-#else
+#endif
   for (std::uint64_t word; i + sizeof word <= text.size(); i += sizeof word) {
     std::memcpy(&word, text.data() + i, sizeof word);
     if (word & 0x8080808080808080) break;
   }
-#endif
   while (i < text.size() && isASCII(text[i])) ++i;
   return i;
 }
