@@ -5,6 +5,7 @@
 
 #include "MarletFoundation/Marlet/CutsceneBookPageSnapshot.h"
 #include "MarletFoundation/Marlet/MarletBookPageSnapshot.h"
+#include "MarletFoundation/Platform/OneState.h"
 
 namespace MarletFoundation {
 
@@ -32,17 +33,53 @@ void requirePage(const MarletBookSnapshot& book, std::string_view chapterFilenam
   firstNamed(chapter.pages, pageFilename, Case::NoSuchPage);
 }
 
-std::optional<DiffPackSnapshot> readPack(const URL& bookURL) {
-  const auto url =
-      bookURL.appendingPathComponent("Edits", true).appendingPathComponent("UserEdits.diffpack", true);
-  std::optional<FileWrapper> wrapper;
-  try {
-    wrapper.emplace(url);
-  } catch (const ErrorObject& error) {
-    if (error.code() != ENOENT) throw;
-    return std::nullopt;
+/// The directories that a page is read from, each opened by its own URL.
+struct PageReading {
+  /// Nothing where it isn't needed, or can't be opened, which a host's own snapshot makes up for.
+  std::optional<FileWrapper> book;
+  std::optional<FileWrapper> pack, page;
+
+  PageReading(const URL& bookURL, bool needsBook) {
+    if (!needsBook) return;
+    try {
+      book.emplace(bookURL);
+    } catch (const ErrorObject&) {
+    }
   }
-  return DiffPackSnapshot(*wrapper, bookURL.appendingPathComponent("Contents", true));
+
+  bool isUnchanged() const {
+    return (!book || book->isUnchanged()) && (!pack || pack->isUnchanged()) && (!page || page->isUnchanged());
+  }
+
+  std::optional<DiffPackSnapshot> readPack(const URL& bookURL) {
+    // Shows in the book whether a pack comes or goes.
+    if (const auto edits = book ? book->child("Edits") : std::nullopt) edits->child("UserEdits.diffpack");
+    try {
+      pack.emplace(
+          bookURL.appendingPathComponent("Edits", true).appendingPathComponent("UserEdits.diffpack", true));
+    } catch (const ErrorObject& error) {
+      if (error.code() != ENOENT) throw;
+      return std::nullopt;
+    }
+    return DiffPackSnapshot(*pack, bookURL.appendingPathComponent("Contents", true));
+  }
+
+  const FileWrapper& openPage(const URL& url) {
+    page.emplace(url);
+    // Those that the learner's edits go into are read by their paths: looked at here, they can't change unseen.
+    page->child("Contents.swift");
+    page->child("ResultInfo.plist");
+    return *page;
+  }
+};
+
+std::unique_ptr<BookPageSnapshotType> readPage(PageReading& reading, const URL& url,
+                                               const std::optional<DiffPackSnapshot>& pack) {
+  const auto& page = reading.openPage(url);
+  const auto kind = url.pathExtension();
+  if (kind == "marletpage") return std::make_unique<MarletBookPageSnapshot>(page, url, pack);
+  if (kind == "cutscenepage") return std::make_unique<CutsceneBookPageSnapshot>(page, url);
+  throw BookPageLoadingError(Case::UnknownPageType, kind);
 }
 
 }  // namespace
@@ -50,24 +87,23 @@ std::optional<DiffPackSnapshot> readPack(const URL& bookURL) {
 std::unique_ptr<BookPageSnapshotType> snapshotForPageWithFilename(
     std::string_view pageFilename, std::string_view chapterFilename, const URL& bookURL,
     const MarletBookSnapshot* marletBookSnapshot, const std::optional<DiffPackSnapshot>& userEditsDiffPack) {
-  if (marletBookSnapshot) {
-    requirePage(*marletBookSnapshot, chapterFilename, pageFilename);
-  } else {
-    requirePage(MarletBookSnapshot(FileWrapper(bookURL), bookURL), chapterFilename, pageFilename);
-  }
-  std::optional<DiffPackSnapshot> ownPack;
-  if (!userEditsDiffPack) ownPack = readPack(bookURL);
-  const auto& pack = userEditsDiffPack ? userEditsDiffPack : ownPack;
   const auto pageURL = bookURL.appendingPathComponent("Contents", true)
                            .appendingPathComponent("Chapters", true)
                            .appendingPathComponent(chapterFilename, true)
                            .appendingPathComponent("Pages", true)
                            .appendingPathComponent(pageFilename, true);
-  const FileWrapper page(pageURL);
-  const auto kind = pageURL.pathExtension();
-  if (kind == "marletpage") return std::make_unique<MarletBookPageSnapshot>(page, pageURL, pack);
-  if (kind == "cutscenepage") return std::make_unique<CutsceneBookPageSnapshot>(page, pageURL);
-  throw BookPageLoadingError(Case::UnknownPageType, kind);
+  return readOneState(
+      bookURL.path(), [&] { return PageReading(bookURL, !marletBookSnapshot || !userEditsDiffPack); },
+      [&](PageReading& reading) {
+        if (marletBookSnapshot) {
+          requirePage(*marletBookSnapshot, chapterFilename, pageFilename);
+        } else {
+          const auto book = reading.book ? *reading.book : FileWrapper(bookURL);
+          requirePage(MarletBookSnapshot(book, bookURL), chapterFilename, pageFilename);
+        }
+        if (userEditsDiffPack) return readPage(reading, pageURL, userEditsDiffPack);
+        return readPage(reading, pageURL, reading.readPack(bookURL));
+      });
 }
 
 }  // namespace MarletFoundation

@@ -104,7 +104,10 @@ FileWrapper CutsceneBookPageSnapshot::fileWrapper() const {
   FileWrapper::Children children;
   children.emplace(Keys::Manifest, FileWrapper::regularFile(PropertyListSerialization::write(
                                        manifest, PropertyListFormat::binary)));
-  if (resourcesDirectoryURL_) children.emplace(Keys::Resources, FileWrapper(*resourcesDirectoryURL_));
+  if (resourcesDirectoryURL_) {
+    FileManager::resourceIsReachable(*resourcesDirectoryURL_);
+    children.emplace(Keys::Resources, FileWrapper::reference(*resourcesDirectoryURL_));
+  }
   return FileWrapper::directory(std::move(children));
 }
 

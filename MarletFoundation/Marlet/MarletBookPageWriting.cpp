@@ -29,9 +29,9 @@ FileWrapper MarletBookPageSnapshot::fileWrapper() const {
   auto source = utf8FromUTF16(text_);
   if (!source) fatalError("A page's text must be valid UTF-16 to be written!");
   add("Contents.swift", FileWrapper::regularFile(Data(*std::move(source))));
-  addIfReadable(children, "Sources", sourcesDirectoryURL_);
-  addIfReadable(children, "Resources", resourcesDirectoryURL_);
-  addIfReadable(children, "LiveView.swift", liveViewSourceFileURL_);
+  addIfThere(children, "Sources", sourcesDirectoryURL_);
+  addIfThere(children, "Resources", resourcesDirectoryURL_);
+  addIfThere(children, "LiveView.swift", liveViewSourceFileURL_);
   static constexpr auto format = MarletResultInfoSnapshot::Format::ResultInfo;
   if (resultInfo_.needsSerialization(format))
     add("ResultInfo.plist", FileWrapper::regularFile(resultInfo_.data(format)));

@@ -36,8 +36,8 @@ FileWrapper MarletPageSnapshot::fileWrapper() const {
     throw StubMarletSerializationError("Unable to write marlet page: its text is not valid UTF-16.");
   FileWrapper::Children children;
   children.emplace("Contents.swift", FileWrapper::regularFile(Data(*std::move(source))));
-  addIfReadable(children, SourcesDirectoryName, sourcesDirectoryURL_);
-  addIfReadable(children, ResourcesDirectoryName, resourcesDirectoryURL_);
+  addIfThere(children, SourcesDirectoryName, sourcesDirectoryURL_);
+  addIfThere(children, ResourcesDirectoryName, resourcesDirectoryURL_);
   return FileWrapper::directory(std::move(children));
 }
 

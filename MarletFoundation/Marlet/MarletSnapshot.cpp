@@ -99,9 +99,9 @@ Data MarletSnapshot::manifest() const {
 FileWrapper MarletSnapshot::fileWrapper(const MarletSnapshot*) const {
   FileWrapper::Children children;
   children.emplace(ManifestFilename, FileWrapper::regularFile(manifest()));
-  addIfReadable(children, MarletIconName, marletIconURL);
-  addIfReadable(children, ResourcesDirectoryName, sharedResourcesDirectoryURL);
-  addIfReadable(children, SourcesDirectoryName, sharedSourcesDirectoryURL);
+  addIfThere(children, MarletIconName, marletIconURL);
+  addIfThere(children, ResourcesDirectoryName, sharedResourcesDirectoryURL);
+  addIfThere(children, SourcesDirectoryName, sharedSourcesDirectoryURL);
   if (isSinglePage()) {
     // The page's directory is the document's.
     children.merge(*pages[0].fileWrapper().fileWrappers());

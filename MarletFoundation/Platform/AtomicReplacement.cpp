@@ -4,8 +4,10 @@
 #include <sys/file.h>
 #include <unistd.h>
 
-#include "MarletFoundation/Platform/Digest.h"
-#include "MarletFoundation/Platform/Host.h"
+#include "MarletFoundation/Platform/CommitLock.h"
+#include "MarletFoundation/Platform/HostEnvironment.h"
+#include "MarletFoundation/Platform/StageNames.h"
+#include "MarletFoundation/Platform/TreeSurvey.h"
 
 namespace MarletFoundation {
 namespace {
@@ -23,60 +25,52 @@ struct SplitPath {
   }
 };
 
-constexpr std::string_view StageMark = ".stage.";
-constexpr std::string_view DisplacedMark = ".displaced";
-constexpr std::size_t StageLetters = 6;
-/// What the system takes for a name, less the longest that is put around one.
-constexpr std::size_t LongestName = NAME_MAX - 1 - StageMark.size() - StageLetters;
-
-/// How the names begin that stand for an item while it is replaced. A name too long to be added to is cut and
-/// told from others by a digest.
-std::string hiddenName(const std::string& name) {
-  if (name.size() <= LongestName) return "." + name;
-  MD5 digest;
-  digest.update(name);
-  std::string digits;
-  for (const auto byte : digest.final()) {
-    digits += "0123456789abcdef"[byte >> 4];
-    digits += "0123456789abcdef"[byte & 15];
-  }
-  return "." + name.substr(0, LongestName - digits.size()) + digits;
-}
-
-std::string randomLetters() {
-  auto letters = randomUUIDString();
-  std::erase(letters, '-');
-  letters.resize(StageLetters);
-  return letters;
-}
-
 /// Whether the file system or a layer above it can't do what was asked for, rather than that it failed.
 bool isRefusal(int error) {
   return error == EINVAL || error == ENOSYS || error == EOPNOTSUPP || error == EXDEV;
 }
 
-bool isMountPoint(int parent, const std::string& name) {
-  struct statx status;
-  return ::statx(parent, name.c_str(), AT_SYMLINK_NOFOLLOW, STATX_TYPE, &status) == 0 &&
-         (status.stx_attributes & STATX_ATTR_MOUNT_ROOT) != 0;
+/// The host's own failures don't reach a writer that is done.
+void reportLeftBehind(const std::string& path, int error) noexcept {
+  try {
+    HostEnvironment::current().leftBehind(path, ErrorObject::posix(error, path));
+  } catch (...) {
+  }
+}
+
+[[noreturn]] void failStale(const std::string& path) {
+  throwPosix(ESTALE, path, "It was replaced after it had been opened.");
 }
 
 }  // namespace
 
 AtomicReplacement::AtomicReplacement(std::string path, ExistingItem existing)
     : path_(std::move(path)), existing_(existing), place_(currentPlace()) {
-  stagePrefix_ = hiddenName(place_.name) + std::string(StageMark);
-  displaced_ = hiddenName(place_.name) + std::string(DisplacedMark);
+  stagePrefix_ = stagePrefix(place_.name);
+  displaced_ = displacedName(place_.name);
   if (!place_.item) undoHalfReplacement();
   if (place_.item && existing_ == ExistingItem::Kept) throwPosix(EEXIST, path_);
-  if (place_.item && isMountPoint(place_.parent.get(), place_.name)) {
+  if (place_.item && isMountPoint(place_.parent.get(), place_.name.c_str())) {
     throwPosix(EBUSY, path_, "A mount point can't be replaced as a whole.");
   }
   clearLeftovers();
+  requireNotCancelled(path_);
+  if (replacesDirectory()) {
+    replacedDirectory_ = openReplaced();
+    struct stat opened;
+    if (::fstat(replacedDirectory_.get(), &opened) != 0) throwPosix(errno, path_);
+    if (!isSameItem(opened, *place_.item)) failStale(path_);
+  }
 }
 
-AtomicReplacement::~AtomicReplacement() {
-  if (!staging_.empty()) removeTree(place_.parent.get(), staging_);
+AtomicReplacement::~AtomicReplacement() { discard(); }
+
+/// Removes what lies at the name of the stage.
+void AtomicReplacement::discard() noexcept {
+  if (staging_.empty()) return;
+  if (const int error = removeTree(place_.parent.get(), staging_); error != 0)
+    reportLeftBehind(SplitPath(path_).parent + staging_, error);
+  staging_.clear();
 }
 
 AtomicReplacement::Place AtomicReplacement::currentPlace() const {
@@ -113,10 +107,6 @@ void AtomicReplacement::undoHalfReplacement() {
   if (moveToFreeName(displaced_, place_.name) == 0) place_ = currentPlace();
 }
 
-bool AtomicReplacement::isStage(std::string_view name) const {
-  return name.size() == stagePrefix_.size() + StageLetters && name.starts_with(stagePrefix_);
-}
-
 int AtomicReplacement::moveToFreeName(const std::string& from, const std::string& to) {
   const int parent = place_.parent.get();
   const int result = ::renameat2(parent, from.c_str(), parent, to.c_str(), RENAME_NOREPLACE);
@@ -132,18 +122,20 @@ int AtomicReplacement::moveToFreeName(const std::string& from, const std::string
 void AtomicReplacement::clearLeftovers() {
   // With the item in its place the displaced one is done with. It must not be taken for the item once a part
   // of it is gone.
-  if (place_.item) moveToFreeName(displaced_, stagePrefix_ + randomLetters());
+  if (place_.item) moveToFreeName(displaced_, newStageName(stagePrefix_));
   const auto entries =
       DiskDirectory::root(Descriptor(::openat(place_.parent.get(), ".", DirectoryFlags)))->entries();
   if (!entries) return;
   for (const auto& entry : *entries) {
-    if (!isStage(entry.name)) continue;
+    if (!isStage(entry.name, stagePrefix_)) continue;
     struct stat status;
     if (::fstatat(place_.parent.get(), entry.name.c_str(), &status, AT_SYMLINK_NOFOLLOW) != 0) continue;
     if (!S_ISREG(status.st_mode) && !S_ISDIR(status.st_mode)) continue;
     // Whoever is still building holds a lock on it.
     const Descriptor left(::openat(place_.parent.get(), entry.name.c_str(), ReadingFlags | O_NOFOLLOW));
-    if (left && ::flock(left.get(), LOCK_EX | LOCK_NB) == 0) removeTree(place_.parent.get(), entry.name);
+    if (!left || ::flock(left.get(), LOCK_EX | LOCK_NB) != 0) continue;
+    if (const int error = removeTree(place_.parent.get(), entry.name); error != 0)
+      reportLeftBehind(SplitPath(path_).parent + entry.name, error);
   }
 }
 
@@ -179,7 +171,7 @@ std::shared_ptr<DiskDirectory> AtomicReplacement::makeDirectory(mode_t mode) {
 template <class Make>
 void AtomicReplacement::start(Make make) {
   for (int attempt = 0; attempt < MostAttempts; ++attempt) {
-    staging_ = stagePrefix_ + randomLetters();
+    staging_ = newStageName(stagePrefix_);
     built_ = make();
     if (!built_ && errno == EEXIST) continue;
     if (!built_ && errno != ENOENT) break;
@@ -196,44 +188,86 @@ void AtomicReplacement::start(Make make) {
   throwPosix(error, path_);
 }
 
-void AtomicReplacement::commit() {
+void AtomicReplacement::commit(const std::function<void()>& check) {
   if (::fsync(built_.get()) != 0) throwPosix(errno, path_);
-  requireSamePlace();
-  putInPlace();
-  ::flock(built_.get(), LOCK_UN);
-  if (::fsync(place_.parent.get()) != 0 && errno != EINVAL) throwPosix(errno, path_);
-  if (staging_.empty()) return;
-  removeTree(place_.parent.get(), staging_);
-  staging_.clear();
+  requireNotCancelled(path_);
+  {
+    const CommitLock lock(place_.parent.get(), replacedDirectory_, path_);
+    requireSamePlace();
+    requireSameItem();
+    if (check) check();
+    putInPlace();
+    settle(check);
+    ::flock(built_.get(), LOCK_UN);
+  }
+  discard();
+}
+
+/// What was put in place stays only if the old item is still what it was, and the change can be flushed.
+void AtomicReplacement::settle(const std::function<void()>& check) {
+  try {
+    requireSamePlace();
+    struct stat displaced;
+    if (replacesDirectory() &&
+        (::fstatat(place_.parent.get(), staging_.c_str(), &displaced, AT_SYMLINK_NOFOLLOW) != 0 ||
+         !isSameItem(displaced, *place_.item))) {
+      failStale(path_);
+    }
+    if (check) check();
+    if (::fsync(place_.parent.get()) != 0 && errno != EINVAL) throwPosix(errno, path_);
+  } catch (...) {
+    takeBack();
+    throw;
+  }
+}
+
+/// Puts the old item back; what took its place is a stage again.
+void AtomicReplacement::takeBack() {
+  const int parent = place_.parent.get();
+  if (!staging_.empty() &&
+      ::renameat2(parent, staging_.c_str(), parent, place_.name.c_str(), RENAME_EXCHANGE) == 0)
+    return;
+  const auto old = std::exchange(staging_, {});
+  if (old.empty() && place_.item) return;  // a file is gone once another was renamed to its name
+  auto built = newStageName(stagePrefix_);
+  if (moveToFreeName(place_.name, built) != 0) return;
+  if (old.empty() || moveToFreeName(old, place_.name) == 0) staging_ = std::move(built);
 }
 
 void AtomicReplacement::requireSamePlace() const {
   const auto now = currentPlace();
   struct stat parent, parentNow;
   const bool isSame = now.name == place_.name && ::fstat(place_.parent.get(), &parent) == 0 &&
-                      ::fstat(now.parent.get(), &parentNow) == 0 && parent.st_dev == parentNow.st_dev &&
-                      parent.st_ino == parentNow.st_ino;
+                      ::fstat(now.parent.get(), &parentNow) == 0 && isSameItem(parent, parentNow);
   if (!isSame) throwPosix(ESTALE, path_, "A link on the way to the document changed while it was written.");
 }
 
+/// A directory is replaced only by who took it for what it is.
+void AtomicReplacement::requireSameItem() const {
+  struct stat now;
+  const bool isThere = ::fstatat(place_.parent.get(), place_.name.c_str(), &now, AT_SYMLINK_NOFOLLOW) == 0;
+  if (!isThere && errno != ENOENT) throwPosix(errno, path_);
+  if (isThere && existing_ == ExistingItem::Kept) throwPosix(EEXIST, path_);
+  const bool wasDirectory = replacesDirectory(), isDirectory = isThere && S_ISDIR(now.st_mode);
+  if (wasDirectory != isDirectory || (isDirectory && !isSameItem(now, *place_.item))) failStale(path_);
+}
+
 void AtomicReplacement::putInPlace() {
+  const int parent = place_.parent.get();
   struct stat built;
   if (::fstat(built_.get(), &built) != 0) throwPosix(errno, path_);
   for (int attempt = 0; attempt < MostAttempts; ++attempt) {
     struct stat old;
-    const bool exists = ::fstatat(place_.parent.get(), place_.name.c_str(), &old, AT_SYMLINK_NOFOLLOW) == 0;
+    const bool exists = ::fstatat(parent, place_.name.c_str(), &old, AT_SYMLINK_NOFOLLOW) == 0;
     if (!exists && errno != ENOENT) throwPosix(errno, path_);
     if (exists && existing_ == ExistingItem::Kept) throwPosix(EEXIST, path_);
     if (!exists) {
       if (moveToFreeName(staging_, place_.name) == 0) return staging_.clear();
-    } else if (S_ISDIR(old.st_mode) || S_ISDIR(built.st_mode)) {
-      if (::renameat2(place_.parent.get(), staging_.c_str(), place_.parent.get(), place_.name.c_str(),
-                      RENAME_EXCHANGE) == 0)
-        return;
-      if (isRefusal(errno)) return replaceInTwoSteps();
-    } else if (::renameat(place_.parent.get(), staging_.c_str(), place_.parent.get(), place_.name.c_str()) ==
-               0) {
-      return staging_.clear();
+    } else if (::renameat2(parent, staging_.c_str(), parent, place_.name.c_str(), RENAME_EXCHANGE) == 0) {
+      return;
+    } else if (isRefusal(errno)) {
+      if (S_ISDIR(old.st_mode) || S_ISDIR(built.st_mode)) return replaceInTwoSteps();
+      if (::renameat(parent, staging_.c_str(), parent, place_.name.c_str()) == 0) return staging_.clear();
     }
     if (errno != ENOENT && errno != EEXIST) throwPosix(errno, path_);
   }
@@ -253,7 +287,7 @@ void AtomicReplacement::replaceInTwoSteps() {
 
 std::optional<std::string> AtomicReplacement::displacedPath(const std::string& path) {
   const SplitPath split(path);
-  auto displaced = split.parent + hiddenName(split.name) + std::string(DisplacedMark);
+  auto displaced = split.parent + displacedName(split.name);
   struct stat status;
   const bool exists =
       ::lstat(displaced.c_str(), &status) == 0 && (S_ISDIR(status.st_mode) || S_ISREG(status.st_mode));

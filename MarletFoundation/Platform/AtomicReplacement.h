@@ -1,5 +1,6 @@
 #pragma once
 
+#include <functional>
 #include <memory>
 #include <optional>
 #include <string>
@@ -8,6 +9,7 @@
 #include "MarletFoundation/Platform/Descriptor.h"
 #include "MarletFoundation/Platform/DiskTree.h"
 #include "MarletFoundation/Platform/ExistingItem.h"
+#include "MarletFoundation/Platform/WriteCancellation.h"
 
 namespace MarletFoundation {
 
@@ -34,6 +36,8 @@ class AtomicReplacement {
   bool replacesDirectory() const { return place_.item && S_ISDIR(place_.item->st_mode); }
   /// The replaced item, opened for reading.
   Descriptor openReplaced() const;
+  /// The replaced directory, open from the start to the end; none where no directory is replaced.
+  const Descriptor& replacedDirectory() const { return replacedDirectory_; }
 
   /// Starts a file, to be filled through the descriptor, which stays this object's. It has the mode and the
   /// extended attributes of a replaced file.
@@ -41,8 +45,10 @@ class AtomicReplacement {
   /// Starts a directory.
   std::shared_ptr<DiskDirectory> makeDirectory(mode_t mode);
   /// Flushes what was started, puts it in place, flushes the directory, and removes the old item. Refuses
-  /// (ESTALE) when the path leads elsewhere by now.
-  void commit();
+  /// (ESTALE) when the path leads elsewhere by now, or to something else than at the start where that was a
+  /// directory. `check` throws when the old item is no longer what it is taken for: it is asked before and after the
+  /// two are exchanged. After any failure the old item is in its place again.
+  void commit(const std::function<void()>& check = {});
 
   /// Where the old item lies after a replacement in two steps that was cut off between them; nothing when
   /// there was none.
@@ -58,23 +64,28 @@ class AtomicReplacement {
   /// What the path means, the links at its end followed.
   Place currentPlace() const;
   void undoHalfReplacement();
-  bool isStage(std::string_view name) const;
   /// Renames within the directory, never over another item.
   int moveToFreeName(const std::string& from, const std::string& to);
   void clearLeftovers();
   template <class Make>
   void start(Make make);
   void requireSamePlace() const;
+  void requireSameItem() const;
   void putInPlace();
   void replaceInTwoSteps();
+  void settle(const std::function<void()>& check);
+  void takeBack();
+  void discard() noexcept;
 
   std::string path_;
   ExistingItem existing_;
   Place place_;              // as it was at the start
   std::string stagePrefix_;  // of the names of what is built for this name
   std::string displaced_;
+  Descriptor replacedDirectory_;
   std::string staging_;  // the name of what is being built, or of the old item once it is replaced
   Descriptor built_;
+  WriteUnderWay underWay_;
 };
 
 /// Gives `to` the owner, mode and extended attributes of `from`, as far as the file system and our rights go;

@@ -46,6 +46,10 @@ auto retrying(Call call) {
   }
 }
 
+inline bool isSameItem(const struct stat& a, const struct stat& b) {
+  return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
+}
+
 /// Whether a directory can hold an entry of that name.
 inline bool isFileName(std::string_view name) {
   return !name.empty() && name != "." && name != ".." &&

@@ -136,9 +136,10 @@ std::shared_ptr<DiskDirectory> DiskDirectory::root(Descriptor descriptor) {
 }
 
 std::shared_ptr<DiskDirectory> DiskDirectory::child(std::shared_ptr<DiskDirectory> parent, SharedString name,
-                                                    Descriptor opened) {
+                                                    Descriptor opened, ino_t number) {
   const TreeAllocator<DiskDirectory> memory(parent->memory());
   auto directory = std::allocate_shared<DiskDirectory>(memory, Key(), std::move(parent), std::move(name));
+  directory->number_ = number;
   if (opened) directory->parent_->keep(std::move(opened), directory->descriptor_);
   return directory;
 }
@@ -153,12 +154,23 @@ int DiskDirectory::descriptor() {
   for (; open->parent_ && open->descriptor_ < 0; open = open->parent_.get()) closed.push_back(open);
   int number = open->parent_ ? open->descriptor_ : tree_->root.get();
   for (auto next = closed.rbegin(); next != closed.rend(); ++next) {
-    number = tree_->openAt(open, number, (*next)->name_.c_str(), DirectoryFlags);
-    if (number < 0) return -1;
+    Descriptor opened(tree_->openAt(open, number, (*next)->name_.c_str(), DirectoryFlags));
+    if (!opened || !(*next)->isStill(opened.get())) return -1;
+    number = opened.release();
     tree_->keep(number, (*next)->descriptor_, open);
     open = *next;
   }
   return number;
+}
+
+/// Whether an open directory is the one that was found at first. False and errno when that can't be told.
+bool DiskDirectory::isStill(int descriptor) {
+  struct stat status;
+  if (::fstat(descriptor, &status) != 0) return false;
+  if (number_ == 0) number_ = status.st_ino;
+  if (number_ == status.st_ino) return true;
+  errno = ESTALE;
+  return false;
 }
 
 int DiskDirectory::status(const char* name, struct stat& status) {
@@ -166,12 +178,21 @@ int DiskDirectory::status(const char* name, struct stat& status) {
   return number < 0 ? -1 : retrying([&] { return ::fstatat(number, name, &status, AT_SYMLINK_NOFOLLOW); });
 }
 
+int DiskDirectory::statusByPath(const char* name, struct stat& status) {
+  if (descriptor_ >= 0 || !parent_ || number_ != 0) return this->status(name, status);
+  const int number = parent_->descriptor();
+  if (number < 0) return -1;
+  return retrying([&] { return ::fstatat(number, pathThroughParent(name), &status, AT_SYMLINK_NOFOLLOW); });
+}
+
+const char* DiskDirectory::pathThroughParent(const char* name) {
+  return tree_->scratchPath.assign(name_.view()).append("/").append(name).c_str();
+}
+
 Descriptor DiskDirectory::openThroughParent(const char* name, int flags) {
   const int number = parent_->descriptor();
   if (number < 0) return Descriptor();
-  auto& path = tree_->scratchPath;
-  path.assign(name_.view()).append("/").append(name);
-  return Descriptor(tree_->openPathAt(parent_.get(), number, path.c_str(), flags));
+  return Descriptor(tree_->openPathAt(parent_.get(), number, pathThroughParent(name), flags));
 }
 
 Descriptor DiskDirectory::open(const char* name, int flags) {
@@ -204,7 +225,7 @@ std::optional<std::vector<DiskDirectory::Entry>> DiskDirectory::entries() {
     errno = 0;
     const dirent* entry = ::readdir(stream.get());
     if (!entry) break;
-    if (isFileName(entry->d_name)) result.push_back({entry->d_name, entry->d_type});
+    if (isFileName(entry->d_name)) result.push_back({entry->d_name, entry->d_type, entry->d_ino});
   }
   if (errno != 0) return std::nullopt;
   return result;
@@ -222,6 +243,19 @@ SharedString DiskDirectory::sharedName(std::string_view name) {
 void DiskDirectory::setRoot(Descriptor descriptor) {
   tree_->closeAllBut(nullptr);
   tree_->root = std::move(descriptor);
+}
+
+void DiskDirectory::follow(ino_t number) {
+  number_ = number;
+  if (descriptor_ < 0) return;
+  tree_->forget(descriptor_);
+  descriptor_ = -1;
+}
+
+void DiskDirectory::moveTo(std::shared_ptr<DiskDirectory> parent, SharedString name) {
+  parent_ = std::move(parent);
+  name_ = std::move(name);
+  depth_ = parent_->depth_ + 1;
 }
 
 DiskDirectory& DiskDirectory::rootDirectory() {

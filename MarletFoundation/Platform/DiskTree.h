@@ -26,7 +26,7 @@ class DiskDirectory {
   /// A directory by name, with its descriptor when it is open already. Otherwise it isn't looked at before it
   /// is used.
   static std::shared_ptr<DiskDirectory> child(std::shared_ptr<DiskDirectory> parent, SharedString name,
-                                              Descriptor opened = {});
+                                              Descriptor opened = {}, ino_t number = 0);
   struct Key {};  // only the functions above make directories
   DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, SharedString name);
   ~DiskDirectory();
@@ -34,10 +34,14 @@ class DiskDirectory {
   DiskDirectory& operator=(const DiskDirectory&) = delete;
 
   /// An open descriptor of the directory, good until the tree is next used; -1 and errno when it can't be
-  /// opened (any more).
+  /// opened (any more): ESTALE when another directory has taken its name since it was first opened.
   int descriptor();
+  /// The directory's inode, once it was opened; 0 before.
+  ino_t number() const { return number_; }
   /// Looks at the entry of that name itself, not at what it may link to.
   int status(const char* name, struct stat& status);
+  /// The same, also where the directory was never opened: then it is what bears its name now.
+  int statusByPath(const char* name, struct stat& status);
   /// Opens an entry itself for reading, waiting for nothing. For the first few entries the directory isn't opened:
   /// they are reached from its parent, in one call of the system that follows no link.
   Descriptor open(const char* name, int flags = ReadingFlags | O_NOFOLLOW);
@@ -49,11 +53,16 @@ class DiskDirectory {
   struct Entry {
     std::string name;
     unsigned char type;
+    ino_t number;
   };
   std::optional<std::vector<Entry>> entries();
 
   /// Makes the tree go on beneath another root.
   void setRoot(Descriptor descriptor);
+  /// Makes a directory below the root go on as the one that bears its name now.
+  void follow(ino_t number);
+  /// Tells a directory below the root where it was moved to within its tree.
+  void moveTo(std::shared_ptr<DiskDirectory> parent, SharedString name);
   /// The root of this directory's tree.
   DiskDirectory& rootDirectory();
   /// Where the nodes of this directory's tree are kept.
@@ -72,6 +81,8 @@ class DiskDirectory {
   friend class DiskTree;
 
   Descriptor openThroughParent(const char* name, int flags);
+  const char* pathThroughParent(const char* name);
+  bool isStill(int descriptor);
 
   std::shared_ptr<DiskDirectory> parent_;
   SharedString name_;
@@ -80,6 +91,7 @@ class DiskDirectory {
   int depth_;  // the root's is 0
   int descriptor_ = -1;
   int openedThroughParent_ = 0;
+  ino_t number_ = 0;
   /// The names that were asked for first in its directories, no name twice.
   std::array<SharedString, 4> namesInDirectories_;
 };

@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "MarletFoundation/Platform/AtomicReplacement.h"
+#include "MarletFoundation/Platform/TreeSurvey.h"
 
 namespace MarletFoundation {
 namespace {
@@ -62,6 +63,14 @@ int removeDirectory(int parent, const std::string& name, Descriptor opened) {
     bool emptied = false;
     int listing = 0;  // errno of it
   };
+  struct stat root;
+  if (::fstat(opened.get(), &root) != 0) return errno;
+  const auto isElsewhere = [&](int above, const std::string& below) {
+    struct stat status;
+    return isMountPoint(above, below.c_str()) ||
+           (::fstatat(above, below.c_str(), &status, AT_SYMLINK_NOFOLLOW) == 0 && S_ISDIR(status.st_mode) &&
+            status.st_dev != root.st_dev);
+  };
   int firstError = 0;
   const auto failed = [&](int error) {
     if (firstError == 0) firstError = error;
@@ -77,6 +86,11 @@ int removeDirectory(int parent, const std::string& name, Descriptor opened) {
       continue;
     }
     levels.back().emptied = true;
+    // What is mounted there is somebody else's.
+    if (level.above && isElsewhere(level.above->descriptor(), level.name)) {
+      levels.back().listing = EBUSY;
+      continue;
+    }
     if (level.directory->descriptor() < 0 && errno == EACCES) {
       ::fchmodat(level.above->descriptor(), level.name.c_str(), 0700, AT_SYMLINK_NOFOLLOW);
     }
@@ -113,6 +127,7 @@ int removeTree(int parent, const std::string& name) {
     opened = Descriptor(::openat(parent, name.c_str(), DirectoryFlags));
   }
   if (!opened) return errno;
+  if (isMountPoint(parent, name.c_str())) return EBUSY;
   try {
     return removeDirectory(parent, name, std::move(opened));
   } catch (const std::bad_alloc&) {

@@ -6,28 +6,21 @@
 #include <vector>
 
 #include "MarletFoundation/Platform/AtomicReplacement.h"
+#include "MarletFoundation/Platform/ErrorObject.h"
 
 namespace MarletFoundation {
 namespace {
-
-FileNode::Kind kindOf(mode_t mode) {
-  if (S_ISDIR(mode)) return FileNode::Kind::directory;
-  if (S_ISREG(mode)) return FileNode::Kind::regularFile;
-  if (S_ISLNK(mode)) return FileNode::Kind::symbolicLink;
-  return FileNode::Kind::other;
-}
 
 /// Whether a look by name failed since nothing of that name can be there.
 bool isAbsence(int error) { return error == ENOENT || error == ENAMETOOLONG; }
 
 }  // namespace
 
-FileNode::Stamp::Stamp(const struct stat& status)
-    : number(status.st_ino), size(status.st_size), changed(status.st_ctim) {}
-
-bool FileNode::Stamp::operator==(const Stamp& other) const {
-  return number == other.number && size == other.size && changed.tv_sec == other.changed.tv_sec &&
-         changed.tv_nsec == other.changed.tv_nsec;
+FileNode::Kind FileNode::kindOf(mode_t mode) {
+  if (S_ISDIR(mode)) return Kind::directory;
+  if (S_ISREG(mode)) return Kind::regularFile;
+  if (S_ISLNK(mode)) return Kind::symbolicLink;
+  return Kind::other;
 }
 
 FileNode::Directory::Directory(std::shared_ptr<DiskDirectory> directory)
@@ -72,9 +65,30 @@ std::shared_ptr<FileNode> FileNode::atPath(const std::string& path) {
     Descriptor root(retrying([&] { return ::open(node->diskName_.c_str(), DirectoryFlags & ~O_NOFOLLOW); }));
     if (!root) throwPosix(errno, path);
     node->becomeDirectory(DiskDirectory::root(std::move(root)), true);
-  } else if (node->kind_ == Kind::regularFile && !node->openOnDisk()) {
+    node->diskName_ = SharedString(path);
+  } else if (struct stat status; node->kind_ == Kind::regularFile && !node->openOnDisk(status)) {
     throwPosix(errno, path);
   }
+  return node;
+}
+
+std::shared_ptr<FileNode> FileNode::referenceTo(const std::string& path) {
+  std::shared_ptr<FileNode> node;
+  try {
+    node = atPath(path);
+  } catch (const ErrorObject& error) {
+    node = onDisk(nullptr, SharedString(path));
+    node->error_ = static_cast<int>(error.code());
+  }
+  node->isReference_ = true;
+  return node;
+}
+
+std::shared_ptr<FileNode> FileNode::found(std::shared_ptr<DiskDirectory> parent, SharedString name, Kind kind,
+                                          const FileStamp& stamp) {
+  auto node = onDisk(std::move(parent), std::move(name));
+  node->kind_ = kind;
+  if (kind == Kind::regularFile) node->facts_.emplace<File>().stamp = stamp;
   return node;
 }
 
@@ -129,10 +143,10 @@ void FileNode::look() {
   kind_ = kindOf(status.st_mode);
   if (kind_ == Kind::regularFile) {
     auto& file = facts_.emplace<File>();
-    file.stamp = Stamp(status);
+    file.stamp = FileStamp(status);
     parent_->keep(std::move(opened), file.descriptor);
   } else if (kind_ == Kind::directory) {
-    becomeDirectory(DiskDirectory::child(parent_, diskName_, std::move(opened)), true);
+    becomeDirectory(DiskDirectory::child(parent_, diskName_, std::move(opened), status.st_ino), true);
   }
 }
 
@@ -140,6 +154,7 @@ void FileNode::lookByName() {
   struct stat status;
   if (lookAgain(status) == 0) {
     kind_ = kindOf(status.st_mode);
+    if (kind_ == Kind::regularFile) facts_.emplace<File>().stamp = FileStamp(status);
   } else {
     kind_ = Kind::unreadable;
     error_ = errno;
@@ -166,9 +181,9 @@ const std::shared_ptr<DiskDirectory>& FileNode::diskDirectory() const {
 
 bool FileNode::hasChildren() {
   if (kind() != Kind::directory) return false;
-  auto& [onDisk, children, isListed, wasOpened, expectsDirectories] = directory();
-  if (!wasOpened) wasOpened = onDisk->descriptor() >= 0;
-  return *wasOpened;
+  auto& own = directory();
+  if (!own.wasOpened) own.wasOpened = own.onDisk->descriptor() >= 0;
+  return *own.wasOpened;
 }
 
 std::shared_ptr<FileNode> FileNode::child(std::string_view name) {
@@ -182,7 +197,7 @@ std::shared_ptr<FileNode> FileNode::child(std::string_view name) {
   return children.emplace_hint(found, std::move(shared), std::move(child))->second;
 }
 
-/// Finds a directory by opening in it what its brother was first asked for: the file proves the directory, and is
+/// Finds a directory by opening in it what its sibling was first asked for: the file proves the directory, and is
 /// likely to be asked for next. Null when that isn't there, which tells nothing.
 std::shared_ptr<FileNode> FileNode::lookUpByContent(const SharedString& name) {
   const auto& expected = directory().onDisk->expectedName();
@@ -202,8 +217,10 @@ std::shared_ptr<FileNode> FileNode::lookUp(const SharedString& name) {
   if (own.expectsDirectories) {
     if (auto node = lookUpByContent(name)) return node;
     if (auto opened = own.onDisk->open(name.c_str(), DirectoryFlags)) {
+      struct stat status;
+      const auto number = ::fstat(opened.get(), &status) == 0 ? status.st_ino : 0;
       auto node = make(own.onDisk.get());
-      node->becomeDirectory(DiskDirectory::child(own.onDisk, name, std::move(opened)), true);
+      node->becomeDirectory(DiskDirectory::child(own.onDisk, name, std::move(opened), number), true);
       return node;
     }
     if (isAbsence(errno)) return nullptr;
@@ -220,28 +237,56 @@ const FileNode::Children* FileNode::allChildren() {
     errno = kind_ == Kind::directory ? EACCES : ENOTDIR;
     return nullptr;
   }
-  auto& [onDiskDirectory, children, isListed, wasOpened, expectsDirectories] = directory();
-  if (isListed) return &children;
-  const auto entries = onDiskDirectory->entries();
+  auto& own = directory();
+  if (own.isListed) return &own.children;
+  const auto entries = own.onDisk->entries();
   if (!entries) return nullptr;
-  for (const auto& [entryName, type] : *entries) {
-    const auto place = children.lower_bound(entryName);
-    if (place != children.end() && place->first.view() == entryName) continue;
-    const SharedString name(entryName);
-    auto node = onDisk(onDiskDirectory, name);
-    if (type == DT_UNKNOWN) {
+  for (const auto& entry : *entries) {
+    const auto place = own.children.lower_bound(entry.name);
+    if (place != own.children.end() && place->first.view() == entry.name) continue;
+    const SharedString name(entry.name);
+    auto node = onDisk(own.onDisk, name);
+    if (entry.type == DT_UNKNOWN) {
       node->lookByName();
     } else {
-      node->kind_ = kindOf(DTTOIF(type));
+      node->kind_ = kindOf(DTTOIF(entry.type));
     }
-    children.emplace_hint(place, name, std::move(node));
+    own.children.emplace_hint(place, name, std::move(node));
   }
-  isListed = true;
-  return &children;
+  own.isListed = true;
+  return &own.children;
 }
 
 void FileNode::setChild(std::string_view name, std::shared_ptr<FileNode> child) {
-  directory().children.insert_or_assign(SharedString(name), std::move(child));
+  auto& own = directory();
+  if (child && own.onDisk) {
+    const auto known = own.children.find(name);
+    if (known != own.children.end() && known->second == child) return;
+  }
+  if (own.onDisk) keepReplaced(name);
+  own.children.insert_or_assign(SharedString(name), std::move(child));
+}
+
+/// Keeps what the disk has under a name whose child is about to change, looking at it now if nobody did before.
+void FileNode::keepReplaced(std::string_view name) {
+  auto& own = directory();
+  if (!own.replaced) own.replaced = std::make_unique<Children>(own.onDisk->memory());
+  if (own.replaced->contains(name) || !isFileName(name)) return;
+  std::shared_ptr<FileNode> node;
+  if (const auto known = own.children.find(name); known != own.children.end()) {
+    node = known->second;
+    if (node && node->kind_ == Kind::regularFile && !node->file()) node->lookByName();
+  } else if (!own.isListed) {
+    node = onDisk(own.onDisk, SharedString(name));
+    node->lookByName();
+    if (node->kind_ == Kind::unreadable && isAbsence(node->error_)) node = nullptr;
+  }
+  own.replaced->emplace(SharedString(name), std::move(node));
+}
+
+bool FileNode::isChanged(std::string_view name) const {
+  const auto& own = *std::get_if<Directory>(&facts_);
+  return !own.onDisk || (own.replaced && own.replaced->contains(name));
 }
 
 void FileNode::removeChild(std::string_view name) {
@@ -258,7 +303,7 @@ void FileNode::readContents() {
   Descriptor opened;
   if (!file() || file()->descriptor < 0) {
     struct stat status;
-    opened = openRegularFile(status);
+    opened = openOnDisk(status);
     const int error = errno;
     auto& known = facts_.emplace<File>();
     known.wasRead = true;
@@ -266,7 +311,7 @@ void FileNode::readContents() {
       error_ = error;
       return;
     }
-    known.stamp = Stamp(status);
+    known.stamp = FileStamp(status);
   }
   auto& known = *std::get_if<File>(&facts_);
   auto read = readToEnd(opened ? opened.get() : known.descriptor, known.stamp.size);
@@ -275,18 +320,13 @@ void FileNode::readContents() {
   error_ = read.error;
 }
 
-Descriptor FileNode::openRegularFile(struct stat& status) {
+Descriptor FileNode::openOnDisk(struct stat& status) {
   Descriptor file = parent_ ? parent_->open(diskName_.c_str())
                             : Descriptor(retrying([&] { return ::open(diskName_.c_str(), ReadingFlags); }));
   if (!file || ::fstat(file.get(), &status) != 0) return Descriptor();
   if (S_ISREG(status.st_mode)) return file;
   errno = EINVAL;
   return Descriptor();
-}
-
-Descriptor FileNode::openOnDisk() {
-  struct stat status;
-  return openRegularFile(status);
 }
 
 }  // namespace MarletFoundation

@@ -9,6 +9,12 @@ FileWrapper::FileWrapper(const URL& url) : node_(FileNode::atPath(systemPath(url
   node_->setPreferredName(url.lastPathComponent());
 }
 
+FileWrapper FileWrapper::reference(const URL& url) {
+  FileWrapper wrapper(FileNode::referenceTo(systemPath(url)));
+  wrapper.setPreferredFilename(url.lastPathComponent());
+  return wrapper;
+}
+
 FileWrapper FileWrapper::regularFile(Data contents) {
   return FileWrapper(FileNode::inMemory(std::move(contents)));
 }
@@ -47,13 +53,9 @@ std::optional<FileWrapper::Children> FileWrapper::fileWrappers() const {
   return wrappers;
 }
 
-bool FileWrapper::wasReplaced() const {
-  const auto& directory = node_->diskDirectory();
-  struct stat opened, now;
-  if (!directory || directory->parent() || ::fstat(directory->descriptor(), &opened) != 0) return false;
-  if (opened.st_nlink == 0) return true;
-  return node_->lookAgain(now) == 0 && (now.st_dev != opened.st_dev || now.st_ino != opened.st_ino);
-}
+bool FileWrapper::wasReplaced() const { return node_->wasReplaced(); }
+
+bool FileWrapper::isUnchanged() const { return !wasReplaced() && node_->isUnchanged(); }
 
 std::optional<std::string> FileWrapper::preferredFilename() const { return node_->preferredName(); }
 

@@ -29,6 +29,10 @@ class MARLET_EXPORT FileWrapper {
   /// Opens the file or directory at `url`; only this root may be a symbolic link. Its preferred file name is
   /// the URL's last path component. Throws an `ErrorObject` of the POSIX domain when it can't be opened.
   explicit FileWrapper(const URL& url);
+  /// What lies at `url`, for a tree that refers to it: it shows what lay there when it was made, and each write takes
+  /// what lies there by then, with the children that were put into it or removed since. Where that can't be read it
+  /// shows as absent, and a write of it fails.
+  static FileWrapper reference(const URL& url);
   static FileWrapper regularFile(Data contents);
   static FileWrapper directory(Children children = {});
 
@@ -55,22 +59,31 @@ class MARLET_EXPORT FileWrapper {
 
   /// Whether something else has taken the place that this wrapper was opened at, or it was removed. The tree
   /// goes on showing the old item, but for what had not been looked at when that went away, which shows as
-  /// absent. A reader that must not miss anything asks at its end and opens again. False for a node in
-  /// memory.
+  /// absent. False for a node in memory.
   bool wasReplaced() const;
+  /// Whether all that was looked at, here and below, is still as it was found: then what was read is one state of
+  /// the document. A reader asks at its end, and opens again where it isn't. What couldn't be read counts as found so.
+  bool isUnchanged() const;
 
   /// Writes the tree to `url`, all of it or nothing: it is built in a sibling of `url`, flushed, and takes
   /// the place of what was there, or of what a symbolic link there points to. Unchanged files are shared with
-  /// the directory that is replaced, modes, extended attributes and symbolic links of a tree from disk stay,
-  /// and what is new takes the mode and attributes of what it replaces. Throws an `ErrorObject` of the POSIX
-  /// domain, also for a child whose name is empty, ".", ".." or holds a slash or NUL (EINVAL), for a
-  /// directory within itself (ELOOP, EINVAL), and for a node that couldn't be read or is of no writable kind
-  /// (EINVAL). A tree that `wasReplaced` isn't written (ESTALE), since parts of it may be gone. A wrapper that was
+  /// the directory that is replaced and need not be readable; modes, extended attributes and symbolic links of a
+  /// tree from disk stay, and what is new takes the mode and attributes of what it replaces. A wrapper that was
   /// opened at `url` goes on in what was written.
   ///
-  /// A directory that is replaced is another one afterwards: watch its parent for changes. Mount points are
-  /// refused (EBUSY), and so are a path whose links change while it is written (ESTALE) and one that something
-  /// lies at which is to be kept (EEXIST).
+  /// Nothing is lost to another writer, in this process or another. A tree from disk is written only while that is as
+  /// it was found, at any depth: what was looked at, put in or removed must not have changed (ESTALE), nor have been
+  /// unreadable where something else is put there (the error that was met). What nobody looked at goes along as it
+  /// is. The directory that is replaced must not change while the tree is written (ESTALE). After a failure everything
+  /// is as it was: read again, change again, write again. Of two writers the second waits for the first's last step, up
+  /// to ten seconds (EBUSY).
+  ///
+  /// Throws an `ErrorObject` of the POSIX domain, also for a child whose name is empty, ".", ".." or holds a slash
+  /// or NUL (EINVAL), for a directory within itself (ELOOP, EINVAL), for a node that couldn't be read or is of no
+  /// writable kind (EINVAL), for mount points, here or below (EBUSY), for a path whose links change while it is written
+  /// (ESTALE), for one that something lies at which is to be kept (EEXIST), and after `cancelWrites` (ECANCELED).
+  /// A directory that is replaced is another one afterwards: watch its parent for changes. What of the old one
+  /// can't be removed is told to `HostEnvironment::leftBehind`.
   void write(const URL& url, ExistingItem existing = ExistingItem::Replaced) const;
 
  private:

@@ -109,6 +109,9 @@ HostEnvironment HostEnvironment::defaults() {
     ::syslog(LOG_USER | LOG_NOTICE, "%s", std::string(entry).c_str());
   };
   environment.diagnostics = writeLineToStandardOutput;
+  environment.leftBehind = [](std::string_view path, const ErrorObject& reason) {
+    ::syslog(LOG_USER | LOG_WARNING, "%s", leftBehindSentence(path, reason).c_str());
+  };
   return environment;
 }
 
@@ -124,6 +127,10 @@ void HostEnvironment::setCurrent(HostEnvironment environment) {
   auto& known = environments();
   const std::lock_guard lock(known.mutex);
   known.add(std::move(environment));
+}
+
+std::string leftBehindSentence(std::string_view path, const ErrorObject& reason) {
+  return std::string(path) + " couldn't be removed and may go by hand: " + reason.localizedDescription();
 }
 
 }  // namespace MarletFoundation

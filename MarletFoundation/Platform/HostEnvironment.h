@@ -6,6 +6,7 @@
 #include <string>
 #include <string_view>
 
+#include "MarletFoundation/Platform/ErrorObject.h"
 #include "MarletFoundation/Platform/URL.h"
 
 namespace MarletFoundation {
@@ -30,6 +31,9 @@ struct MARLET_EXPORT HostEnvironment {
   std::function<void(std::string_view entry)> systemLog;
   /// Takes one line of diagnostics, without its line feed. Default: standard output.
   std::function<void(std::string_view line)> diagnostics;
+  /// Told of what should be gone after a write and couldn't be removed: where it lies and why it stays; it may go by
+  /// hand. On the thread that wrote. Default: an entry of the system log.
+  std::function<void(std::string_view path, const ErrorObject& reason)> leftBehind;
 
   static HostEnvironment defaults();
   /// The environment in force, the defaults unless a host set another. May be called from any thread; the
@@ -38,5 +42,8 @@ struct MARLET_EXPORT HostEnvironment {
   /// Any thread. Every environment ever set is kept, so this is for start-up and for tests, not for traffic.
   static void setCurrent(HostEnvironment environment);
 };
+
+/// "PATH couldn't be removed and may go by hand: REASON", for who shows what was left behind.
+MARLET_EXPORT std::string leftBehindSentence(std::string_view path, const ErrorObject& reason);
 
 }  // namespace MarletFoundation

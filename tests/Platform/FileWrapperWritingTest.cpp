@@ -3,6 +3,7 @@
 #include <pthread.h>
 #include <signal.h>
 #include <sys/file.h>
+#include <sys/mount.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <sys/xattr.h>
@@ -14,6 +15,8 @@
 #include <filesystem>
 #include <fstream>
 #include <functional>
+#include <future>
+#include <map>
 #include <thread>
 
 #include "MarletFoundation/Platform/ErrorObject.h"
@@ -142,14 +145,152 @@ TEST(FileWrapperWriting, KeepsWhatADocumentIsMadeOf) {
   EXPECT_EQ(names(directory), (std::vector<std::string>{"book", "elsewhere"}));
 }
 
-TEST(FileWrapperWriting, WritesWhatWasReadAndNotWhatCameAfter) {
+/// All paths below a directory, with what the files hold.
+std::map<std::string, std::string> dump(const fs::path& directory) {
+  std::map<std::string, std::string> items;
+  if (!fs::exists(directory)) return items;
+  for (const auto& entry : fs::recursive_directory_iterator(directory))
+    items[fs::relative(entry.path(), directory).string()] =
+        entry.is_regular_file() ? text(entry.path()) : "/";
+  return items;
+}
+
+struct Meanwhile {
+  const char* name;
+  /// What the tree's owner looks at or changes, and what another does afterwards.
+  std::function<void(FileWrapper)> own;
+  std::function<void(const fs::path&)> other;
+  int error;
+};
+
+/// Puts another directory with the same files in the place of one, as a writer of a part does.
+void exchange(const fs::path& part) {
+  fs::copy(part, part.string() + "2", fs::copy_options::recursive);
+  fs::remove_all(part);
+  fs::rename(part.string() + "2", part);
+}
+
+TEST(FileWrapperWriting, ReplacesExactlyWhatWasRead) {
+  const auto nothing = [](auto&&) {};
+  const auto look = [](FileWrapper root) {
+    root.child("page")->child("Manifest")->regularFileContents();
+    root.child("none");
+  };
+  const auto list = [](FileWrapper root) { root.child("page")->fileWrappers(); };
+  const auto change = [](FileWrapper root) {
+    root.child("page")->addFileWrapper(file("Manifest", "ours"));
+    root.child("pack")->removeFileWrapper("delta");
+    root.addFileWrapper(file("new", "ours"));
+  };
+  const auto write = [](const char* path, const char* text) {
+    return [=](const fs::path& book) { std::ofstream(book / path) << text; };
+  };
+  const std::vector<Meanwhile> table{
+      {"nothing", change, nothing, 0},
+      {"a file that was read is written", look, write("page/Manifest", "other"), ESTALE},
+      {"a file that nobody looked at is written", look, write("pack/delta", "other"), 0},
+      {"a file that is overwritten is written", change, write("page/Manifest", "other"), ESTALE},
+      {"a file that is removed is written", change, write("pack/delta", "other"), ESTALE},
+      {"a file comes where one is put", change, write("new", "other"), ESTALE},
+      {"a file comes where none was", look, write("none", "other"), ESTALE},
+      {"a file comes to a listed directory", list, write("page/more", "other"), ESTALE},
+      {"a file comes to a directory that wasn't listed", look, write("page/more", "other"), 0},
+      {"a part is exchanged below", look, [](const fs::path& book) { exchange(book / "page"); }, ESTALE},
+      {"a part is exchanged that nobody looked at", look,
+       [](const fs::path& book) { exchange(book / "pack"); }, 0},
+      {"a file goes that nobody looked at", look,
+       [](const fs::path& book) { fs::remove(book / "page/Sources/a"); }, 0},
+      {"a part that was read goes", look, [](const fs::path& book) { fs::remove_all(book / "page"); },
+       ESTALE},
+      {"all of it is exchanged", nothing, [](const fs::path& book) { exchange(book); }, ESTALE},
+      {"all of it goes", nothing, [](const fs::path& book) { fs::remove_all(book); }, ESTALE},
+  };
+  for (const auto& row : table) {
+    SCOPED_TRACE(row.name);
+    const TemporaryDirectory directory;
+    const auto book = directory.path() / "book";
+    Tree{{"book/page/Manifest", "1"s}, {"book/page/Sources/a", "2"s}, {"book/pack/delta", "3"s}}.writeTo(
+        directory.path());
+    const FileWrapper root(directory.url("book"));
+    row.own(root);
+    row.other(book);
+    const auto before = dump(book);
+    EXPECT_EQ(errorOfWriting(root, directory.url("book")), row.error);
+    if (row.error != 0) {
+      EXPECT_EQ(dump(book), before);
+    }
+    EXPECT_EQ(errorOfWriting(root, directory.url("copy")), row.error);
+    if (row.error == 0) {
+      EXPECT_EQ(dump(directory.path() / "copy"), dump(book));
+      // The tree goes on in what it wrote, and knows that from what another writes there.
+      EXPECT_EQ(errorOfWriting(root, directory.url("book")), 0);
+      std::ofstream(book / "page/Manifest") << "another's";
+      EXPECT_EQ(errorOfWriting(root, directory.url("book")), ESTALE);
+    }
+  }
+}
+
+TEST(FileWrapperWriting, AReferenceIsToWhatLiesThereThen) {
   const TemporaryDirectory directory;
-  Tree{{"book/file", "1"s}}.writeTo(directory.path());
-  FileWrapper root(directory.url("book"));
-  ASSERT_TRUE(root.child("file")->regularFileContents());
-  std::ofstream(directory.path() / "book/file") << "2";
-  root.write(directory.url("book"));
-  EXPECT_EQ(text(directory.path() / "book/file"), "1");
+  Tree{{"page/Manifest", "1"s}, {"page/Sources/deep/a", "2"s}, {"page/View", "3"s}}.writeTo(directory.path());
+  const auto make = [&] {
+    auto page = FileWrapper::directory();
+    page.addFileWrapper(file("Manifest", "new"));
+    page.addFileWrapper(FileWrapper::reference(directory.url("page/Sources")));
+    page.addFileWrapper(FileWrapper::reference(directory.url("page/View")));
+    return page;
+  };
+  const auto one = make(), other = make();
+  for (int round = 0; round < 2; ++round) {
+    one.write(directory.url("page"));
+    other.write(directory.url("page"));
+  }
+  EXPECT_EQ(text(directory.path() / "page/Sources/deep/a") + text(directory.path() / "page/View"), "23");
+  std::ofstream(directory.path() / "page/Sources/b") << "4";
+  one.write(directory.url("copy"));
+  EXPECT_EQ(text(directory.path() / "copy/Sources/b"), "4");
+  fs::remove_all(directory.path() / "page/Sources");
+  EXPECT_EQ(errorOfWriting(one, directory.url("page")), ESTALE);
+  EXPECT_EQ(errorOfWriting(make(), directory.url("page")), ESTALE);
+}
+
+TEST(FileWrapperWriting, WhatCouldNotBeReadIsNotReplaced) {
+  const TemporaryDirectory directory;
+  Tree{{"book/Edits/pack/delta", "a learner's"s}}.writeTo(directory.path());
+  ::truncate((directory.path() / "book/Edits/pack/delta").c_str(), (off_t{1} << 30) + 1);
+  const FileWrapper root(directory.url("book"));
+  const auto pack = *root.child("Edits")->child("pack");
+  EXPECT_FALSE(pack.child("delta")->regularFileContents());
+  root.write(directory.url("book"));  // carried, not read
+  auto edits = *root.child("Edits");
+  EXPECT_FALSE(edits.child("pack")->child("delta")->regularFileContents());
+  auto fresh = FileWrapper::directory();
+  fresh.setPreferredFilename("pack");
+  edits.addFileWrapper(fresh);
+  EXPECT_EQ(errorOfWriting(root, directory.url("book")), EFBIG);
+  EXPECT_GT(fs::file_size(directory.path() / "book/Edits/pack/delta"), std::uintmax_t{1} << 30);
+}
+
+TEST(FileWrapperWriting, RefusesWhatIsMountedBelow) {
+  const TemporaryDirectory directory;
+  Tree{{"book/Edits/drawing", "a learner's"s}, {"volume/drawing", "elsewhere"s}}.writeTo(directory.path());
+  const auto volume = directory.path() / "volume", edits = directory.path() / "book/Edits";
+  if (::mount(volume.c_str(), edits.c_str(), nullptr, MS_BIND, nullptr) != 0)
+    GTEST_SKIP() << "no right to mount";
+  auto root = FileWrapper(directory.url("book"));
+  root.addFileWrapper(file("new", "1"));
+  EXPECT_EQ(errorOfWriting(root, directory.url("book")), EBUSY);
+  std::promise<ErrorObject> failure;
+  FileManager::asynchronouslyRemoveItem(directory.url("book"), [&](const std::optional<ErrorObject>& error) {
+    failure.set_value(error.value_or(ErrorObject::posix(0, "")));
+  });
+  const auto error = failure.get_future().get();
+  EXPECT_EQ(error.code(), EBUSY);
+  EXPECT_EQ(text(volume / "drawing"), "elsewhere");
+  const fs::path aside(std::get<std::string>(error.userInfo().at(std::string(FilePathKey))));
+  EXPECT_EQ(::umount((aside / "Edits").c_str()), 0);
+  EXPECT_EQ(text(aside / "Edits/drawing"), "a learner's");
+  fs::remove_all(aside);
 }
 
 TEST(FileWrapperWriting, AFailureLeavesTheOldDocument) {

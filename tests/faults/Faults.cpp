@@ -1,6 +1,6 @@
 /// Preloaded into a command, lets one of its calls to the file system go wrong. $FAULT_AT counts the calls that
 /// can go wrong so, from 1; $FAULT is `error` (EIO), `short` (a write of one byte less) or `exit` (the process
-/// ends ahead of the call). $NO_EXCHANGE makes the file system one that can't exchange two names. The number of
+/// ends ahead of the call), or `hold`: the call waits for 30 ms, and so does each $FAULT_EVERYth. $NO_EXCHANGE makes the file system one that can't exchange two names. The number of
 /// calls made goes to $FAULT_COUNT, a file.
 
 #include <dlfcn.h>
@@ -9,6 +9,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <atomic>
 #include <cerrno>
 #include <cstdio>
 #include <cstdlib>
@@ -20,7 +21,7 @@ using namespace std::string_view_literals;
 
 namespace {
 
-long counted = 0;
+std::atomic<long> counted = 0;
 
 const char* setting(const char* name) {
   const char* value = std::getenv(name);
@@ -41,10 +42,19 @@ bool counts(Call call) {
   return fault == "short" ? call == Call::write : fault == "exit" ? call != Call::look : true;
 }
 
+bool isHeld(long number) {
+  static const bool isAsked = setting("FAULT") == "hold"sv;
+  static const long at = std::atol(setting("FAULT_AT")), every = std::atol(setting("FAULT_EVERY"));
+  return isAsked && (number == at || (every > 0 && number % every == 0));
+}
+
 /// Counts a call, and says whether it is the one to fail. Ends the process if that is to happen here.
 bool isFaulty(Call call) {
   static const long at = std::atol(setting("FAULT_AT"));
-  if (!counts(call) || ++counted != at) return false;
+  if (!counts(call)) return false;
+  const long number = ++counted;
+  if (isHeld(number)) ::usleep(30'000);
+  if (number != at) return false;
   if (setting("FAULT") == "exit"sv) ::_exit(99);
   return true;
 }
@@ -61,7 +71,7 @@ struct Report {
   ~Report() {
     const char* path = setting("FAULT_COUNT");
     if (FILE* file = *path ? std::fopen(path, "w") : nullptr) {
-      std::fprintf(file, "%ld\n", counted);
+      std::fprintf(file, "%ld\n", counted.load());
       std::fclose(file);
     }
   }
@@ -98,6 +108,8 @@ FAULTY(look, ssize_t, pread, (int file, void* bytes, size_t size, off_t offset),
 FAULTY(change, ssize_t, copy_file_range,
        (int from, off_t* fromAt, int to, off_t* toAt, size_t size, unsigned flags),
        (from, fromAt, to, toAt, size, flags))
+FAULTY(look, int, statx, (int directory, const char* path, int flags, unsigned mask, struct statx* status),
+       (directory, path, flags, mask, status))
 FAULTY(look, ssize_t, flistxattr, (int file, char* list, size_t size), (file, list, size))
 
 // A function with a structure's name, which a definition here would hide.
