@@ -7,6 +7,7 @@
 #include <fcntl.h>
 #include <stdarg.h>
 #include <sys/stat.h>
+#include <sys/syscall.h>
 #include <unistd.h>
 
 #include <atomic>
@@ -157,4 +158,16 @@ INTERPOSED int openat(int directory, const char* path, int flags, ...) {
   return isFaulty((flags & O_CREAT) != 0 ? Call::change : Call::look) && isError()
              ? fail<int>()
              : original(directory, path, flags, mode);
+}
+
+/// How files are opened that must lie beneath a directory.
+INTERPOSED long syscall(long number, ...) {
+  static const auto original = next(&::syscall, "syscall");
+  va_list arguments;
+  va_start(arguments, number);
+  long values[6];
+  for (auto& value : values) value = va_arg(arguments, long);
+  va_end(arguments);
+  if (number == SYS_openat2 && isFaulty(Call::look) && isError()) return fail<long>();
+  return original(number, values[0], values[1], values[2], values[3], values[4], values[5]);
 }
