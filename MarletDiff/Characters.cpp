@@ -1,5 +1,7 @@
 #include "MarletDiff/Characters.h"
 
+#include <algorithm>
+
 #include "MarletFoundation/Platform/Text.h"
 
 namespace MarletDiff {
@@ -13,13 +15,25 @@ bool Characters<Unit>::alwaysStartsAt(std::size_t offset) const {
 
 template <class Unit>
 bool Characters<Unit>::startsInStretch(std::size_t offset) {
-  if (offset < stretch_ || offset >= stretch_ + starts_.size()) {
-    auto end = offset;
-    for (stretch_ = offset; !alwaysStartsAt(stretch_);) --stretch_;
-    while (!alwaysStartsAt(end)) ++end;
-    starts_ = MarletFoundation::graphemeStarts(text_.substr(stretch_, end - stretch_));
+  if (known_.empty()) {
+    known_.resize(text_.size());
+    starts_.resize(text_.size());
   }
-  return starts_[offset - stretch_];
+  if (!known_[offset]) cutStretchAround(offset);
+  return starts_[offset];
+}
+
+template <class Unit>
+void Characters<Unit>::cutStretchAround(std::size_t offset) {
+  auto start = offset, end = offset;
+  while (!alwaysStartsAt(start)) --start;
+  while (!alwaysStartsAt(end)) ++end;
+  const auto at = [](std::vector<bool>& bits, std::size_t place) {
+    return bits.begin() + static_cast<std::ptrdiff_t>(place);
+  };
+  const auto starts = MarletFoundation::graphemeStarts(text_.substr(start, end - start));
+  std::copy(starts.begin(), starts.end(), at(starts_, start));
+  std::fill(at(known_, start), at(known_, end), true);
 }
 
 template class Characters<char>;

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <array>
 #include <cstddef>
 #include <string_view>
 #include <type_traits>
@@ -20,35 +19,9 @@ inline constexpr View<char> paragraphSeparator<char> = "\u2029";
 template <>
 inline constexpr View<char16_t> paragraphSeparator<char16_t> = u"\u2029";
 
-inline constexpr auto asciiWordUnits = [] {
-  std::array<bool, 0x80> isWord{};
-  for (char unit = 'a'; unit <= 'z'; ++unit) isWord[unit] = isWord[unit - 'a' + 'A'] = true;
-  for (char unit = '0'; unit <= '9'; ++unit) isWord[unit] = true;
-  isWord['_'] = true;
-  return isWord;
-}();
-
 template <class Unit>
 bool isASCII(Unit unit) {
   return static_cast<std::make_unsigned_t<Unit>>(unit) < 0x80;
-}
-
-template <class Unit>
-bool isOfParagraphSeparator(View<Unit> text, std::size_t offset) {
-  constexpr auto separator = paragraphSeparator<Unit>;
-  for (std::size_t before = 0; before < separator.size() && before <= offset; ++before) {
-    if (text.substr(offset - before).starts_with(separator)) return true;
-  }
-  return false;
-}
-
-/// Whether the unit at `offset` is part of a word: a letter, a digit or an underscore, and whatever lies beyond
-/// ASCII, so that neither a character's units nor a letter and its marks are ever divided.
-template <class Unit>
-bool isWordAt(View<Unit> text, std::size_t offset) {
-  const auto unit = text[offset];
-  return isASCII(unit) ? asciiWordUnits[static_cast<std::size_t>(unit)]
-                       : !isOfParagraphSeparator(text, offset);
 }
 
 /// Whether a unit ends a line by itself.
@@ -84,11 +57,13 @@ class Characters {
   /// Whether a character starts at `offset` whatever lies further off.
   bool alwaysStartsAt(std::size_t offset) const;
   bool startsInStretch(std::size_t offset);
+  void cutStretchAround(std::size_t offset);
 
   View<Unit> text_;
-  /// The stretch that was looked at last, between two offsets where a character always starts.
-  std::size_t stretch_ = 0;
-  std::vector<bool> starts_;
+  /// For each offset, whether it is known if a character starts there, and whether one does. Empty until the first
+  /// question that takes more than a look at both units. Stretches between two offsets where a character always
+  /// starts become known as a whole, so that none is ever cut twice, whatever the order of the questions.
+  std::vector<bool> known_, starts_;
 };
 
 }  // namespace MarletDiff

@@ -8,6 +8,7 @@
 #include "MarletDiff/Encoding.h"
 #include "MarletDiff/Sliding.h"
 #include "MarletDiff/Tokens.h"
+#include "MarletDiff/Words.h"
 #include "MarletDiff/WorkMemory.h"
 
 namespace MarletDiff {
@@ -83,9 +84,9 @@ bool isLong(View<Unit> text) {
 
 template <class Unit>
 bool isOneWord(View<Unit> text) {
-  std::size_t at = 0;
-  while (at < text.size() && isWordAt(text, at)) ++at;
-  return at == text.size();
+  std::size_t at = 1;
+  while (at < text.size() && wordSpans(text, at)) ++at;
+  return at >= text.size();
 }
 
 /// Whatever is decided by a length counts UTF-16 units, so that the hunks don't depend on the texts' encoding.
@@ -234,9 +235,7 @@ Change ContentDiff<Unit>::trimmed(Change change, Level level) {
 template <class Unit>
 bool ContentDiff<Unit>::startsToken(Text<Unit>& text, std::size_t offset, Level level) {
   if (!text.characters.startAt(offset)) return false;
-  const bool isWithin = offset > 0 && offset < text.view.size();
-  return level == Level::characters || !isWithin || !isWordAt(text.view, offset - 1) ||
-         !isWordAt(text.view, offset);
+  return level == Level::characters || !wordSpans(text.view, offset);
 }
 
 template <class Unit>

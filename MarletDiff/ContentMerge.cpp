@@ -4,6 +4,7 @@
 #include <cstdint>
 
 #include "MarletDiff/Encoding.h"
+#include "MarletDiff/Words.h"
 #include "MarletFoundation/Platform/ErrorObject.h"
 
 namespace MarletDiff {
@@ -79,26 +80,21 @@ std::vector<Edit> validEdits(View<Unit> base, std::size_t length, Hunks hunks) {
   return edits;
 }
 
-/// Whether there is a word's unit at an offset that may lie outside the text.
-template <class Unit>
-bool hasWordAt(View<Unit> text, std::size_t at) {
-  return at < text.size() && isWordAt(text, at);
-}
-
 /// Whether the word ahead of an edit's place becomes another one, since it goes on into the place, before the
 /// change or after it.
 template <class Unit>
 bool changesWordBefore(View<Unit> base, const Edit& edit) {
-  const bool joins = edit.text.empty() ? hasWordAt(base, edit.end) : isWordAt(edit.text, 0);
-  return hasWordAt(base, edit.start) || joins;
+  const auto before = base.substr(0, edit.start);
+  return wordSpans(base, edit.start) ||
+         (edit.text.empty() ? wordSpans(before, base.substr(edit.end)) : wordSpans(before, edit.text));
 }
 
-/// The same for the word behind the place. (The offset ahead of 0 is beyond all texts.)
+/// The same for the word behind the place.
 template <class Unit>
 bool changesWordBehind(View<Unit> base, const Edit& edit) {
-  const bool joins =
-      edit.text.empty() ? hasWordAt(base, edit.start - 1) : isWordAt(edit.text, edit.text.size() - 1);
-  return hasWordAt(base, edit.end - 1) || joins;
+  const auto behind = base.substr(edit.end);
+  return wordSpans(base, edit.end) ||
+         (edit.text.empty() ? wordSpans(base.substr(0, edit.start), behind) : wordSpans(edit.text, behind));
 }
 
 /// Edits of both sides that must be taken together, and the span of the base that they change.
@@ -114,7 +110,8 @@ class Cluster {
     auto at = edit.start;
     if (at <= end_) return true;
     if (changesWordBefore(base_, edit)) {
-      while (at >= wordsEnd_ && hasWordAt(base_, at - 1)) --at;
+      do --at;
+      while (at >= wordsEnd_ && wordSpans(base_, at));
     }
     return at < wordsEnd_;
   }
@@ -125,7 +122,8 @@ class Cluster {
     if (edit.end < wordsEnd_) return;
     wordsEnd_ = edit.end;
     if (changesWordBehind(base_, edit)) {
-      while (hasWordAt(base_, wordsEnd_)) ++wordsEnd_;
+      do ++wordsEnd_;
+      while (wordSpans(base_, wordsEnd_));
     }
   }
 

@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <utility>
 
+#include "MarletDiff/Words.h"
+
 namespace MarletDiff {
 namespace {
 
@@ -37,8 +39,9 @@ int rank(View<Unit> text, std::size_t offset) {
   const bool opens = startsWith(after, "/*") || startsWith(after, "\"/*");
   const bool closes = endsWith(before, "*/") || endsWith(before, "*/\"");
   if (opens || closes) return 4;
-  const bool wordBefore = isWordAt(text, offset - 1), wordAfter = isWordAt(text, offset);
-  if (wordAfter) return wordBefore ? 0 : 3;
+  if (wordSpans(text, offset)) return 0;
+  const bool wordBefore = endsWithWord(before), wordAfter = startsWithWord(after);
+  if (wordAfter) return wordBefore ? 1 : 3;
   return wordBefore ? 2 : 1;
 }
 

@@ -10,6 +10,8 @@
 #include <emmintrin.h>
 #endif
 
+#include "MarletDiff/Words.h"
+
 namespace MarletDiff {
 namespace {
 
@@ -118,7 +120,7 @@ void Tokens<Unit>::cutStretches(std::uint32_t start, std::uint32_t end) {
   constexpr std::uint32_t beside = 4;
   starts.assign(1, start);
   for (auto at = start + beside; at + beside <= end; ++at) {
-    if (!isASCII(text[at]) || !isWordAt(text, at) || isWordAt(text, at - 1)) continue;
+    if (!isASCIIWord(text[at]) || isASCIIWord(text[at - 1])) continue;
     std::uint64_t around = 0, allBits = 0;
     for (const auto unit : text.substr(at - beside, 2 * beside)) {
       allBits |= static_cast<std::uint64_t>(unit);
@@ -133,12 +135,9 @@ template <class Unit>
 void Tokens<Unit>::cutWords(Characters<Unit>& characters, std::uint32_t start, std::uint32_t end) {
   starts.clear();
   StartsWriter writer(starts);
-  bool inWord = false;
-  for (auto at = start; at < end; ++at) {
-    const bool startsCharacter = at == start || characters.startAt(at);
-    const bool isWord = isWordAt(text, at);
-    writer.add(at, startsCharacter & !(isWord & inWord));
-    inWord = startsCharacter ? isWord : inWord;
+  writer.add(start, start < end);
+  for (auto at = start + 1; at < end; ++at) {
+    writer.add(at, !wordSpans(text, at) & characters.startAt(at));
   }
   writer.flush();
   starts.push_back(end);

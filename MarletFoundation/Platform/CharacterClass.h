@@ -19,6 +19,22 @@ constexpr std::size_t unitCount(char32_t scalar) { return scalar < 0x10000 ? 1 :
 /// What `\w` stands for in a regular expression: letters, marks, digits, connectors and joiners of any script.
 MARLET_EXPORT bool isWordCharacter(char32_t scalar);
 
+/// What a character is to those beside it where a text is cut into words, by the rules of Unicode (UAX #29) but for
+/// their dictionaries: what it says depends on nothing but the character.
+enum class WordRole {
+  /// Of no word: blanks, punctuation, symbols.
+  none,
+  /// A word by itself, as ideographs, hiragana and the letters of scripts without blanks are.
+  whole,
+  /// One of a row that makes a word: letters, digits, connectors, katakana.
+  part,
+  /// Belongs to what stands in front of it, and lets a row go on: marks.
+  mark,
+  /// Belongs to what stands on either side: joiners, and marks that stand in front.
+  joiner,
+};
+MARLET_EXPORT WordRole wordRole(char32_t scalar);
+
 /// What `$` stops at in a regular expression: U+000A to U+000D, U+0085, U+2028, U+2029.
 constexpr bool isLineTerminator(char16_t unit) {
   return (unit >= 0x0A && unit <= 0x0D) || unit == 0x85 || unit == 0x2028 || unit == 0x2029;
