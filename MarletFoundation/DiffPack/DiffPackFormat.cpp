@@ -23,7 +23,7 @@ std::string rangeString(const TextRange& range) {
 
 TextRange rangeFromString(std::string_view text) {
   const auto location = takeNumber(text);
-  return {location, takeNumber(text)};
+  return {location, std::min(takeNumber(text), std::numeric_limits<std::int64_t>::max() - location)};
 }
 
 }  // namespace MarletFoundation::DiffPackFormat

@@ -30,8 +30,8 @@ inline constexpr std::string_view modifiedContentKey = "ModifiedContent";
 
 /// `{12, 3}`
 std::string rangeString(const TextRange& range);
-/// The first two runs of decimal digits as location and length; a missing one is 0, and one that doesn't fit
-/// the largest number.
+/// The first two runs of decimal digits as location and length; a missing one is 0, a location that doesn't fit the
+/// largest number, and a length at most what leads to that, so that every range has an end.
 TextRange rangeFromString(std::string_view text);
 
 }  // namespace MarletFoundation::DiffPackFormat

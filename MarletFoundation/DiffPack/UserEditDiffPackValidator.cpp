@@ -26,8 +26,10 @@ class RangesByStart {
     const auto after =
         std::upper_bound(ranges_.begin(), ranges_.end(), hunk.location,
                          [](std::int64_t at, const TextRange& range) { return at < range.location; });
-    return after != ranges_.begin() &&
-           farthestEnds_[static_cast<std::size_t>(after - ranges_.begin()) - 1] >= hunk.end();
+    // The length is compared, and not the end, which may lie beyond all numbers.
+    return after != ranges_.begin() && hunk.length >= 0 &&
+           hunk.length <=
+               farthestEnds_[static_cast<std::size_t>(after - ranges_.begin()) - 1] - hunk.location;
   }
 
  private:

@@ -203,8 +203,9 @@ TEST(DiffPackReading, RangeStringsAreTheFirstTwoNumbers) {
       {"-5 6", {5, 6}},
       {"{,}", {0, 0}},
       {"007 0", {7, 0}},
-      {"{9223372036854775807, 9223372036854775808}", {largest, largest}},
-      {"99999999999999999999999999 4", {largest, 4}},
+      {"{9223372036854775807, 9223372036854775808}", {largest, 0}},
+      {"{7, 9223372036854775807}", {7, largest - 7}},
+      {"99999999999999999999999999 4", {largest, 0}},
   };
   for (const auto& [text, range] : cases) {
     const auto pack = opened(withHunkKey("OriginalRange", text));
