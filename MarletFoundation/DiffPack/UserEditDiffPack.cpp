@@ -40,8 +40,7 @@ std::optional<FileDiffDescriptor> entryFor(const UserEditDiffPackValidator& vali
   const auto edited = utf16FromUTF8(data->view());
   const auto original = edited ? authoredText(contentUrl, path) : std::nullopt;
   if (original) {
-    auto hunks = userEditHunks(*original, *edited);
-    if (hunks.empty()) return std::nullopt;
+    auto hunks = hunksBesideTags(userEditHunks(*original, *edited), *original);
     return validator.validatedUpdate({FileDiffDescriptor::Modified{path, std::move(hunks)}}, *original);
   }
   if (isReachable(contentUrl.appendingPathComponent(path)))
@@ -66,7 +65,7 @@ std::vector<MarletDiff::DiffDescriptor> userEditHunks(std::u16string_view origin
                                                       std::u16string_view edited) {
   if (!endsInLineFeed(original) && endsInLineFeed(edited)) edited.remove_suffix(1);
   auto hunks = MarletDiff::diffContent(original, edited, MarletDiff::DiffOptions::SmallerHunks);
-  if (editableHunks(hunks, original).size() == hunks.size()) return hunks;
+  if (editableHunks(hunksBesideTags(hunks, original), original).size() == hunks.size()) return hunks;
   // The same edit can often be told by other changes: a learner who writes what a field's border looks like
   // must not lose it because it was compared with the border itself.
   auto byField = fieldwiseDiff(original, edited);

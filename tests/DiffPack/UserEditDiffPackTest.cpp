@@ -7,9 +7,12 @@
 
 #include "DiffPack/Packs.h"
 #include "MarletDiff/ContentDiff.h"
+#include "MarletDiff/Texts.h"
 #include "MarletFoundation/DiffPack/MergedUserEdit.h"
 #include "MarletFoundation/DiffPack/UserEditDiffPackValidator.h"
 #include "MarletFoundation/Marlet/MarletBookSnapshot.h"
+#include "MarletFoundation/SourceAnnotations/EditableRanges.h"
+#include "MarletFoundation/SourceAnnotations/SourceTag.h"
 #include "support/Documents.h"
 #include "support/Failure.h"
 #include "support/Fatal.h"
@@ -78,6 +81,10 @@ TEST(UserEditDiffPack, AHunkStaysWhenItLiesWhollyInOneEditableRange) {
   for (const auto& [range, stays] : cases) {
     EXPECT_EQ(survives(text, range), stays) << range.location << " " << range.length;
   }
+  constexpr auto largest = std::numeric_limits<std::int64_t>::max();
+  for (const TextRange& range :
+       {TextRange{start, largest}, {largest, 1}, {largest, largest}, {end, -1}, {-1, 1}})
+    EXPECT_FALSE(survives(text, range)) << range.location << " " << range.length;
   EXPECT_TRUE(survives(u"no tags", {0, 7}));
   EXPECT_FALSE(survives(u"no tags", {0, 8}));
 
@@ -150,6 +157,46 @@ RC_GTEST_FIXTURE_PROP(UpdatingUserEdits, LosesNothingThatIsWrittenInFields, ()) 
   Tree{{"fields", page("x\ny\n", "x y", "\n")}}.writeTo(directory_.path());
   const auto edited = page(*anyText, *anyText, *anyText);
   RC_ASSERT(seen("fields", edited) == edited);
+}
+
+/// Whether a range takes in a part of a page's tag or line of a tag, or lies within.
+bool touchesTag(std::u16string_view text, const TextRange& range) {
+  const auto tags = SourceTag::parseLineForTagsInSourceEditor(text);
+  return std::any_of(tags.begin(), tags.end(), [&](const SourceTag::Located& located) {
+    const auto tagEnd = located.range.end() + (located.tag.isLineTag() ? 1 : 0);
+    return located.range.location < range.end() && range.location < tagEnd;
+  });
+}
+
+/// The editable range of a field reaches over the tags of fields within it.
+RC_GTEST_FIXTURE_PROP(UpdatingUserEdits, LeavesTagsAsTheyAreInFieldsWithinFields, ()) {
+  const auto page = textOf(
+      {u"a\n", u"\u00e9/\n", u"//#-editable-code\n", u"//#-editable-code\n", u"//#-end-editable-code\n",
+       u"//#-end-editable-code\n", u"//#-hidden-code\n", u"//#-end-hidden-code\n", u"//#-copy-source(id)\n",
+       u"//#-end-copy-source\n", u"/*#-copy-source(i)*/c/*#-end-copy-source*/ d\n",
+       u"f(/*#-editable-code*/1/*#-end-editable-code*/, /*#-editable-code*/x/*#-end-editable-code*/)\n"});
+  const auto writing = textOf({u"a", u"/", u"*/", u"//#-", u"\n", u"b()\n", u"/*#-end-editable-code*/",
+                               u"/*#-editable-code*/", u"//#-end-editable-code\n", u"//#-editable-code\n"});
+  const auto utf8 = [](std::u16string_view text) { return *utf8FromUTF16(text); };
+  const auto text = u"x\n" + *page;
+  Tree{{"nested", utf8(text)}}.writeTo(directory_.path());
+
+  auto edited = text;
+  const auto range = *rc::gen::elementOf(editableRanges(text));
+  RC_PRE(range.length >= 0);
+  const auto start = *rc::gen::inRange(range.location, range.end() + 1);
+  const auto length = *rc::gen::inRange<std::int64_t>(0, std::min<std::int64_t>(range.end() - start, 9) + 1);
+  RC_PRE(!touchesTag(text, {start, length}));
+  edited.replace(static_cast<std::size_t>(start), static_cast<std::size_t>(length), *writing);
+  RC_ASSERT(seen("nested", utf8(edited)) == utf8(edited));
+
+  // What else is changed, tags included, is no reason to touch a tag.
+  edited.replace(*rc::gen::inRange<std::size_t>(0, edited.size() + 1), *rc::gen::inRange<std::size_t>(0, 40),
+                 *writing);
+  for (const auto& entry : updated({{"nested", Data(utf8(edited))}})) {
+    for (const auto& hunk : std::get<FileDiff::Modified>(entry.change).diff)
+      RC_ASSERT(!touchesTag(text, hunk.originalRange));
+  }
 }
 
 TEST_F(UpdatingUserEdits, ALineFeedThatTheEditorAddsIsNoEdit) {
