@@ -41,7 +41,9 @@ void Comparison::dropUnmatched(std::pmr::vector<std::uint32_t>& original,
 /// Leaves in `anchors_` the longest row of tokens that are unique in both lists and ascend in both.
 void Comparison::findAnchors(const std::pmr::vector<std::uint32_t>& original) {
   anchors_.clear();
+  anchors_.reserve(original.size());
   rowEnds_.clear();
+  rowEnds_.reserve(original.size());
   for (std::uint32_t i = 0; i < original.size(); ++i) {
     const auto& occurrences = occurrences_[original[i]];
     if (!occurrences.original.one() || !occurrences.modified.one()) continue;

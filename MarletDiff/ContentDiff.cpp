@@ -72,7 +72,11 @@ std::size_t partLength(const Change& change) {
   return std::size_t{change.originalEnd - change.original} + (change.modifiedEnd - change.modified);
 }
 
-enum class Level { lines, stretches, words, characters };
+enum class Level { blocks, lines, stretches, words, characters };
+
+/// From this length on, UTF-16 units of both, texts are compared by blocks of lines before they are by lines: the lists
+/// of a comparison then stay within the processor's caches.
+constexpr std::size_t longTexts = std::size_t{1} << 21;
 
 /// From this length on, UTF-16 units, a part is compared by stretches of words before it is by words.
 constexpr std::size_t longPart = 1 << 14;
@@ -93,18 +97,20 @@ bool isOneWord(View<Unit> text) {
 template <class Unit>
 class ContentDiff {
  public:
-  /// `length` is that of both texts together, UTF-16 units.
-  ContentDiff(View<Unit> original, View<Unit> modified, std::size_t length, bool smallerHunks)
+  /// `length` is that of both texts together, UTF-16 units. Takes the work off `budget`.
+  ContentDiff(View<Unit> original, View<Unit> modified, std::size_t length, bool smallerHunks,
+              std::int64_t& budget)
       : original_(original),
         modified_(modified),
         smallerHunks_(smallerHunks),
-        budget_(leastBudget + budgetPerUnit * static_cast<std::int64_t>(length)),
+        isLong_(length >= longTexts),
+        budget_(budget),
         differing_(withoutEqualLines(original, modified)),
         memory_(workBytesPerUnit * partLength(differing_)) {}
 
   std::vector<DiffDescriptor> run() {
     if (partLength(differing_) == 0) return {};
-    compare(differing_, Level::lines);
+    compare(differing_, isLong_ ? Level::blocks : Level::lines);
     slideChanges(original_, modified_, changes_);
     joinTouching();
     return descriptors();
@@ -136,12 +142,15 @@ class ContentDiff {
   Text<Unit> original_;
   Text<Unit> modified_;
   bool smallerHunks_;
-  std::int64_t budget_;
+  bool isLong_;
+  std::int64_t& budget_;
+  /// Its own, so that blocks leave the lines theirs.
+  std::int64_t blocksBudget_ = leastBudget;
   Change differing_;
   WorkMemory memory_;
   TokenNumbers<Unit> numbers_{&memory_};
-  std::array<Workspace, 4> workspaces_{Workspace(&memory_), Workspace(&memory_), Workspace(&memory_),
-                                       Workspace(&memory_)};
+  std::array<Workspace, 5> workspaces_{Workspace(&memory_), Workspace(&memory_), Workspace(&memory_),
+                                       Workspace(&memory_), Workspace(&memory_)};
   std::pmr::vector<Change> changes_{&memory_};
 };
 
@@ -150,6 +159,8 @@ void ContentDiff<Unit>::cut(Text<Unit>& text, std::uint32_t start, std::uint32_t
                             Tokens<Unit>& tokens) {
   tokens.text = text.view;
   switch (level) {
+    case Level::blocks:
+      return tokens.cutBlocks(start, end);
     case Level::lines:
       return tokens.cutLines(start, end);
     case Level::stretches:
@@ -168,14 +179,16 @@ void ContentDiff<Unit>::compare(const Change& part, Level level) {
   cut(original_, part.original, part.originalEnd, level, original);
   cut(modified_, part.modified, part.modifiedEnd, level, modified);
   numbers_.number(original, modified);
-  const auto& changes = comparison.changes(original.numbers, modified.numbers, numbers_.size(), budget_);
+  const auto& changes = comparison.changes(original.numbers, modified.numbers, numbers_.size(),
+                                           level == Level::blocks ? blocksBudget_ : budget_);
   for (const auto& change : changes) {
     Change inside{original.starts[change.original], original.starts[change.originalEnd],
                   modified.starts[change.modified], modified.starts[change.modifiedEnd]};
     // What took the place of as many tokens mostly has all words but a few in common with them. Where there are more
     // on one side, words can't tell at which end those are.
     const bool isAsMany = change.originalEnd - change.original == change.modifiedEnd - change.modified;
-    if (smallerHunks_ && level < Level::words && isAsMany) inside = trimmed(inside, Level::words);
+    const bool ofLinesOrStretches = level == Level::lines || level == Level::stretches;
+    if (smallerHunks_ && ofLinesOrStretches && isAsMany) inside = trimmed(inside, Level::words);
     add(inside, level);
   }
 }
@@ -183,7 +196,9 @@ void ContentDiff<Unit>::compare(const Change& part, Level level) {
 /// Adds a change that was found at a level, or what it comes to at the levels below.
 template <class Unit>
 void ContentDiff<Unit>::add(const Change& change, Level level) {
-  if (!smallerHunks_ || !replaces(change)) {
+  if (level == Level::blocks && replaces(change)) {
+    compare(change, Level::lines);
+  } else if (!smallerHunks_ || !replaces(change)) {
     changes_.push_back(change);
   } else if (level == Level::characters || budget_ <= 0) {
     changes_.push_back(trimmed(change, Level::characters));
@@ -203,16 +218,27 @@ Level ContentDiff<Unit>::levelBelow(Level level, const Change& change) const {
 template <class Unit>
 void ContentDiff<Unit>::joinTouching() {
   std::pmr::vector<Change> joined(&memory_);
+  bool isUntrimmed = false;
+  const auto trimLast = [&] {
+    if (isUntrimmed) joined.back() = trimmed(joined.back(), Level::characters);
+    isUntrimmed = false;
+  };
   for (const auto& change : changes_) {
     if (joined.empty() || joined.back().originalEnd < change.original) {
+      trimLast();
       joined.push_back(change);
       continue;
     }
     auto& last = joined.back();
     last.originalEnd = change.originalEnd;
     last.modifiedEnd = change.modifiedEnd;
-    if (smallerHunks_) last = trimmed(last, Level::characters);
+    isUntrimmed = smallerHunks_;
+    // Trimmed at once it may touch the next one no more. A long row of changes is trimmed as a whole.
+    if (budget_ <= 0) continue;
+    budget_ -= static_cast<std::int64_t>(partLength(last));
+    trimLast();
   }
+  trimLast();
   changes_ = std::move(joined);
 }
 
@@ -266,8 +292,18 @@ bool asksForSmallerHunks(const std::optional<DiffOptions>& options) {
 
 }  // namespace
 
+std::int64_t diffBudget(std::size_t length) {
+  return leastBudget + budgetPerUnit * static_cast<std::int64_t>(length);
+}
+
 std::vector<DiffDescriptor> diffContent(std::u16string_view original, std::u16string_view modified,
                                         std::optional<DiffOptions> options) {
+  auto budget = diffBudget(original.size() + modified.size());
+  return diffContent(original, modified, options, budget);
+}
+
+std::vector<DiffDescriptor> diffContent(std::u16string_view original, std::u16string_view modified,
+                                        std::optional<DiffOptions> options, std::int64_t& budget) {
   if (original.size() > longestText || modified.size() > longestText) {
     if (original == modified) return {};
     return {{{0, std::ssize(original)},
@@ -275,8 +311,8 @@ std::vector<DiffDescriptor> diffContent(std::u16string_view original, std::u16st
              std::u16string(original),
              std::u16string(modified)}};
   }
-  return ContentDiff(original, modified, original.size() + modified.size(), asksForSmallerHunks(options))
-      .run();
+  const auto length = original.size() + modified.size();
+  return ContentDiff(original, modified, length, asksForSmallerHunks(options), budget).run();
 }
 
 std::vector<DiffDescriptor> diffContent(std::string_view original, std::string_view modified,
@@ -285,7 +321,8 @@ std::vector<DiffDescriptor> diffContent(std::string_view original, std::string_v
   if (original.size() > longestText || modified.size() > longestText) {
     return diffContent(utf16(original), utf16(modified), options);
   }
-  return ContentDiff(original, modified, length, asksForSmallerHunks(options)).run();
+  auto budget = diffBudget(length);
+  return ContentDiff(original, modified, length, asksForSmallerHunks(options), budget).run();
 }
 
 }  // namespace MarletDiff

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <cstddef>
+#include <cstdint>
 #include <optional>
 #include <string_view>
 #include <vector>
@@ -25,5 +27,14 @@ MARLET_EXPORT std::vector<DiffDescriptor> diffContent(std::u16string_view origin
 /// the same. Throws a `MarletFoundation::ErrorObject` of the POSIX domain (EILSEQ) for ill-formed UTF-8.
 MARLET_EXPORT std::vector<DiffDescriptor> diffContent(std::string_view original, std::string_view modified,
                                                       std::optional<DiffOptions> options = std::nullopt);
+
+/// The same for one of several parts of a text that are compared by themselves. All of them together take the work of
+/// one comparison, which `diffBudget` gives for the length of both texts, UTF-16 units; what is left of it is less
+/// afterwards.
+MARLET_EXPORT std::vector<DiffDescriptor> diffContent(std::u16string_view original,
+                                                      std::u16string_view modified,
+                                                      std::optional<DiffOptions> options,
+                                                      std::int64_t& budget);
+MARLET_EXPORT std::int64_t diffBudget(std::size_t length);
 
 }  // namespace MarletDiff

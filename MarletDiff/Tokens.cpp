@@ -4,6 +4,7 @@
 #include <array>
 #include <bit>
 #include <cstring>
+#include <optional>
 #include <random>
 
 #ifdef __SSE2__
@@ -86,20 +87,17 @@ class StartsWriter {
   std::size_t count_ = 0;
 };
 
-}  // namespace
-
-template <class Unit>
-void Tokens<Unit>::cutLines(std::uint32_t start, std::uint32_t end) {
-  starts.assign(1, start);
-  StartsWriter writer(starts);
+/// Calls `use` with each place behind a line's end, and with some that turn out to be none.
+template <class Unit, class Use>
+void forEachLineEnd(View<Unit> text, std::uint32_t start, std::uint32_t end, const Use& use) {
   const auto endAt = [&](std::uint32_t at) {
     const auto rest = text.substr(at, end - at);
     if (rest.front() == '\n') {
-      writer.add(at + 1);
+      use(at + 1, true);
     } else if (rest.front() == '\r') {
-      writer.add(at + 1, rest.size() == 1 || rest[1] != '\n');
+      use(at + 1, rest.size() == 1 || rest[1] != '\n');
     } else if (rest.starts_with(paragraphSeparator<Unit>)) {
-      writer.add(at + static_cast<std::uint32_t>(paragraphSeparator<Unit>.size()));
+      use(at + static_cast<std::uint32_t>(paragraphSeparator<Unit>.size()), true);
     }
   };
   auto at = start;
@@ -111,22 +109,58 @@ void Tokens<Unit>::cutLines(std::uint32_t start, std::uint32_t end) {
   for (; at < end; ++at) {
     if (mayEndLine(text[at])) endAt(at);
   }
+}
+
+/// Eight units as bytes; nothing unless all are ASCII.
+std::optional<std::uint64_t> asciiBytes(const char* units) {
+  std::uint64_t bytes;
+  std::memcpy(&bytes, units, sizeof bytes);
+  return (bytes & 0x8080808080808080) == 0 ? std::optional(bytes) : std::nullopt;
+}
+std::optional<std::uint64_t> asciiBytes(const char16_t* units) {
+  std::uint64_t bytes = 0, allBits = 0;
+  for (int i = 0; i < 8; ++i) {
+    bytes |= std::uint64_t{units[i]} << 8 * i;
+    allBits |= units[i];
+  }
+  return allBits < 0x80 ? std::optional(bytes) : std::nullopt;
+}
+
+/// Whether a place is one in so many that are chosen by nothing but the characters beside them, all ASCII.
+template <std::uint64_t many, class Unit>
+bool isOneIn(View<Unit> text, std::size_t at) {
+  constexpr std::size_t beside = 8;
+  if (at < beside || at + beside > text.size()) return false;
+  const auto before = asciiBytes(text.data() + at - beside), after = asciiBytes(text.data() + at);
+  return before && after && mixed(*before ^ hashConstants[0], *after ^ hashConstants[1]) % many == 0;
+}
+
+}  // namespace
+
+template <class Unit>
+void Tokens<Unit>::cutLines(std::uint32_t start, std::uint32_t end) {
+  starts.assign(1, start);
+  StartsWriter writer(starts);
+  forEachLineEnd(text, start, end, [&](std::uint32_t at, bool isEnd) { writer.add(at, isEnd); });
   writer.flush();
   if (starts.back() != end) starts.push_back(end);
 }
 
 template <class Unit>
-void Tokens<Unit>::cutStretches(std::uint32_t start, std::uint32_t end) {
-  constexpr std::uint32_t beside = 4;
+void Tokens<Unit>::cutBlocks(std::uint32_t start, std::uint32_t end) {
   starts.assign(1, start);
-  for (auto at = start + beside; at + beside <= end; ++at) {
+  forEachLineEnd(text, start, end, [&](std::uint32_t at, bool isEnd) {
+    if (isEnd && isOneIn<8>(text.substr(start, end - start), at - start)) starts.push_back(at);
+  });
+  starts.push_back(end);
+}
+
+template <class Unit>
+void Tokens<Unit>::cutStretches(std::uint32_t start, std::uint32_t end) {
+  starts.assign(1, start);
+  for (auto at = start + 1; at < end; ++at) {
     if (!isASCIIWord(text[at]) || isASCIIWord(text[at - 1])) continue;
-    std::uint64_t around = 0, allBits = 0;
-    for (const auto unit : text.substr(at - beside, 2 * beside)) {
-      allBits |= static_cast<std::uint64_t>(unit);
-      around = around << 8 | static_cast<unsigned char>(unit);
-    }
-    if (allBits < 0x80 && mixed(around ^ hashConstants[0], hashConstants[1]) % 16 == 0) starts.push_back(at);
+    if (isOneIn<16>(text.substr(start, end - start), at - start)) starts.push_back(at);
   }
   starts.push_back(end);
 }
@@ -165,6 +199,7 @@ void TokenNumbers<Unit>::reset(std::size_t tokens) {
   if (slots_.size() <= mask_) slots_.resize(mask_ + 1);
   std::fill_n(slots_.begin(), mask_ + 1, Slot{});
   firstPlaces_.clear();
+  firstPlaces_.reserve(tokens);
 }
 
 /// Hashes run ahead of the look-ups, and fetch the memory that these need.
@@ -228,6 +263,18 @@ std::uint64_t TokenNumbers<Unit>::hash(View<Unit> token) {
   std::uint64_t words[2] = {0, 0};
   const auto mix = [&] { result = mixed(words[0] ^ hashConstants[0] ^ result, words[1] ^ hashConstants[1]); };
   std::size_t at = 0;
+  // A block of lines is long, and four chains of products take little longer than one.
+  if (size > 256) {
+    std::uint64_t results[] = {result, result + 1, result + 2, result + 3};
+    for (; at + 4 * sizeof words < size; at += 4 * sizeof words) {
+      for (std::size_t lane = 0; lane < 4; ++lane) {
+        std::memcpy(words, bytes + at + lane * sizeof words, sizeof words);
+        results[lane] = mixed(words[0] ^ hashConstants[0] ^ results[lane], words[1] ^ hashConstants[1]);
+      }
+    }
+    result =
+        mixed(results[0] ^ results[1], hashConstants[0]) ^ mixed(results[2] ^ results[3], hashConstants[1]);
+  }
   for (; at + sizeof words < size; at += sizeof words) {
     std::memcpy(words, bytes + at, sizeof words);
     mix();

@@ -26,8 +26,10 @@ struct Tokens {
 
   /// Cuts into lines with their ends.
   void cutLines(std::uint32_t start, std::uint32_t end);
-  /// Cuts into stretches of about 16 words. Where one starts depends on nothing but the characters beside that
-  /// place, all ASCII, so that equal texts are cut alike wherever they stand and whatever their encoding.
+  /// Cuts into blocks of a few lines, or stretches of about 16 words. Where one starts depends on nothing but the
+  /// characters beside that place, all ASCII, so that equal texts are cut alike wherever they stand and whatever
+  /// their encoding.
+  void cutBlocks(std::uint32_t start, std::uint32_t end);
   void cutStretches(std::uint32_t start, std::uint32_t end);
   /// Cuts into words, and every other character by itself.
   void cutWords(Characters<Unit>& characters, std::uint32_t start, std::uint32_t end);

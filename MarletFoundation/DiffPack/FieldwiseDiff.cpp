@@ -83,6 +83,7 @@ std::optional<std::vector<DiffDescriptor>> piecewiseDiff(std::u16string_view ori
   const auto editedEnd = std::ssize(edited) - std::ssize(tail);
 
   std::vector<DiffDescriptor> hunks;
+  auto budget = MarletDiff::diffBudget(original.size() + edited.size());
   auto at = std::ssize(head);
   for (std::size_t i = 0; i < pieces.size(); ++i) {
     const auto& piece = pieces[i];
@@ -92,7 +93,7 @@ std::optional<std::vector<DiffDescriptor>> piecewiseDiff(std::u16string_view ori
     if (length == rest.npos) return std::nullopt;
     for (auto& hunk :
          MarletDiff::diffContent(part(original, piece.location, piece.end()), rest.substr(0, length),
-                                 MarletDiff::DiffOptions::SmallerHunks)) {
+                                 MarletDiff::DiffOptions::SmallerHunks, budget)) {
       hunk.originalRange.location += piece.location;
       hunk.modifiedRange.location += at;
       hunks.push_back(std::move(hunk));

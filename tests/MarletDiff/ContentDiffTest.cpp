@@ -103,6 +103,33 @@ TEST(ContentDiff, LeadsThroughSmallChangesOfALongLine) {
   EXPECT_LE(diffContent(line, edited, smaller).size(), 3u);
 }
 
+/// Long texts are not compared by lines at once, which changes nothing of what is found.
+TEST(ContentDiff, FindsEachChangeOfALongText) {
+  std::u16string original, modified;
+  Hunks lines, small;
+  for (std::int64_t i = 0; i < 60'000; ++i) {
+    const auto digits = std::to_string(i * i);
+    const auto line = u"let \u00e9 = " + std::u16string(digits.begin(), digits.end()) + u"\r\n";
+    auto other = line;
+    if (i % 7919 == 5) {
+      other.replace(4, 1, u"x");
+      lines.push_back(
+          {{std::ssize(original), std::ssize(line)}, {std::ssize(modified), std::ssize(line)}, line, other});
+      small.push_back({{std::ssize(original) + 4, 1}, {std::ssize(modified) + 4, 1}, u"\u00e9", u"x"});
+    } else if (i % 7919 == 500) {
+      other += u"new\r\n";
+      lines.push_back({{std::ssize(original + line), 0}, {std::ssize(modified + line), 5}, u"", u"new\r\n"});
+      small.push_back(lines.back());
+    }
+    original += line;
+    modified += other;
+  }
+  ASSERT_GT(original.size(), 1u << 20);
+  EXPECT_EQ(diffContent(original, modified), lines);
+  EXPECT_EQ(diffContent(original, modified, smaller), small);
+  EXPECT_EQ(diffContent(*utf8FromUTF16(original), *utf8FromUTF16(modified), smaller), small);
+}
+
 TEST(ContentDiff, HunksAreLinesOrSmaller) {
   struct {
     std::u16string original, modified;
