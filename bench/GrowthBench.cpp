@@ -105,6 +105,38 @@ Work diffingFewSymbols(int lines) {
   };
 }
 
+/// One of several equal lines goes, which may be any of them: each place where it could have stood is weighed.
+Work diffingEqualLines(std::u16string_view piece, int pieces, int lines) {
+  std::u16string line, text;
+  for (int i = 0; i < pieces; ++i) line += piece;
+  line += u'\n';
+  for (int i = 0; i < lines; ++i) text += line;
+  return [original = text, modified = text.substr(line.size())] {
+    benchmark::DoNotOptimize(MarletDiff::diffContent(original, modified, DiffOptions::SmallerHunks));
+  };
+}
+Work diffingParagraphs(int pieces) { return diffingEqualLines(u"学校で学ぶ、", pieces, 2); }
+Work diffingAccents(int pieces) { return diffingEqualLines(u"é ", pieces, 40); }
+
+/// The two sides change either end of every tenth paragraph, in which nothing is set apart by blanks.
+Work mergingParagraphs(int paragraphs) {
+  std::mt19937 random(1);
+  std::u16string base, left, right;
+  for (int i = 0; i < paragraphs; ++i) {
+    std::u16string text;
+    for (int j = 0; j < 500; ++j)
+      text += j % 10 == 9 ? u'、' : static_cast<char16_t>(u'一' + random() % 2000);
+    base += text + u'\n';
+    left += (i % 10 == 0 ? u"左" : u"") + text + u'\n';
+    right += text + (i % 10 == 0 ? u"右\n" : u"\n");
+  }
+  return [base, left, right] {
+    const auto diff = MarletDiff::diffContent(base, left, DiffOptions::SmallerHunks);
+    const auto otherDiff = MarletDiff::diffContent(base, right, DiffOptions::SmallerHunks);
+    benchmark::DoNotOptimize(MarletDiff::mergeContent(base, diff, otherDiff));
+  };
+}
+
 Work merging(int lines) {
   return [base = source(lines), left = source(lines, 1), right = source(lines, 2, 50)] {
     const auto diff = MarletDiff::diffContent(base, left, DiffOptions::SmallerHunks);
@@ -183,7 +215,10 @@ constexpr Operation operations[] = {
     {"converting", converting, 16000},
     {"diffing", diffing, 16000},
     {"diffingFewSymbols", diffingFewSymbols, 16000},
+    {"diffingParagraphs", diffingParagraphs, 1000},
+    {"diffingAccents", diffingAccents, 500},
     {"merging", merging, 16000},
+    {"mergingParagraphs", mergingParagraphs, 100},
     {"packing", packing, 32},
     {"applying", applying, 32},
 };
