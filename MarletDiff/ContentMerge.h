@@ -40,7 +40,7 @@ inline constexpr std::string_view OtherTextKey = "OtherText";
 /// Each list is checked first: its hunks must lie within the base, ascend without overlap, divide no
 /// character and carry the text that the base has there. With two lists, hunks of the two sides that overlap,
 /// touch or change the same word are taken together: a place that only one side changes, or both to the same
-/// text, takes that text, and any other is a conflict.
+/// text, takes that text, and any other is a conflict. Where a script has no blanks, each character is a word.
 ///
 /// Throws a `MarletFoundation::ErrorObject` of `ErrorDomain` with a `MergeErrorCode`.
 MARLET_EXPORT std::u16string mergeContent(std::u16string_view base, std::span<const DiffDescriptor> diff,
