@@ -7,6 +7,7 @@
 #include "MarletFoundation/Data/DataIterator.h"
 #include "MarletFoundation/Data/Either.h"
 #include "MarletFoundation/Data/JSON.h"
+#include "MarletFoundation/Data/MarletSerializationError.h"
 #include "MarletFoundation/Data/Maybe.h"
 #include "MarletFoundation/Data/Monoid.h"
 #include "MarletFoundation/Data/NonEmptyArray.h"

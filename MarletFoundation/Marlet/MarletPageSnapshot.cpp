@@ -2,8 +2,8 @@
 
 #include <tuple>
 
+#include "MarletFoundation/Data/MarletSerializationError.h"
 #include "MarletFoundation/Marlet/MarletPage.h"
-#include "MarletFoundation/Marlet/MarletSerializationError.h"
 #include "MarletFoundation/Marlet/PageDirectory.h"
 #include "MarletFoundation/PathUtilities/DocumentNames.h"
 #include "MarletFoundation/Platform/Text.h"

@@ -3,8 +3,8 @@
 #include <algorithm>
 #include <set>
 
+#include "MarletFoundation/Data/MarletSerializationError.h"
 #include "MarletFoundation/Marlet/LoadChecks.h"
-#include "MarletFoundation/Marlet/MarletSerializationError.h"
 #include "MarletFoundation/PathUtilities/DocumentNames.h"
 #include "MarletFoundation/Platform/FatalError.h"
 #include "MarletFoundation/Platform/Text.h"
@@ -84,25 +84,31 @@ void MarletParser::addPagesOmittedByList() {
   std::set<std::string> listed;
   for (const auto& page : *pages_) listed.insert(*page.name());
   for (const auto& [name, page] : pagesInDirectory(*directory)) {
-    if (!listed.contains(name) && page.isDirectory()) addPage(page, name);
+    if (!listed.contains(name) && page.isDirectory()) addNamedPage(page, name);
   }
 }
 
 void MarletParser::addPagesOfDirectory(const FileWrapper& directory) {
   pages_.emplace();
-  for (const auto& [name, page] : pagesInDirectory(directory)) addPage(page, name);
+  for (const auto& [name, page] : pagesInDirectory(directory)) addNamedPage(page, name);
 }
 
 void MarletParser::addRootAsPage() {
   if (!sourceOf(fileWrapper_))
     throw StubMarletSerializationError("Unable to load marlet file: Contents.swift file is missing.");
-  pages_ = {pageSnapshotFromFileWrapper(fileWrapper_, baseURL_, std::nullopt)};
+  pages_.emplace();
+  addPage(fileWrapper_, baseURL_, std::nullopt);
 }
 
-void MarletParser::addPage(const FileWrapper& directory, const std::string& name) {
-  const auto url = baseURL_.appendingPathComponent("Pages", true)
-                       .appendingPathComponent(MarletPageSnapshot::filenameForName(name), true);
-  auto page = pageSnapshotFromFileWrapper(directory, url, name);
+void MarletParser::addNamedPage(const FileWrapper& directory, const std::string& name) {
+  addPage(directory,
+          baseURL_.appendingPathComponent("Pages", true)
+              .appendingPathComponent(MarletPageSnapshot::filenameForName(name), true),
+          name);
+}
+
+void MarletParser::addPage(const FileWrapper& directory, const URL& url, std::optional<std::string> name) {
+  auto page = pageSnapshotFromFileWrapper(directory, url, std::move(name));
   if (!takes(page.text().size()))
     throw StubMarletSerializationError("Unable to load marlet page: unable to load Contents.swift.");
   pages_->push_back(std::move(page));

@@ -35,8 +35,8 @@ class MARLET_EXPORT MarletParser final : public XMLParser::Delegate {
       : fileWrapper_(std::move(fileWrapper)), baseURL_(std::move(baseURL)) {}
 
   /// Throws the `ErrorObject` of the first failure: of `MarletSerializationErrorDomain`, or the XML parser's
-  /// own. A `sections` element without any `code` is a fatal error. Sources of more than 2^28
-  /// UTF-16 units together are refused as one that can't be read.
+  /// own. A `sections` element without any `code` is a fatal error. A source with which all
+  /// of the document have more than 2^28 UTF-16 units is refused as one that can't be read.
   Document parse();
 
   /// Whether the document is of version 4 or less; nothing before the root element has been seen.
@@ -50,11 +50,11 @@ class MARLET_EXPORT MarletParser final : public XMLParser::Delegate {
   static MarletPageSnapshot pageSnapshotFromFileWrapper(const FileWrapper& fileWrapper, const URL& baseURL,
                                                         std::optional<std::string> name);
 
-  void didStartDocument(XMLParser& parser) override;
+  void parserDidStartDocument(XMLParser& parser) override;
   void didStartElement(XMLParser& parser, const std::string& name,
                        const XMLParser::Attributes& attributes) override;
   void didEndElement(XMLParser& parser, const std::string& name) override;
-  void didEndDocument(XMLParser& parser) override;
+  void parserDidEndDocument(XMLParser& parser) override;
 
  private:
   using Attributes = XMLParser::Attributes;
@@ -75,7 +75,8 @@ class MARLET_EXPORT MarletParser final : public XMLParser::Delegate {
   void addPagesOmittedByList();
   void addPagesOfDirectory(const FileWrapper& directory);
   void addRootAsPage();
-  void addPage(const FileWrapper& directory, const std::string& name);
+  void addNamedPage(const FileWrapper& directory, const std::string& name);
+  void addPage(const FileWrapper& directory, const URL& url, std::optional<std::string> name);
   /// False once the document's sources are too large.
   bool takes(std::size_t sourceUnits);
 

@@ -1,10 +1,10 @@
 // What the parser does at each tag: one state, one row of checks.
 
+#include "MarletFoundation/Data/MarletSerializationError.h"
 #include "MarletFoundation/Logging/Log.h"
 #include "MarletFoundation/Marlet/DocumentLog.h"
 #include "MarletFoundation/Marlet/LoadChecks.h"
 #include "MarletFoundation/Marlet/MarletParser.h"
-#include "MarletFoundation/Marlet/MarletSerializationError.h"
 #include "MarletFoundation/PathUtilities/DocumentNames.h"
 #include "MarletFoundation/Platform/FatalError.h"
 #include "MarletFoundation/Platform/Text.h"
@@ -29,6 +29,10 @@ using Attributes = XMLParser::Attributes;
 [[noreturn]] void failForAnyChild(const std::string& name, const std::string& parent) {
   fail(": encountered element '" + name + "' as a child of a '" + parent +
        "' element which should have no children.");
+}
+
+[[noreturn]] void failForContents(const std::string& filename) {
+  throw StubMarletSerializationError("Unable to load contents of '" + filename + "'.");
 }
 
 const std::string* valueOf(const Attributes& attributes, std::string_view name) {
@@ -81,12 +85,12 @@ std::string namesOf(const FileWrapper& directory) {
 
 }  // namespace
 
-void MarletParser::didStartDocument(XMLParser&) {
+void MarletParser::parserDidStartDocument(XMLParser&) {
   if (!stateStack_.empty()) fatalError("A marlet's document should only start once!");
   stateStack_.push_back(ParserState::DocumentRoot);
 }
 
-void MarletParser::didEndDocument(XMLParser&) {
+void MarletParser::parserDidEndDocument(XMLParser&) {
   if (stateStack_ != std::vector{ParserState::DocumentRoot})
     fatalError("A marlet's document should not end within an element!");
   stateStack_.pop_back();
@@ -178,12 +182,12 @@ void MarletParser::readSection(const Attributes& attributes) {
   const auto file = fileWrapper_.child(*filename);
   if (!file) throw StubMarletSerializationError("Unable to load '" + *filename + "'.");
   const auto data = file->regularFileContents();
-  if (!data || !takes(data->size()))
-    throw StubMarletSerializationError("Unable to load contents of '" + *filename + "'.");
+  if (!data) failForContents(*filename);
   const auto text = utf16FromUTF8(data->view());
   if (!text)
     throw StubMarletSerializationError("Unable to parse contents of '" + *filename +
                                        "' as UTF-8-encoded text.");
+  if (!takes(text->size())) failForContents(*filename);
   if (singlePageMarletContents_) {
     *singlePageMarletContents_ += u'\n' + *text;
   } else {
@@ -193,7 +197,8 @@ void MarletParser::readSection(const Attributes& attributes) {
 
 void MarletParser::refuseDocumentation() {
   throw ErrorObject(
-      std::string(MarletSerializationErrorDomain), MarletSerializationUnknownError,
+      std::string(MarletSerializationErrorDomain),
+      static_cast<int>(MarletSerializationErrorCode::UnknownError),
       {{std::string(LocalizedDescriptionKey),
         "Marlets containing HTML documentation sections are not supported."},
        {std::string(LocalizedRecoverySuggestionKey),
@@ -256,7 +261,7 @@ void MarletParser::readPage(const Attributes& attributes) {
   const auto* name = valueOf(attributes, "name");
   if (!name) fail(": 'page' element is missing a valid 'name' attribute.");
   const auto page = fileWrapper_.child("Pages")->child(MarletPageSnapshot::filenameForName(*name));
-  if (page) addPage(*page, *name);
+  if (page) addNamedPage(*page, *name);
 }
 
 }  // namespace MarletFoundation

@@ -8,6 +8,7 @@
 #include <limits>
 #include <memory>
 
+#include "MarletFoundation/Platform/XMLErrorRoute.h"
 #include "MarletFoundation/Platform/XMLText.h"
 
 namespace MarletFoundation {
@@ -21,22 +22,6 @@ struct ContextCloser {
   void operator()(xmlParserCtxt* context) const { xmlFreeParserCtxt(context); }
 };
 using Context = std::unique_ptr<xmlParserCtxt, ContextCloser>;
-
-/// Sends the errors that the reader reports on this thread to a handler, for a while.
-class ErrorRoute {
- public:
-  ErrorRoute(void* receiver, xmlStructuredErrorFunc handler)
-      : formerReceiver_(xmlStructuredErrorContext), formerHandler_(xmlStructuredError) {
-    xmlSetStructuredErrorFunc(receiver, handler);
-  }
-  ~ErrorRoute() { xmlSetStructuredErrorFunc(formerReceiver_, formerHandler_); }
-  ErrorRoute(const ErrorRoute&) = delete;
-  ErrorRoute& operator=(const ErrorRoute&) = delete;
-
- private:
-  void* formerReceiver_;
-  xmlStructuredErrorFunc formerHandler_;
-};
 
 const char* text(const xmlChar* characters) { return reinterpret_cast<const char*>(characters); }
 
@@ -170,7 +155,7 @@ struct XMLParserEvents {
     context = owner.get();
     *context->sax = handlers();
     context->userData = this;
-    const ErrorRoute route(this, error);
+    const XMLErrorRoute route(this, error);
     // Only the entities of XML itself are ever replaced, since no other comes to exist.
     // The reader's limits on size give way to ours, as theirs depend on where its buffer happens to end.
     xmlCtxtUseOptions(context, XML_PARSE_NONET | XML_PARSE_NOENT | XML_PARSE_IGNORE_ENC | XML_PARSE_HUGE);
@@ -190,14 +175,14 @@ bool XMLParser::parse() {
   const auto document = xmlText(data_);
   const auto utf8 = document.utf8.view();
   XMLParserEvents events(*this);
-  events.tellDelegate([&](Delegate& d) { d.didStartDocument(*this); });
+  events.tellDelegate([&](Delegate& d) { d.parserDidStartDocument(*this); });
   if (!error_ && !events.thrown) events.read(utf8);
   if (document.refusal && !aborted_ && (!error_ || line(*error_) >= lastLine(utf8))) {
     // Where the text was cut, the cut's reason tells more than that the text ends too early.
     error_.reset();
     events.fail(XML_ERR_DOCUMENT_END, std::string(*document.refusal), lastLine(utf8));
   }
-  if (!error_ && !events.thrown) events.tellDelegate([&](Delegate& d) { d.didEndDocument(*this); });
+  if (!error_ && !events.thrown) events.tellDelegate([&](Delegate& d) { d.parserDidEndDocument(*this); });
   if (events.thrown) std::rethrow_exception(events.thrown);
   return !error_;
 }

@@ -28,9 +28,9 @@ class MARLET_EXPORT XMLParser {
   class MARLET_EXPORT Delegate {
    public:
     virtual ~Delegate() = default;
-    virtual void didStartDocument(XMLParser&) {}
+    virtual void parserDidStartDocument(XMLParser&) {}
     /// Only called when the whole document was read.
-    virtual void didEndDocument(XMLParser&) {}
+    virtual void parserDidEndDocument(XMLParser&) {}
     virtual void didStartElement(XMLParser&, const std::string& /*name*/, const Attributes&) {}
     virtual void didEndElement(XMLParser&, const std::string& /*name*/) {}
     virtual void foundCharacters(XMLParser&, std::string_view) {}

@@ -235,6 +235,13 @@ TEST(MarletParser, CountsWhatItReads) {
   const auto tree = newStyle("<pages>" + list + "</pages>")
                         .with("Pages/A.wbmarletpage/Contents.swift", std::string(32 << 20, 'x'));
   EXPECT_EQ(outcome(tree), "Unable to load marlet page: unable to load Contents.swift.");
+  // By UTF-16 units, of which these have a third of their bytes.
+  std::string wide;
+  while (wide.size() < 30u << 20) wide += "、";
+  list.clear();
+  for (int i = 0; i < 9; ++i) list += "<code source-file-name='a'/>";
+  const auto old = oldStyle("<sections>" + list + "</sections>").with("a", wide);
+  EXPECT_FALSE(errorOf([&] { parsed(old); }));
 }
 
 TEST(MarletParser, TellsTheOldStyle) {
@@ -255,7 +262,7 @@ TEST(MarletParser, FatalConditions) {
   const auto fatal = [&](const auto& events) {
     return fatalMessage([&] {
       MarletParser parser(sections.wrapper(), URL::file("/D.marlet", true));
-      parser.didStartDocument(xml);
+      parser.parserDidStartDocument(xml);
       events(parser);
     });
   };
@@ -265,10 +272,10 @@ TEST(MarletParser, FatalConditions) {
               parser.didEndElement(xml, "pages");
             }),
             "Unexpected state for new-style marlet: MarletElement");
-  EXPECT_NE(fatal([&](auto& parser) { parser.didStartDocument(xml); }), "");
+  EXPECT_NE(fatal([&](auto& parser) { parser.parserDidStartDocument(xml); }), "");
   EXPECT_NE(fatal([&](auto& parser) {
               parser.didStartElement(xml, "marlet", newRoot);
-              parser.didEndDocument(xml);
+              parser.parserDidEndDocument(xml);
             }),
             "");
 }

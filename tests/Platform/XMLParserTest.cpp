@@ -22,7 +22,7 @@ struct Recorder : XMLParser::Delegate {
   }
   void didEndElement(XMLParser&, const std::string& name) override { events += "</" + name + ">"; }
   void foundCharacters(XMLParser&, std::string_view text) override { events += text; }
-  void didEndDocument(XMLParser&) override { events += "."; }
+  void parserDidEndDocument(XMLParser&) override { events += "."; }
 };
 
 struct Outcome {

@@ -1,8 +1,10 @@
 #include "MarletFoundation/XML/MLFXMLWriter.h"
 
 #include <gtest/gtest.h>
+#include <libxml/globals.h>
 #include <rapidcheck/gtest.h>
 
+#include "MarletFoundation/Data/MarletSerializationError.h"
 #include "MarletFoundation/Platform/FileManager.h"
 #include "MarletFoundation/Platform/Text.h"
 #include "MarletFoundation/Platform/XMLParser.h"
@@ -33,6 +35,8 @@ TEST(MLFXMLWriter, WritesInOrderIndentedByFourBlanks) {
     document.addComment(" made by hand ");
     document.createRootElementWithName("list", {{"version", "6.0"}, {"a", "<\"&'>\n"}}, [](auto& list) {
       list.addChildElementWithName("empty");
+      EXPECT_THROW(list.addChildElementWithName("left", {}, [](auto&) { throw 1; }), int);
+      list.addChildElementWithName("s:r", {{"xml:lang", "de"}, {"s:r", ""}});
       list.addChildElementWithName("item", {{"name", "ä"}}, [](auto& item) {
         item.addChildElementWithName("text", {}, [](auto& text) { text.addText("1 < 2 & 3"); });
         item.addComment("inside");
@@ -43,6 +47,8 @@ TEST(MLFXMLWriter, WritesInOrderIndentedByFourBlanks) {
 <!-- made by hand -->
 <list version="6.0" a="&lt;&quot;&amp;'&gt;&#10;">
     <empty/>
+    <left/>
+    <s:r xml:lang="de" s:r=""/>
     <item name="ä">
         <text>1 &lt; 2 &amp; 3</text>
         <!--inside-->
@@ -68,7 +74,8 @@ TEST(MLFXMLWriter, RefusesWhatXMLCannotCarryAndASecondRoot) {
     EXPECT_THROW(withElement([&](auto& e) { e.addComment(text); }), ErrorObject);
     EXPECT_THROW(withElement([&](auto& e) { e.addChildElementWithName("b", {{"c", text}}); }), ErrorObject);
   }
-  for (const std::string& name : std::initializer_list<std::string>{"", "1a", "a b", "a:b", "<", "a\n"}) {
+  for (const std::string& name :
+       std::initializer_list<std::string>{"", "1a", "a b", ":a", "a:", "a:b:c", "<", "a\n"}) {
     EXPECT_THROW(withElement([&](auto& e) { e.addChildElementWithName(name); }), ErrorObject) << name;
     EXPECT_THROW(withElement([&](auto& e) { e.addChildElementWithName("b", {{name, ""}}); }), ErrorObject);
   }
@@ -85,6 +92,64 @@ TEST(MLFXMLWriter, RefusesWhatXMLCannotCarryAndASecondRoot) {
             }),
             "!_didAddRootElement && \"-createRootElementWithName:attributes:usingElementWriter: may only be "
             "called once per document!\"");
+}
+
+void nest(MLFXMLElement& element, int levels) {
+  if (levels > 0)
+    element.addChildElementWithName("e", {}, [&](auto& child) { nest(child, levels - 1); });
+  else
+    element.addText("innermost");
+}
+
+TEST(MLFXMLWriter, WritesNothingOfADocumentOfWhichAPartIsRefused) {
+  const MLFXMLElementWriter writers[] = {
+      [](auto& e) { nest(e, 256); },
+      [](auto& e) {
+        e.addText(std::string(6 << 20, 'x'));
+        e.addText(std::string(6 << 20, 'y'));
+      },
+      [](auto& e) { e.addText(std::string((8 << 20) + 1, 'x')); },
+      [](auto& e) {
+        e.addChildElementWithName("b", {{"a", "1"}, {"a", "2"}});
+      },
+      [](auto& e) {
+        e.addChildElementWithName("b", {{"xmlns:p", ""}});
+      },
+      [](auto& e) { e.addChildElementWithName(std::string(60000, 'n')); },
+      [](auto& e) {
+        // Its error is kept, whoever catches it.
+        for (const char* name : {"a", "b"}) {
+          try {
+            e.addChildElementWithName(name, {{"a", "1"}, {"a", std::string(9000, '2')}});
+          } catch (const ErrorObject&) {
+          }
+        }
+      },
+  };
+  const TemporaryDirectory directory;
+  testing::internal::CaptureStderr();
+  for (const auto& writer : writers) {
+    const auto error = thrown<ErrorObject>([&] {
+      Writer::writeXMLToURL(directory.url("x.xml"),
+                            [&](auto& d) { d.createRootElementWithName("a", {}, writer); });
+    });
+    EXPECT_EQ(error.domain(), MarletSerializationErrorDomain);
+    EXPECT_EQ(error.code(), static_cast<int>(MarletSerializationErrorCode::UnknownError));
+    EXPECT_FALSE(FileManager::fileExists(directory.url("x.xml"))) << error.description();
+  }
+  const auto deepest =
+      document([](auto& d) { d.createRootElementWithName("a", {}, [](auto& e) { nest(e, 255); }); });
+  EXPECT_NE(deepest.find("innermost"), std::string::npos);
+  EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
+}
+
+TEST(MLFXMLWriter, IndentsByFourBlanksForTheWhileOfABlock) {
+  const std::string former = xmlTreeIndentString;
+  std::string within;
+  EXPECT_THROW(Writer::performBlockWithCustomTreeIndentString([&] { throw within = xmlTreeIndentString; }),
+               std::string);
+  EXPECT_EQ(within, "    ");
+  EXPECT_EQ(xmlTreeIndentString, former);
 }
 
 std::pair<std::string, std::string> readBack(const std::string& value, const std::string& text) {

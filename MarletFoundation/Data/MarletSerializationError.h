@@ -6,12 +6,15 @@
 
 namespace MarletFoundation {
 
-/// The one code of `MarletSerializationErrorDomain`: the message tells what is wrong.
-inline constexpr int MarletSerializationUnknownError = 0;
+/// The codes of `MarletSerializationErrorDomain`. There is one: the message tells what is wrong.
+enum class MarletSerializationErrorCode {
+  UnknownError = 0,
+};
 
 /// What ends the reading or writing of a classic document.
 inline ErrorObject StubMarletSerializationError(std::string message) {
-  return ErrorObject::withMessage(MarletSerializationErrorDomain, MarletSerializationUnknownError,
+  return ErrorObject::withMessage(MarletSerializationErrorDomain,
+                                  static_cast<int>(MarletSerializationErrorCode::UnknownError),
                                   std::move(message));
 }
 
