@@ -1,5 +1,6 @@
 #include "MarletFoundation/Environment/SearchPath.h"
 
+#include "MarletFoundation/PathUtilities/URLExtensions.h"
 #include "MarletFoundation/Platform/FatalError.h"
 #include "MarletFoundation/Platform/FileManager.h"
 
@@ -12,8 +13,9 @@ const ErrorTable& errorTable(SearchPath::PropertyListSerializationErrorCase) {
 }
 
 SearchPath::SearchPath(std::vector<URL> searchPaths) : searchPaths_(std::move(searchPaths)) {
-  for (const auto& url : searchPaths_) {
+  for (auto& url : searchPaths_) {
     if (!url.isFileURL()) fatalError("Search paths must be file URLs: " + url.absoluteString());
+    url = directoryURL(url);
   }
 }
 
@@ -24,7 +26,7 @@ SearchPath::SearchPath(const PropertyListValue& value) {
   for (const auto& element : *array) {
     const auto* path = element.string();
     if (!path) throw Failure(Failure::Case::SearchPathNotAString);
-    searchPaths_.push_back(URL::file(*path));
+    searchPaths_.push_back(URL::file(*path, true));
   }
 }
 

@@ -10,7 +10,8 @@
 
 namespace MarletFoundation {
 
-/// An ordered list of directories in which a file is looked for. All are file URLs.
+/// An ordered list of directories in which a file is looked for. All are file URLs, held as those of directories
+/// whether or not they came with the mark of one.
 class MARLET_EXPORT SearchPath {
  public:
   enum class PropertyListSerializationErrorCase { RootNotAnArray, SearchPathNotAString };

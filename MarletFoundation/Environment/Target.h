@@ -47,8 +47,8 @@ class MARLET_EXPORT Target {
   static std::vector<TargetPointer> allTargets();
   /// The target registered under `identifier`, or null.
   static TargetPointer targetWithIdentifier(std::string_view identifier);
-  /// The target registered for a directory, else one loaded from it and, if asked, registered. Null when the
-  /// directory holds no good one; that has no message.
+  /// The target registered for a directory, with or without the mark of one, else one loaded from it and, if
+  /// asked, registered. Null when the directory holds no good one; that has no message.
   static TargetPointer loadFrom(const URL& url, bool registerTarget);
   /// False, with nothing changed, when the URL or the target's identifier is registered.
   static bool registerTarget(const TargetPointer& target, const std::optional<URL>& url);

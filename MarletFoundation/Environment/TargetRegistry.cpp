@@ -4,6 +4,7 @@
 #include "MarletFoundation/Environment/Target.h"
 #include "MarletFoundation/Environment/TargetInfo.h"
 #include "MarletFoundation/Logging/Log.h"
+#include "MarletFoundation/PathUtilities/URLExtensions.h"
 #include "MarletFoundation/Platform/FileManager.h"
 #include "MarletFoundation/Platform/Host.h"
 #include "MarletFoundation/Utils/Locks.h"
@@ -12,6 +13,7 @@ namespace MarletFoundation {
 namespace {
 
 struct Registry {
+  /// By `directoryURL`.
   std::unordered_map<URL, TargetPointer> urlToTargetMap;
   std::map<std::string, TargetPointer, std::less<>> identifierToTargetMap;
   std::vector<TargetPointer> allTargets;
@@ -19,14 +21,14 @@ struct Registry {
 
   TargetPointer targetForURL(const URL& url) {
     return targetRegistryLock.read([&] {
-      const auto found = urlToTargetMap.find(url);
+      const auto found = urlToTargetMap.find(directoryURL(url));
       return found == urlToTargetMap.end() ? nullptr : found->second;
     });
   }
 
   void add(const TargetPointer& target, const std::optional<URL>& url) {
     targetRegistryLock.write([&] {
-      if (url) urlToTargetMap[*url] = target;
+      if (url) urlToTargetMap[directoryURL(*url)] = target;
       identifierToTargetMap[target->identifier] = target;
       allTargets.push_back(target);
     });
@@ -101,7 +103,7 @@ TargetPointer Target::loadFrom(const URL& url, bool registerTarget) {
 
 bool Target::registerTarget(const TargetPointer& target, const std::optional<URL>& url) {
   const bool isKnown = registry().targetRegistryLock.read([&] {
-    return (url && registry().urlToTargetMap.contains(*url)) ||
+    return (url && registry().urlToTargetMap.contains(directoryURL(*url))) ||
            registry().identifierToTargetMap.contains(target->identifier);
   });
   if (!isKnown) registry().add(target, url);

@@ -89,6 +89,7 @@ TEST(TargetRegistry, BundledTargetsAreThereAndOthersAreAddedOnce) {
   const auto url = directory.url("x.target");
   const auto target = Target::loadFrom(url, true);
   EXPECT_EQ(Target::loadFrom(url, true), target);
+  EXPECT_EQ(Target::loadFrom(URL::file(url.path(), true), true), target);
   EXPECT_EQ(Target::targetWithIdentifier("test.x"), target);
   EXPECT_EQ(Target::allTargets().size(), bundled.size() + 1);
   EXPECT_FALSE(Target::registerTarget(target, URL::file("/elsewhere")));
@@ -107,7 +108,10 @@ TEST(SearchPath, FirstHitWinsAndFormIsAnArrayOfPaths) {
   EXPECT_EQ(path.URLForFileWithRelativePath("only-b"), directory.url("b").appendingPathComponent("only-b"));
   EXPECT_FALSE(path.URLForFileWithRelativePath("neither"));
   EXPECT_FALSE(SearchPath().URLForFileWithRelativePath("both"));
-  EXPECT_EQ(SearchPath(path.propertyListValue()).propertyListValue(), path.propertyListValue());
+  for (const auto& written : {path, SearchPath(), SearchPath({URL::file("/a"), URL::file("/", true)}),
+                              Target::targetWithIdentifier("desk")->frameworkSearchPath,
+                              Toolchain::globalToolchain()->effectiveLibrarySearchPath()})
+    EXPECT_EQ(SearchPath(written.propertyListValue()), written);
   using Failure = SearchPath::PropertyListSerializationError;
   EXPECT_THROW(SearchPath(PropertyListValue("x")), Failure);
   EXPECT_THROW(SearchPath(PropertyListValue(A{"/x", 1})), Failure);
