@@ -8,14 +8,10 @@ namespace {
 constexpr std::string_view kindNames[] = {"double", "integer",    "boolean", "string",
                                           "array",  "dictionary", "null"};
 
-[[noreturn]] void failForKind(JSON::Kind wanted) {
-  throw JSONError(JSONErrorCase::DecodingTypeMismatch, description(wanted));
-}
-
 template <JSON::Kind kind>
 const auto& payloadOf(const JSON& json) {
   const auto* payload = std::get_if<static_cast<std::size_t>(kind)>(&json.payload);
-  if (!payload) failForKind(kind);
+  if (!payload) throw JSONError(kind);
   return *payload;
 }
 
@@ -58,6 +54,11 @@ const ErrorTable& errorTable(JSONErrorCase) {
   static constexpr ErrorRow rows[] = {{"DecodingTypeMismatch"}, {"InvalidType"}, {"UnexpectedOptional"}};
   static constexpr ErrorTable table{"MarletFoundation.JSONError", rows};
   return table;
+}
+
+std::string JSONError::description() const {
+  const std::string name(caseName());
+  return expectedKind ? name + "(" + std::string(MarletFoundation::description(*expectedKind)) + ")" : name;
 }
 
 JSON::JSON(const Data& data) : JSON(*JSONSerialization::read(data)) {}

@@ -49,9 +49,21 @@ enum class JSONErrorCase {
   InvalidType,
   UnexpectedOptional,
 };
-/// The string of `DecodingTypeMismatch` is the description of the kind that was wanted.
-using JSONError = CaseError<JSONErrorCase>;
 MARLET_EXPORT const ErrorTable& errorTable(JSONErrorCase);
+
+class MARLET_EXPORT JSONError final : public BasicCaseError<JSONError, JSONErrorCase, Error> {
+ public:
+  explicit JSONError(Case c) : BasicCaseError(c) {}
+  /// `DecodingTypeMismatch`, where a value of `expected` was wanted.
+  explicit JSONError(JSON::Kind expected)
+      : BasicCaseError(Case::DecodingTypeMismatch), expectedKind(expected) {}
+
+  /// There for `DecodingTypeMismatch`.
+  std::optional<JSON::Kind> expectedKind;
+
+  /// `DecodingTypeMismatch(integer)`, `InvalidType`
+  std::string description() const override;
+};
 
 /// How a type is made of a JSON value. A type of the host's own joins in by a constructor that takes the value
 /// and may throw.

@@ -10,6 +10,8 @@
 #include <utility>
 #include <vector>
 
+#include "MarletFoundation/Data/PropertyListValue.h"
+
 namespace MarletFoundation {
 
 /// Concatenation.
@@ -20,26 +22,35 @@ std::vector<T> mappend(std::vector<T> self, const std::vector<T>& other) {
 }
 
 /// Both dictionaries in one; on a shared key the value of `other` wins.
-template <class Key, class Value>
-std::map<Key, Value> mappend(std::map<Key, Value> self, const std::map<Key, Value>& other) {
+template <class Key, class Value, class Order>
+std::map<Key, Value, Order> mappend(std::map<Key, Value, Order> self,
+                                    const std::map<Key, Value, Order>& other) {
   for (const auto& [key, value] : other) self.insert_or_assign(key, value);
   return self;
 }
-template <class Key, class Value>
-std::unordered_map<Key, Value> mappend(std::unordered_map<Key, Value> self,
-                                       const std::unordered_map<Key, Value>& other) {
+template <class Key, class Value, class Hash, class Equal>
+std::unordered_map<Key, Value, Hash, Equal> mappend(
+    std::unordered_map<Key, Value, Hash, Equal> self,
+    const std::unordered_map<Key, Value, Hash, Equal>& other) {
   for (const auto& [key, value] : other) self.insert_or_assign(key, value);
   return self;
+}
+inline PropertyListDictionary mappend(const PropertyListDictionary& self,
+                                      const PropertyListDictionary& other) {
+  PropertyListDictionary::Entries entries(self.begin(), self.end());
+  entries.insert(entries.end(), other.begin(), other.end());
+  return PropertyListDictionary(std::move(entries));
 }
 
 /// Union.
-template <class T>
-std::set<T> mappend(std::set<T> self, const std::set<T>& other) {
+template <class T, class Order>
+std::set<T, Order> mappend(std::set<T, Order> self, const std::set<T, Order>& other) {
   self.insert(other.begin(), other.end());
   return self;
 }
-template <class T>
-std::unordered_set<T> mappend(std::unordered_set<T> self, const std::unordered_set<T>& other) {
+template <class T, class Hash, class Equal>
+std::unordered_set<T, Hash, Equal> mappend(std::unordered_set<T, Hash, Equal> self,
+                                           const std::unordered_set<T, Hash, Equal>& other) {
   self.insert(other.begin(), other.end());
   return self;
 }

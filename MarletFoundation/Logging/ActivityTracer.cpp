@@ -46,10 +46,14 @@ std::string lineOf(const std::string& name, const ActivityTracingEvent::Data& da
 
 }  // namespace
 
+std::shared_ptr<ActivityTracer> ActivityTracer::make() {
+  return std::shared_ptr<ActivityTracer>(new ActivityTracer());
+}
+
 const std::shared_ptr<ActivityTracer>& ActivityTracer::sharedTracer() {
   static const auto& tracer = *new auto([] {
     UserDefaults::registerDefault("EnableActivityTracing", false);
-    return std::make_shared<ActivityTracer>();
+    return make();
   }());
   return tracer;
 }

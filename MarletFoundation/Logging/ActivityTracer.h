@@ -11,12 +11,15 @@ namespace MarletFoundation {
 
 /// Records what a learner does in a document: free-form events in the file "activity.log" in the
 /// application-support directory, typed events in the telemetry service. All of it happens in order on a queue in
-/// the background, so no caller waits. Any thread.
+/// the background, so no caller waits. Always held shared: what waits on the queue drops the typed events of a tracer that is gone.
+/// Any thread.
 class MARLET_EXPORT ActivityTracer : public std::enable_shared_from_this<ActivityTracer> {
  public:
   /// The process's own. Making it registers the default of "EnableActivityTracing", which hosts read by a
   /// `UserDefaultBoolKey`; the tracer itself doesn't look at it.
   static const std::shared_ptr<ActivityTracer>& sharedTracer();
+  /// Another one, for a host that keeps events of its own apart.
+  static std::shared_ptr<ActivityTracer> make();
 
   /// Adds a line to the file: the time, the name, and the data as JSON. Without a directory for the file this is a
   /// fatal error.
@@ -31,6 +34,7 @@ class MARLET_EXPORT ActivityTracer : public std::enable_shared_from_this<Activit
                                    DispatchQuality::background};
 
  private:
+  ActivityTracer() = default;
   void startReporter();
 
   // Both are used on the queue only.

@@ -204,7 +204,7 @@ std::string quoted(std::string_view text) {
 }
 
 std::string optionalDescription(const std::optional<std::string>& text) {
-  return text ? "Optional(\"" + *text + "\")" : "nil";
+  return text ? "Optional(" + quoted(*text) + ")" : "nil";
 }
 
 }  // namespace MarletFoundation

@@ -1,6 +1,8 @@
 #pragma once
 
-#include <iterator>
+#include <concepts>
+#include <type_traits>
+#include <utility>
 
 #include "MarletFoundation/SourceEditor/CodeCompletion.h"
 
@@ -20,17 +22,27 @@ class MARLET_EXPORT SourceEditorCodeCompletionResponder {
   std::int64_t maxCompletions() const;
 
   /// An answer, which reaches the delegate when the continuation is run: it goes to the main queue, and what
-  /// the delegate returns is run there. `suggestions` is any sequence of shared pointers to suggestions.
+  /// the delegate returns is run there. `suggestions` is anything that a `for` loop walks, of suggestions, which
+  /// are copied, or of shared pointers to them; it is walked at once.
   template <class Suggestions>
-  Continuation<Unit> offerSuggestions(const Suggestions& suggestions, bool definitive = false) const {
-    return offering(std::make_shared<const SourceEditorCodeCompletionSuggestions>(std::begin(suggestions),
-                                                                                  std::end(suggestions)),
-                    definitive);
+  Continuation<Unit> offerSuggestions(Suggestions&& suggestions, bool definitive = false) const {
+    auto held = std::make_shared<SourceEditorCodeCompletionSuggestions>();
+    for (auto&& suggestion : suggestions)
+      held->push_back(shared(std::forward<decltype(suggestion)>(suggestion)));
+    return offering(std::move(held), definitive);
   }
   /// The answer that there will be none; as above.
   Continuation<Unit> completionUnavailable() const;
 
  private:
+  template <class Suggestion>
+  static std::shared_ptr<const SourceEditorCodeCompletionSuggestion> shared(Suggestion&& suggestion) {
+    using Value = std::remove_cvref_t<Suggestion>;
+    if constexpr (std::derived_from<Value, SourceEditorCodeCompletionSuggestion>)
+      return std::make_shared<const Value>(std::forward<Suggestion>(suggestion));
+    else
+      return std::forward<Suggestion>(suggestion);
+  }
   Continuation<Unit> offering(std::shared_ptr<const SourceEditorCodeCompletionSuggestions> suggestions,
                               bool definitive) const;
 

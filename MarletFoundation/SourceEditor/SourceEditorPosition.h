@@ -2,6 +2,7 @@
 
 #include <compare>
 #include <cstdint>
+#include <functional>
 #include <string>
 
 #include "MarletFoundation/Data/CaseError.h"
@@ -44,3 +45,11 @@ struct MARLET_EXPORT SourceEditorPosition {
 MARLET_EXPORT const ErrorTable& errorTable(SourceEditorPosition::PropertyListSerializationErrorCase);
 
 }  // namespace MarletFoundation
+
+/// `hashValue`
+template <>
+struct std::hash<MarletFoundation::SourceEditorPosition> {
+  std::size_t operator()(const MarletFoundation::SourceEditorPosition& position) const {
+    return position.hashValue();
+  }
+};

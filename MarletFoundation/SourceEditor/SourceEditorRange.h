@@ -1,6 +1,7 @@
 #pragma once
 
 #include "MarletFoundation/Platform/TextRange.h"
+#include "MarletFoundation/SourceEditor/OffsetRange.h"
 #include "MarletFoundation/SourceEditor/SourceEditorPosition.h"
 
 namespace MarletFoundation {
@@ -22,7 +23,10 @@ struct MARLET_EXPORT SourceEditorRange {
   SourceEditorRange() = default;
   SourceEditorRange(SourceEditorPosition startPosition, SourceEditorPosition endPosition)
       : start(startPosition), end(endPosition) {}
-  /// The columns from `lowerBound` up to `upperBound` of one line.
+  /// Columns of one line.
+  SourceEditorRange(std::int64_t lineIndex, const OffsetRange& range)
+      : SourceEditorRange(lineIndex, range.lowerBound, range.upperBound) {}
+  /// The columns from `lowerBound` up to `upperBound` of one line; bounds in the wrong order are kept.
   SourceEditorRange(std::int64_t lineIndex, std::int64_t lowerBound, std::int64_t upperBound)
       : start(lineIndex, lowerBound), end(lineIndex, upperBound) {}
   /// Reads a dictionary of "start" and "end"; throws `PropertyListSerializationError`.

@@ -2,6 +2,7 @@
 #include <rapidcheck/gtest.h>
 
 #include "MarletFoundation/Data/DataIterator.h"
+#include "MarletFoundation/Data/JSON.h"
 #include "MarletFoundation/Data/Monoid.h"
 #include "MarletFoundation/Data/NonEmptyArray.h"
 #include "MarletFoundation/Data/Result.h"
@@ -106,6 +107,7 @@ struct Longest {
 };
 
 static_assert(Monoid<Array> && Monoid<std::set<int>> && Monoid<std::map<int, int>> && Monoid<Longest>);
+static_assert(Monoid<PropertyListDictionary> && Monoid<JSON::Dictionary> && Monoid<UserInfo>);
 static_assert(!Monoid<int>);
 static_assert(Pointed<Array> && Pointed<std::set<int>> && !Pointed<Longest> && !Pointed<int>);
 
@@ -126,6 +128,12 @@ RC_GTEST_PROP(Monoid, Laws, (const Array& a, const Array& b, const Array& c)) {
     return made;
   };
   checkMonoidLaws(dictionary(a), dictionary(b), dictionary(c));
+  const auto propertyList = [&](const Array& array) {
+    PropertyListDictionary made;
+    for (const auto& [key, value] : dictionary(array)) made[std::to_string(key)] = value;
+    return made;
+  };
+  checkMonoidLaws(propertyList(a), propertyList(b), propertyList(c));
 }
 
 TEST(Monoid, CombinesInOrderAndTheOtherWins) {
@@ -133,6 +141,10 @@ TEST(Monoid, CombinesInOrderAndTheOtherWins) {
   using Dictionary = std::map<std::string, int>;
   EXPECT_EQ(mappend(Dictionary{{"a", 1}, {"b", 1}}, Dictionary{{"b", 2}, {"c", 2}}),
             (Dictionary{{"a", 1}, {"b", 2}, {"c", 2}}));
+  EXPECT_EQ(mappend(PropertyListDictionary{{"a", 1}, {"b", 1}}, PropertyListDictionary{{"b", 2}}),
+            (PropertyListDictionary{{"a", 1}, {"b", 2}}));
+  EXPECT_EQ(mappend(JSON::Dictionary{{"a", JSON(1)}}, JSON::Dictionary{{"a", JSON(2)}}),
+            (JSON::Dictionary{{"a", JSON(2)}}));
   EXPECT_EQ(mappend(std::unordered_map<int, int>{{1, 1}}, {{1, 2}}), (std::unordered_map<int, int>{{1, 2}}));
   EXPECT_EQ(mappend(Longest{"a"}, Longest{"bb"}).text, "bb");
   EXPECT_EQ(take(Array{3, 1, 2}, 2), (Array{3, 1}));

@@ -85,16 +85,19 @@ TEST(JSON, DecodesOrTellsWhatWasWanted) {
             (std::map<std::string, bool>{{"a", true}}));
   EXPECT_EQ(decode<Half>(parsed("1.5")).value, 0.75);
 
-  EXPECT_EQ(failure([] { decode<std::int64_t>(parsed("7.0")); }), "DecodingTypeMismatch(\"integer\")");
-  EXPECT_EQ(failure([] { decode<double>(parsed("7")); }), "DecodingTypeMismatch(\"double\")");
-  EXPECT_EQ(failure([] { decode<bool>(parsed("1")); }), "DecodingTypeMismatch(\"boolean\")");
-  EXPECT_EQ(failure([] { decode<std::string>(JSON()); }), "DecodingTypeMismatch(\"string\")");
-  EXPECT_EQ(failure([] { decode<std::vector<bool>>(parsed("{}")); }), "DecodingTypeMismatch(\"array\")");
-  EXPECT_EQ(failure([] { decode<std::vector<bool>>(parsed("[true, 1]")); }),
-            "DecodingTypeMismatch(\"boolean\")");
+  EXPECT_EQ(failure([] { decode<std::int64_t>(parsed("7.0")); }), "DecodingTypeMismatch(integer)");
+  EXPECT_EQ(failure([] { decode<double>(parsed("7")); }), "DecodingTypeMismatch(double)");
+  EXPECT_EQ(failure([] { decode<bool>(parsed("1")); }), "DecodingTypeMismatch(boolean)");
+  EXPECT_EQ(failure([] { decode<std::string>(JSON()); }), "DecodingTypeMismatch(string)");
+  EXPECT_EQ(failure([] { decode<std::vector<bool>>(parsed("{}")); }), "DecodingTypeMismatch(array)");
+  EXPECT_EQ(failure([] { decode<std::vector<bool>>(parsed("[true, 1]")); }), "DecodingTypeMismatch(boolean)");
   EXPECT_EQ(failure([] { decode<std::map<std::string, bool>>(parsed("[]")); }),
-            "DecodingTypeMismatch(\"dictionary\")");
+            "DecodingTypeMismatch(dictionary)");
   EXPECT_EQ(failure([] { decode<std::vector<bool>>(std::optional<JSON>()); }), "UnexpectedOptional");
+  const auto mismatch = thrown<JSONError>([] { decode<double>(JSON()); });
+  EXPECT_EQ(mismatch.expectedKind, JSON::Kind::double_);
+  EXPECT_EQ(mismatch, JSONError(JSON::Kind::double_));
+  EXPECT_FALSE(mismatch == JSONError(JSON::Kind::integer));
 }
 
 PropertyListObjectPointer anyObject(int depth) {

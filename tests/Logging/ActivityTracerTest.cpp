@@ -18,6 +18,10 @@ namespace {
 
 using Event = ActivityTracingEvent;
 
+// On the stack, a tracer would lose its typed events.
+static_assert(!std::is_default_constructible_v<ActivityTracer> &&
+              !std::is_copy_constructible_v<ActivityTracer>);
+
 class ActivityTracerTest : public testing::Test {
  protected:
   std::vector<std::string> lines(const char* name) const {
@@ -40,7 +44,7 @@ class ActivityTracerTest : public testing::Test {
       return key == "Known" ? std::optional<std::int64_t>(1) : std::nullopt;
     };
   }};
-  const std::shared_ptr<ActivityTracer> tracer_ = std::make_shared<ActivityTracer>();
+  const std::shared_ptr<ActivityTracer> tracer_ = ActivityTracer::make();
 };
 
 TEST_F(ActivityTracerTest, WritesALineForEachEvent) {

@@ -153,7 +153,7 @@ TEST(Text, decimalIntegers) {
 
 TEST(Text, printedForms) {
   EXPECT_EQ(quoted("a\"\\\n\x01\x7F\u00E9"), "\"a\\\"\\\\\\n\\u{01}\\u{7F}\u00E9\"");
-  EXPECT_EQ(optionalDescription(std::optional<std::string>("a\"\n")), "Optional(\"a\"\n\")");
+  EXPECT_EQ(optionalDescription(std::optional<std::string>("a \"b\"\n")), "Optional(\"a \\\"b\\\"\\n\")");
   EXPECT_EQ(shortestDecimal(5e8), "500000000.0");
   EXPECT_EQ(shortestDecimal(-0.1), "-0.1");
   EXPECT_EQ(std::strtod(shortestDecimal(-5e-324).c_str(), nullptr), -5e-324);

@@ -4,6 +4,7 @@
 #include <rapidcheck/gtest.h>
 
 #include <limits>
+#include <unordered_set>
 
 #include "MarletFoundation/Utils/Functional.h"
 #include "support/Failure.h"
@@ -73,10 +74,11 @@ TEST(SourceEditorPosition, overflowAndNegativeHashesAreFatal) {
   EXPECT_EQ(fatalMessage([] { Range(0, -2, largest).columnDifferenceAsRange(); }), overflow);
   EXPECT_NE(fatalMessage([] { Position(0, -1).hashValue(); }), "");
   EXPECT_EQ(Position(3, 5).hashValue(), combiningHash(3, 5));
+  EXPECT_TRUE((std::unordered_set<Position>{{3, 5}, {3, 6}, {3, 5}}).size() == 2);
 }
 
 TEST(SourceEditorRange, predicates) {
-  const Range range({1, 2}, {3, 4}), empty({1, 2}, {1, 2});
+  const Range range({1, 2}, {3, 4}), empty(1, OffsetRange(2, 2));
   EXPECT_TRUE(empty.isEmptyRange() && !range.isEmptyRange());
   EXPECT_TRUE(empty.touchesPosition({1, 2}));
   EXPECT_FALSE(empty.enclosesPosition({1, 2}));

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <atomic>
+#include <list>
 #include <thread>
 
 #include "MarletFoundation/Platform/Host.h"
@@ -84,6 +85,22 @@ TEST(Continuation, TimeoutFiresOnceAfterTheLastReset) {
   EXPECT_EQ(fired, 1);
 }
 
+struct Line final : SourceEditorCodeCompletionSuggestion {
+  std::string text;
+  explicit Line(std::string t) : text(std::move(t)) {}
+};
+
+/// A range that makes its suggestions as it is walked, and ends at a value of another type.
+struct Lines {
+  struct End {};
+  int next = 1;
+  Lines& begin() { return *this; }
+  End end() { return {}; }
+  bool operator!=(End) const { return next <= 3; }
+  Line operator*() const { return Line(std::to_string(next)); }
+  void operator++() { ++next; }
+};
+
 struct Editor final : SourceEditorCodeCompletionDelegate {
   std::string heard;
   std::int64_t maxCompletions() const override { return 7; }
@@ -91,6 +108,8 @@ struct Editor final : SourceEditorCodeCompletionDelegate {
                           bool definitive) override {
     heard +=
         token + std::to_string(suggestions.size()) + (definitive ? "!" : "?") + (isMainThread() ? "m" : "");
+    for (const auto& suggestion : suggestions)
+      if (const auto* line = dynamic_cast<const Line*>(suggestion.get())) heard += "'" + line->text + "'";
     return Work([this] { return heard += ".", Unit(); });
   }
   Work completionUnavailable(const std::string& token) override {
@@ -115,11 +134,13 @@ TEST(CodeCompletionResponder, AnswersOnTheMainThreadAndIsSilentWhenTheRequesterI
   responder.offerSuggestions(SourceEditorCodeCompletionSuggestions(9));
   std::thread([&] {
     responder.offerSuggestions(SourceEditorCodeCompletionSuggestions(2), true).run();
+    responder.offerSuggestions(Lines()).run();
+    responder.offerSuggestions(std::list{std::make_shared<Line>("lent")}).run();
     responder.completionUnavailable().run();
   }).join();
   EXPECT_EQ(editor->heard, "");
   EXPECT_TRUE(runUntil([&] { return editor->heard.ends_with('-'); }, 10));
-  EXPECT_EQ(editor->heard, "T2!m.T-");
+  EXPECT_EQ(editor->heard, "T2!m.T3?m'1''2''3'.T1?m'lent'.T-");
   editor.reset();
   EXPECT_EQ(responder.maxCompletions(), 0);
   EXPECT_TRUE(responder.completionUnavailable().run());
