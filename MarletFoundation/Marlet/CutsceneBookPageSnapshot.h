@@ -71,7 +71,7 @@ class MARLET_EXPORT CutsceneBookPageSnapshot final : public BookPageSnapshotType
 
   CutsceneBookPageSnapshot snapshot() const { return *this; }
   /// The page's whole directory, with a binary manifest. Throws the property-list writer's error, and the
-  /// file error when "Resources" can't be read.
+  /// file error when "Resources" can't be opened.
   FileWrapper fileWrapper() const override;
   std::unique_ptr<BookPageType> convertToMutablePage() const override;
 

@@ -1,10 +1,12 @@
 #include "MarletFoundation/Marlet/MarletBookPage.h"
 
+#include "MarletFoundation/Platform/FatalError.h"
+
 namespace MarletFoundation {
 
 MarletBookPage::MarletBookPage(std::string name, std::optional<std::string> pageDescription,
                                std::optional<std::string> imageReference, std::string filename,
-                               std::u16string text, const MarletResultInfoSnapshot& resultInfo,
+                               std::u16string text, std::shared_ptr<MarletResultInfo> resultInfo,
                                std::optional<URL> sourcesDirectoryURL,
                                std::optional<URL> resourcesDirectoryURL,
                                std::optional<URL> liveViewSourceFileURL, LiveViewMode liveViewMode,
@@ -15,7 +17,7 @@ MarletBookPage::MarletBookPage(std::string name, std::optional<std::string> page
       imageReference_(std::move(imageReference)),
       filename_(std::move(filename)),
       text_(std::make_unique<std::u16string>(std::move(text))),
-      resultInfo_(std::make_unique<MarletResultInfo>(resultInfo)),
+      resultInfo_(std::move(resultInfo)),
       sourcesDirectoryURL_(std::move(sourcesDirectoryURL)),
       resourcesDirectoryURL_(std::move(resourcesDirectoryURL)),
       liveViewSourceFileURL_(std::move(liveViewSourceFileURL)),
@@ -23,11 +25,14 @@ MarletBookPage::MarletBookPage(std::string name, std::optional<std::string> page
       liveViewEdgeToEdge_(liveViewEdgeToEdge),
       posterReference_(std::move(posterReference)),
       marletLoggingMode_(marletLoggingMode),
-      hints_(std::move(hints)) {}
+      hints_(std::move(hints)) {
+  if (!resultInfo_) fatalError("A page must have a record of results!");
+}
 
 MarletBookPage::MarletBookPage(const MarletBookPageSnapshot& snapshot)
     : MarletBookPage(snapshot.name(), snapshot.pageDescription(), snapshot.imageReference(),
-                     snapshot.filename(), snapshot.text(), snapshot.resultInfo(),
+                     snapshot.filename(), snapshot.text(),
+                     std::make_shared<MarletResultInfo>(snapshot.resultInfo()),
                      snapshot.sourcesDirectoryURL(), snapshot.resourcesDirectoryURL(),
                      snapshot.liveViewSourceFileURL(), snapshot.liveViewMode(), snapshot.liveViewEdgeToEdge(),
                      snapshot.posterReference(), snapshot.marletLoggingMode(), snapshot.hints()) {}

@@ -8,9 +8,10 @@ namespace MarletFoundation {
 /// doesn't open. No locks: one thread at a time.
 class MARLET_EXPORT MarletBookPage final : public BookPageType, public MutableMarletPageType {
  public:
+  /// `resultInfo` is the page's record from then on; the host may keep it, too. Null is a fatal error.
   MarletBookPage(std::string name, std::optional<std::string> pageDescription,
                  std::optional<std::string> imageReference, std::string filename, std::u16string text,
-                 const MarletResultInfoSnapshot& resultInfo, std::optional<URL> sourcesDirectoryURL,
+                 std::shared_ptr<MarletResultInfo> resultInfo, std::optional<URL> sourcesDirectoryURL,
                  std::optional<URL> resourcesDirectoryURL, std::optional<URL> liveViewSourceFileURL,
                  LiveViewMode liveViewMode, bool liveViewEdgeToEdge,
                  std::optional<std::string> posterReference, MarletLoggingMode marletLoggingMode,
@@ -55,7 +56,7 @@ class MARLET_EXPORT MarletBookPage final : public BookPageType, public MutableMa
   std::optional<std::string> imageReference_;
   std::string filename_;
   const std::unique_ptr<std::u16string> text_;
-  const std::unique_ptr<MarletResultInfo> resultInfo_;
+  const std::shared_ptr<MarletResultInfo> resultInfo_;
   std::optional<URL> sourcesDirectoryURL_;
   std::optional<URL> resourcesDirectoryURL_;
   std::optional<URL> liveViewSourceFileURL_;

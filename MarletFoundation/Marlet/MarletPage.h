@@ -8,9 +8,10 @@ namespace MarletFoundation {
 /// then holds what it answers. No locks: one thread at a time.
 class MARLET_EXPORT MarletPage : public MutableMarletPageType {
  public:
-  MarletPage(std::optional<std::string> name, std::u16string text, const MarletResultInfoSnapshot& resultInfo,
-             std::optional<URL> sourcesDirectoryURL, std::optional<URL> resourcesDirectoryURL,
-             std::vector<MarletHint> hints);
+  /// `resultInfo` is the page's record from then on; the host may keep it, too. Null is a fatal error.
+  MarletPage(std::optional<std::string> name, std::u16string text,
+             std::shared_ptr<MarletResultInfo> resultInfo, std::optional<URL> sourcesDirectoryURL,
+             std::optional<URL> resourcesDirectoryURL, std::vector<MarletHint> hints);
   explicit MarletPage(const MarletPageSnapshot& snapshot);
 
   std::string filename() const override { return MarletPageSnapshot::filenameForName(name()); }
@@ -42,7 +43,7 @@ class MARLET_EXPORT MarletPage : public MutableMarletPageType {
  private:
   std::optional<std::string> name_;
   const std::unique_ptr<std::u16string> text_;
-  const std::unique_ptr<MarletResultInfo> resultInfo_;
+  const std::shared_ptr<MarletResultInfo> resultInfo_;
   std::optional<URL> sourcesDirectoryURL_;
   std::optional<URL> resourcesDirectoryURL_;
   std::vector<MarletHint> hints_;

@@ -7,7 +7,8 @@
 namespace MarletFoundation {
 
 /// The live record of what a page's runs showed, kept while the learner types and runs code. It holds no lock;
-/// its owner confines it to one thread or queue. An overflow of a line or an offset is fatal.
+/// its owner confines it to one thread or queue. An overflow of a line or an offset is fatal. A host's subclass may
+/// follow what happens to it.
 class MARLET_EXPORT MarletResultInfo : public MarletResultInfoType {
  public:
   MarletResultInfo() = default;
@@ -24,22 +25,22 @@ class MARLET_EXPORT MarletResultInfo : public MarletResultInfoType {
   MarletResultInfoSnapshot snapshot() const override { return {assessmentInformation_, inlineResults_}; }
 
   /// To be called as a run starts: drops the results that the previous run didn't report again.
-  void executionDidBegin();
+  virtual void executionDidBegin();
   /// To be called as a run reports a result: a new one is hidden, a known one gets the new offset.
-  void trackInlineResultDataAt(std::int64_t line, std::int64_t characterOffset);
+  virtual void trackInlineResultDataAt(std::int64_t line, std::int64_t characterOffset);
 
   /// To be called after `text` (UTF-8) was inserted at `position`, which is `charOffset` characters from the
   /// text's start. Ends the tracking of a run.
-  void updateForTextInsertion(std::string_view text, const SourceEditorPosition& position,
-                              std::int64_t charOffset);
+  virtual void updateForTextInsertion(std::string_view text, const SourceEditorPosition& position,
+                                      std::int64_t charOffset);
   /// To be called after `text` (UTF-8) was deleted from `range`, which began `charRange.location` characters
   /// from the text's start. Results on the lines of the range but its last go; those on its last line keep
   /// their line. Ends the tracking of a run.
-  void updateForTextDeletion(std::string_view text, const SourceEditorRange& range,
-                             const TextRange& charRange);
+  virtual void updateForTextDeletion(std::string_view text, const SourceEditorRange& range,
+                                     const TextRange& charRange);
 
   /// Takes over the information and answers true, if it differs from the present one.
-  bool updateAssessmentInformation(const std::optional<AssessmentInformation>& information);
+  virtual bool updateAssessmentInformation(const std::optional<AssessmentInformation>& information);
 
  private:
   std::optional<AssessmentInformation> assessmentInformation_;

@@ -4,11 +4,13 @@
 #include "MarletFoundation/Marlet/CutsceneBookPage.h"
 #include "MarletFoundation/Marlet/MarletBook.h"
 #include "MarletFoundation/Marlet/MarletBookPage.h"
+#include "MarletFoundation/Marlet/MarletPage.h"
 #include "MarletFoundation/Platform/HostEnvironment.h"
 #include "MarletFoundation/Platform/Text.h"
 #include "support/ChangedHost.h"
 #include "support/Documents.h"
 #include "support/Failure.h"
+#include "support/Fatal.h"
 #include "support/Tree.h"
 
 namespace MarletFoundation::test {
@@ -117,6 +119,39 @@ TEST(LivePage, EditsDontShowInASnapshotAlreadyTaken) {
   EXPECT_FALSE(live.passed());
   live.resultInfo().updateAssessmentInformation(AssessmentInformation(AssessmentStatus::Fail{}, true));
   EXPECT_TRUE(live.passed());
+}
+
+TEST(LivePage, KeepsTheRecordOfItsHost) {
+  struct Counting : MarletResultInfo {
+    int runs = 0;
+    void executionDidBegin() override {
+      ++runs;
+      MarletResultInfo::executionDidBegin();
+    }
+  };
+  const auto record = std::make_shared<Counting>();
+  const auto bookPage = [](std::shared_ptr<MarletResultInfo> r) {
+    return std::make_unique<MarletBookPage>("N", std::nullopt, std::nullopt, "N.marletpage", u"",
+                                            std::move(r), std::nullopt, std::nullopt, std::nullopt,
+                                            LiveViewMode::HiddenByDefault, true, std::nullopt,
+                                            MarletLoggingMode::Normal, std::vector<MarletHint>());
+  };
+  const auto classicPage = [](std::shared_ptr<MarletResultInfo> r) {
+    return std::make_unique<MarletPage>("N", u"", std::move(r), std::nullopt, std::nullopt,
+                                        std::vector<MarletHint>());
+  };
+  const auto check = [&](const MutableMarletPageType& page, const auto& snapshotOf) {
+    page.resultInfo().executionDidBegin();
+    record->trackInlineResultDataAt(record->runs, 0);
+    EXPECT_EQ(snapshotOf().resultInfo().inlineResults(), record->inlineResults());
+  };
+  const auto first = bookPage(record);
+  const auto second = classicPage(record);
+  check(*first, [&] { return first->snapshot(); });
+  check(*second, [&] { return second->snapshot(); });
+  EXPECT_EQ(record->runs, 2);
+  EXPECT_EQ(fatalMessage([&] { bookPage(nullptr); }), "A page must have a record of results!");
+  EXPECT_EQ(fatalMessage([&] { classicPage(nullptr); }), "A page must have a record of results!");
 }
 
 TEST(LiveBook, SnapshotOfALiveBookIsTheBook) {
