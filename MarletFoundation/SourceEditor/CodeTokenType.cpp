@@ -1,5 +1,7 @@
 #include "MarletFoundation/SourceEditor/CodeTokenType.h"
 
+#include "MarletFoundation/Platform/SharedRelease.h"
+
 namespace MarletFoundation {
 
 CodeTokenType CodeTokenType::placeholder(const CodeTokenType& held) {
@@ -8,10 +10,7 @@ CodeTokenType CodeTokenType::placeholder(const CodeTokenType& held) {
   return type;
 }
 
-CodeTokenType::~CodeTokenType() {
-  // A long chain that nothing else holds goes link by link, not in a recursion.
-  while (held_ && held_.use_count() == 1) held_ = std::shared_ptr(std::move(held_->held_));
-}
+CodeTokenType::~CodeTokenType() { releaseWithoutStack(std::move(held_)); }
 
 std::string_view CodeTokenType::description() const {
   static constexpr std::string_view descriptions[] = {

@@ -7,6 +7,8 @@
 #include <utility>
 #include <vector>
 
+#include "MarletFoundation/Platform/SharedRelease.h"
+
 namespace MarletFoundation {
 
 /// What to do with one entry while a stack is searched for runs to fold.
@@ -23,6 +25,13 @@ struct StackEntry {
   std::shared_ptr<StackEntry> previousEntry;
   StackEntry* nextEntry = nullptr;
   Element object;
+
+  StackEntry(std::shared_ptr<StackEntry> previous, StackEntry* next, Element element)
+      : previousEntry(std::move(previous)), nextEntry(next), object(std::move(element)) {}
+  StackEntry(const StackEntry&) = delete;
+  StackEntry& operator=(const StackEntry&) = delete;
+  /// Entry by entry: a long history is deeper than the stack of the thread.
+  ~StackEntry() { releaseWithoutStack(std::move(previousEntry)); }
 };
 
 /// Walks a run of entries, from its oldest to its newest or, backwards, the other way. Holds until the stack
@@ -108,7 +117,7 @@ class CollapsibleStack {
   ~CollapsibleStack() { clear(); }
 
   void push(Element element) {
-    auto entry = std::make_shared<Entry>(Entry{top_, nullptr, std::move(element)});
+    auto entry = std::make_shared<Entry>(top_, nullptr, std::move(element));
     if (top_) top_->nextEntry = entry.get();
     if (!bottom_) bottom_ = entry.get();
     top_ = std::move(entry);
@@ -137,9 +146,7 @@ class CollapsibleStack {
     bottom_ = nullptr;
     lastCollapsed_ = nullptr;
     userEntries_ = 0;
-    // Entry by entry: a long history is deeper than the stack of the thread.
-    auto entry = std::move(top_);
-    while (entry && entry.use_count() == 1) entry = std::shared_ptr(std::move(entry->previousEntry));
+    top_.reset();
   }
 
   Iterator makeIterator() const { return {bottom_, top_.get(), true}; }
@@ -240,7 +247,7 @@ void CollapsibleStack<Element>::replace(const StackSlice<Element>& slice,
   auto& owner = ownerOf(*run.top_);
   userEntries_ -= run.userEntries_;
   if (replacement) {
-    owner = std::make_shared<Entry>(Entry{older, newer, *std::move(replacement)});
+    owner = std::make_shared<Entry>(older, newer, *std::move(replacement));
     ++userEntries_;
     if (older) older->nextEntry = owner.get();
     if (!older) bottom_ = owner.get();

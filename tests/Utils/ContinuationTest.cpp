@@ -8,6 +8,7 @@
 
 #include "MarletFoundation/Platform/Host.h"
 #include "MarletFoundation/SourceEditor/CodeCompletionResponder.h"
+#include "MarletFoundation/SourceEditor/CodeTokenType.h"
 #include "MarletFoundation/Utils/ClosureActionTarget.h"
 #include "MarletFoundation/Utils/ContinuationScheduler.h"
 #include "MarletFoundation/Utils/TimeoutContinuation.h"
@@ -32,10 +33,46 @@ TEST(Continuation, ChainsAndStopsAtTheFirstFailure) {
   EXPECT_EQ(sequence<int>({step('p'), step('q')}).run(), (std::vector<int>{'p', 'q'}));
   EXPECT_EQ(sequence<int>({}).run(), std::vector<int>());
   EXPECT_TRUE(sequence_<int>({}).run());
-  auto chain = Continuation<int>([] { return 0; });
-  for (int i = 0; i < 5000; ++i)
-    chain = chain.flatMap([](int value) { return Continuation<int>([=] { return value + 1; }); });
-  EXPECT_EQ(chain.run(), 5000);
+}
+
+TEST(Continuation, LongChainsOfAnyKindTakeNoStack) {
+  constexpr int length = 200000;
+  int ran = 0;
+  const auto count = [&ran] { return ++ran, Unit(); };
+  auto behind = Continuation<int>([] { return 0; });
+  auto within = Work(count), listed = Work(count),
+       failing = Work::fail().flatMap([](Unit) { return Work::nothing(); });
+  for (int i = 0; i < length; ++i) {
+    behind = behind.flatMap([](int value) { return Continuation<int>([=] { return value + 1; }); });
+    within = Work(count).flatMap([within](Unit) { return within; });
+    listed = sequence_<Unit>({listed, Work(count)});
+    failing = failing.flatMap([](Unit) { return Work::nothing(); });
+  }
+  EXPECT_EQ(behind.run(), length);
+  EXPECT_EQ(behind.run(), length) << "each run runs the work anew";
+  EXPECT_TRUE(within.run());
+  EXPECT_TRUE(listed.run());
+  EXPECT_EQ(ran, 2 * (length + 1));
+  EXPECT_FALSE(failing.run());
+}
+
+/// Of two threads that drop their copies at once, the last frees what both have read.
+TEST(Continuation, CopiesAreDroppedOnSeveralThreads) {
+  for (int round = 0; round < 200; ++round) {
+    auto type = CodeTokenType::placeholder(CodeTokenType::Kind::Keyword);
+    auto work = Continuation<int>([] { return 0; });
+    for (int i = 0; i < 20; ++i) {
+      type = CodeTokenType::placeholder(type);
+      work = work.flatMap([](int value) { return Continuation<int>([=] { return value + 1; }); });
+    }
+    const auto use = [](const auto& ofType, const auto& ofWork) {
+      EXPECT_TRUE(ofType.held()->held());
+      EXPECT_EQ(ofWork.run(), 20);
+    };
+    std::thread other([use, type, work] { use(type, work); });
+    use(std::exchange(type, CodeTokenType::Kind::Keyword), std::exchange(work, Continuation<int>::fail()));
+    other.join();
+  }
 }
 
 TEST(Continuation, SubmissionRunsAFunctionAndWhatItYields) {
