@@ -32,14 +32,20 @@ std::string expanded(std::string_view words, const ErrorPayload& payload) {
 }  // namespace
 
 std::string errorDescription(const ErrorRow& row, const ErrorPayload& payload) {
-  const std::string name(row.name);
-  if (payload.filename && payload.error) {
-    return name + "(filename: " + quoted(*payload.filename) + ", error: " + payload.error->description() +
-           ")";
+  std::string text(row.name);
+  // A failure far down in a tree is wrapped as often, so each one that wraps another is gone through in a loop.
+  const auto* current = &payload;
+  std::size_t open = 0;
+  while (current->error && (current->filename || !current->string)) {
+    ++open;
+    text += current->filename ? "(filename: " + quoted(*current->filename) + ", error: " : "(";
+    const auto& wrapped = *current->error;
+    current = dynamic_cast<const ErrorPayload*>(&wrapped);
+    if (!current || !current->error) return text + wrapped.description() + std::string(open, ')');
+    text += wrapped.caseName();
   }
-  if (payload.string) return name + "(" + quoted(*payload.string) + ")";
-  if (payload.error) return name + "(" + payload.error->description() + ")";
-  return name;
+  if (current->string) text += "(" + quoted(*current->string) + ")";
+  return text + std::string(open, ')');
 }
 
 UserVisibleErrorContents errorContents(const ErrorTable& table, const ErrorRow& row,

@@ -1,5 +1,9 @@
 #include "MarletFoundation/SourceEditor/Issue.h"
 
+#include <span>
+#include <tuple>
+#include <utility>
+
 namespace MarletFoundation {
 namespace {
 
@@ -48,30 +52,24 @@ PropertyListValue propertyListValue(const Issue::Location& location) {
                                 {"length", location.length}};
 }
 
-/// The elements of an optional array, each read as an `Element`.
-template <class Element>
-std::vector<Element> readAll(const PropertyListDictionary& dictionary, std::string_view key,
-                             Failure::Case invalid) {
-  std::vector<Element> elements;
+/// The elements of an optional array.
+std::span<const PropertyListValue> elementsAt(const PropertyListDictionary& dictionary,
+                                              std::string_view key) {
   const auto* value = dictionary.find(key);
   const auto* array = value ? value->array() : nullptr;
-  if (!array) return elements;
-  elements.reserve(array->size());
-  for (const auto& element : *array) {
-    try {
-      elements.emplace_back(element);
-    } catch (const typename Element::PropertyListSerializationError& error) {
-      throw Failure(invalid, error);
-    }
-  }
-  return elements;
+  return array ? std::span(*array) : std::span<const PropertyListValue>();
 }
 
-template <class Element>
-PropertyListValue written(const std::vector<Element>& elements) {
-  PropertyListValue::Array array;
-  for (const auto& element : elements) array.push_back(element.propertyListValue());
-  return array;
+void readFixIts(const PropertyListDictionary& dictionary, Issue& issue) {
+  const auto elements = elementsAt(dictionary, "fixIts");
+  issue.fixIts.reserve(elements.size());
+  for (const auto& element : elements) {
+    try {
+      issue.fixIts.emplace_back(element);
+    } catch (const FixItFailure& error) {
+      throw Failure(Failure::Case::InvalidFixIt, error);
+    }
+  }
 }
 
 const PropertyListDictionary& root(const PropertyListValue& value) {
@@ -86,6 +84,95 @@ Issue::Severity readSeverity(const PropertyListDictionary& dictionary) {
   const auto severity = severityFromRawValue(*rawValue);
   if (!severity) throw Failure(*rawValue);
   return *severity;
+}
+
+/// What of an issue stands in front of its children.
+void readHead(const PropertyListDictionary& dictionary, Issue& issue) {
+  using Case = Failure::Case;
+  if (const auto* name = stringAt(dictionary, "identifier")) issue.identifier = *name;
+  issue.severity = readSeverity(dictionary);
+  const auto* text = stringAt(dictionary, "message");
+  if (!text) throw Failure(Case::MissingMessage);
+  issue.message = *text;
+  if (const auto* place = dictionaryAt(dictionary, "location"))
+    issue.location =
+        readLocation<Failure>(*place, {Case::LocationMissingFile, Case::LocationMissingLine,
+                                       Case::LocationMissingColumn, Case::LocationMissingLength});
+}
+
+/// Reads an issue and all below it. Those whose children are being read stand in a list, the innermost last.
+class Reader {
+ public:
+  void read(const PropertyListValue& value, Issue& issue) {
+    try {
+      enter(value, issue);
+      while (!open_.empty()) {
+        const auto [dictionary, children, parent] = open_.back();
+        const auto next = parent->childIssues.size();
+        if (next < children.size()) {
+          enter(children[next], parent->childIssues.emplace_back(Issue::Severity::Note, std::nullopt, ""));
+        } else {
+          open_.pop_back();
+          readFixIts(*dictionary, *parent);
+        }
+      }
+    } catch (const Failure& failure) {
+      auto wrapped = failure;
+      for (auto level = open_.size(); level > 0; --level)
+        wrapped = Failure(Failure::Case::InvalidChildIssue, wrapped);
+      throw wrapped;
+    }
+  }
+
+ private:
+  struct Open {
+    const PropertyListDictionary* dictionary;
+    std::span<const PropertyListValue> children;
+    Issue* issue;
+  };
+
+  void enter(const PropertyListValue& value, Issue& issue) {
+    const auto& dictionary = root(value);
+    readHead(dictionary, issue);
+    const auto children = elementsAt(dictionary, "children");
+    // With room for all, children stay where they are while those behind them are read.
+    issue.childIssues.reserve(children.size());
+    open_.push_back({&dictionary, children, &issue});
+  }
+
+  std::vector<Open> open_;
+};
+
+/// The form of an issue, with places for its children that are still to be filled.
+PropertyListDictionary writtenWithoutChildren(const Issue& issue) {
+  PropertyListValue::Array fixIts;
+  for (const auto& fixIt : issue.fixIts) fixIts.push_back(fixIt.propertyListValue());
+  PropertyListDictionary dictionary{{"severity", static_cast<std::int64_t>(issue.severity)},
+                                    {"message", issue.message},
+                                    {"children", PropertyListValue::Array(issue.childIssues.size())},
+                                    {"fixIts", std::move(fixIts)}};
+  if (issue.identifier) dictionary["identifier"] = *issue.identifier;
+  if (issue.location) dictionary["location"] = propertyListValue(*issue.location);
+  return dictionary;
+}
+
+/// Walks an issue and all below it together with another tree of the same shape. `visit` is given one of each, says
+/// where the children of the second stand, and answers whether to go on.
+template <class Other, class Visit>
+bool walkTogether(const Issue& issue, Other& other, Visit visit) {
+  std::vector<std::pair<const Issue*, Other*>> open{{&issue, &other}};
+  while (!open.empty()) {
+    const auto [one, two] = open.back();
+    open.pop_back();
+    Other* children = nullptr;
+    if (!visit(*one, *two, children)) return false;
+    for (const auto& child : one->childIssues) open.emplace_back(&child, children++);
+  }
+  return true;
+}
+
+auto fieldsOf(const Issue& issue) {
+  return std::tie(issue.severity, issue.identifier, issue.location, issue.message, issue.fixIts);
 }
 
 }  // namespace
@@ -147,29 +234,50 @@ PropertyListValue Issue::FixIt::propertyListValue() const {
                                 {"replacementText", replacementText}};
 }
 
-Issue::Issue(const PropertyListValue& value) {
-  using Case = Failure::Case;
-  const auto& dictionary = root(value);
-  if (const auto* name = stringAt(dictionary, "identifier")) identifier = *name;
-  severity = readSeverity(dictionary);
-  const auto* text = stringAt(dictionary, "message");
-  if (!text) throw Failure(Case::MissingMessage);
-  message = *text;
-  if (const auto* place = dictionaryAt(dictionary, "location"))
-    location = readLocation<Failure>(*place, {Case::LocationMissingFile, Case::LocationMissingLine,
-                                              Case::LocationMissingColumn, Case::LocationMissingLength});
-  childIssues = readAll<Issue>(dictionary, "children", Case::InvalidChildIssue);
-  fixIts = readAll<FixIt>(dictionary, "fixIts", Case::InvalidFixIt);
+Issue::Issue(const PropertyListValue& value) : severity(Severity::Note) { Reader().read(value, *this); }
+
+Issue::Issue(const Issue& other) : severity(other.severity) {
+  walkTogether(other, *this, [](const Issue& from, Issue& to, Issue*& children) {
+    std::tie(to.severity, to.identifier, to.location, to.message, to.fixIts) = fieldsOf(from);
+    to.childIssues.reserve(from.childIssues.size());
+    while (to.childIssues.size() < from.childIssues.size())
+      to.childIssues.emplace_back(Severity::Note, std::nullopt, "");
+    children = to.childIssues.data();
+    return true;
+  });
+}
+
+/// A destructor has no memory to ask for: the last of each list that was entered holds the list around it.
+Issue::~Issue() {
+  std::vector<Issue> list = std::move(childIssues), around;
+  while (true) {
+    while (!list.empty()) {
+      auto below = std::exchange(list.back().childIssues, std::move(around));
+      around = std::exchange(list, std::move(below));
+    }
+    if (around.empty()) return;
+    auto next = std::exchange(around.back().childIssues, {});
+    around.pop_back();
+    list = std::exchange(around, std::move(next));
+  }
+}
+
+bool Issue::operator==(const Issue& other) const {
+  return walkTogether(*this, other, [](const Issue& a, const Issue& b, const Issue*& children) {
+    children = b.childIssues.data();
+    return a.childIssues.size() == b.childIssues.size() && fieldsOf(a) == fieldsOf(b);
+  });
 }
 
 PropertyListValue Issue::propertyListValue() const {
-  PropertyListDictionary dictionary{{"severity", static_cast<std::int64_t>(severity)},
-                                    {"message", message},
-                                    {"children", written(childIssues)},
-                                    {"fixIts", written(fixIts)}};
-  if (identifier) dictionary["identifier"] = *identifier;
-  if (location) dictionary["location"] = MarletFoundation::propertyListValue(*location);
-  return dictionary;
+  PropertyListValue value;
+  walkTogether(*this, value, [](const Issue& issue, PropertyListValue& place, PropertyListValue*& children) {
+    place = writtenWithoutChildren(issue);
+    auto& dictionary = std::get<PropertyListDictionary>(place.payload);
+    children = std::get<PropertyListValue::Array>(dictionary.find("children")->payload).data();
+    return true;
+  });
+  return value;
 }
 
 std::string Issue::description() const {

@@ -6,11 +6,12 @@
 
 #include "MarletFoundation/Data/CaseError.h"
 #include "MarletFoundation/Data/PropertyListValue.h"
+#include "MarletFoundation/Platform/SharedRelease.h"
 
 namespace MarletFoundation {
 
 /// A diagnostic of a language service: what is wrong, where, how it may be repaired, and the issues that
-/// explain it.
+/// explain it. Reading, writing, copying, comparing and destroying need no stack, however deep issues lie in issues.
 struct MARLET_EXPORT Issue {
   /// Ordered by raw value.
   enum class Severity { Note = 0, Warning = 1, Error = 2 };
@@ -85,11 +86,16 @@ struct MARLET_EXPORT Issue {
         fixIts(std::move(repairs)) {}
   /// Throws `PropertyListSerializationError`. An optional value of the wrong kind counts as absent.
   explicit Issue(const PropertyListValue& value);
+  Issue(const Issue& other);
+  Issue(Issue&& other) noexcept = default;
+  Issue& operator=(const Issue& other) { return *this = Issue(other); }
+  Issue& operator=(Issue&& other) noexcept = default;
+  ~Issue();
   PropertyListValue propertyListValue() const;
 
   /// "<Issue:Warning:unused variable>"
   std::string description() const;
-  bool operator==(const Issue&) const = default;
+  bool operator==(const Issue& other) const;
 };
 
 /// Nothing for a raw value that no severity has.
@@ -107,6 +113,10 @@ class MARLET_EXPORT Issue::PropertyListSerializationError final
   using BasicCaseError::BasicCaseError;
   explicit PropertyListSerializationError(std::int64_t foundSeverity)
       : BasicCaseError(Case::InvalidSeverity), severity(foundSeverity) {}
+  PropertyListSerializationError(const PropertyListSerializationError&) = default;
+  PropertyListSerializationError& operator=(const PropertyListSerializationError&) = default;
+  /// A failure is wrapped as often as its issue lies deep.
+  ~PropertyListSerializationError() override { releaseWithoutStack(std::move(error)); }
 
   /// The number that `InvalidSeverity` found.
   std::optional<std::int64_t> severity;

@@ -108,6 +108,36 @@ TEST(Issue, ReadsWhatItWrote) {
             "<Issue:Warning:unused variable>");
 }
 
+TEST(Issue, NeedsNoStackHoweverDeepItLies) {
+  constexpr int levels = 200000;
+  Issue deep(Issue::Severity::Note, std::nullopt, "innermost");
+  for (int level = 0; level < levels; ++level) {
+    Issue around(Issue::Severity::Error, std::nullopt, "", {FixIt({"a", level, 1, 1}, "")});
+    around.childIssues.emplace_back(Issue::Severity::Note, std::nullopt, "older");
+    around.childIssues.push_back(std::move(deep));
+    deep = std::move(around);
+  }
+  const auto copy = deep;
+  EXPECT_TRUE(copy == deep);
+  EXPECT_TRUE(Issue(deep.propertyListValue()) == deep);
+  auto* innermost = &deep;
+  while (!innermost->childIssues.empty()) innermost = &innermost->childIssues.back();
+  innermost->message = "another";
+  EXPECT_FALSE(copy == deep);
+
+  auto bad = without(goodIssue, "message");
+  for (int level = 0; level < levels; ++level) {
+    auto around = goodIssue;
+    PropertyListValue::Array children(1);
+    children[0] = std::move(bad);
+    around["children"] = std::move(children);
+    bad = std::move(around);
+  }
+  const auto [description, code] = outcome<Issue>(std::move(bad));
+  EXPECT_EQ(code, 8);
+  EXPECT_TRUE(description.ends_with("InvalidChildIssue(MissingMessage" + std::string(levels, ')')));
+}
+
 TEST(FixIt, LaterLinesComeBeforeButEarlierColumns) {
   const auto at = [](std::int64_t line, std::int64_t column) { return FixIt({"a", line, column, 1}, ""); };
   EXPECT_TRUE(at(9, 5).isBefore(at(3, 1)));
