@@ -6,6 +6,7 @@
 #include "MarletFoundation/Marlet/LegacyTimelineXMLParser.h"
 #include "MarletFoundation/Platform/Date.h"
 #include "MarletFoundation/Platform/Text.h"
+#include "MarletFoundation/Utils/CheckedArithmetic.h"
 #include "MarletFoundation/Utils/Overloaded.h"
 
 namespace MarletFoundation {
@@ -98,6 +99,7 @@ InlineResults inlineResultsFromLegacyTimeline(const Data& data) {
   for (const auto& item : LegacyTimelineXMLParser(data).parsedResults()) {
     if (!item.documentLocation) continue;
     const auto& [line, characterLocation] = *item.documentLocation;
+    if (!leavesRoomForSums(line) || !leavesRoomForSums(characterLocation)) continue;
     results.insert_or_assign(line, Result(line, characterLocation, visibleState(item)));
   }
   return results;

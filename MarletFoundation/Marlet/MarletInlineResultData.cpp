@@ -2,6 +2,7 @@
 
 #include "MarletFoundation/Marlet/LoadChecks.h"
 #include "MarletFoundation/Platform/Text.h"
+#include "MarletFoundation/Utils/CheckedArithmetic.h"
 #include "MarletFoundation/Utils/Overloaded.h"
 
 namespace MarletFoundation {
@@ -83,7 +84,8 @@ const ErrorTable& errorTable(Case) {
 MarletInlineResultData::MarletInlineResultData(const PropertyListValue& value) : visibleState(Hidden{}) {
   require<E>(value.dictionary(), Case::rootNotADictionary);
   const auto* lineValue = value.dictionary()->find("Line");
-  require<E>(lineValue && lineValue->integer(), Case::missingLineNumber);
+  require<E>(lineValue && lineValue->integer() && leavesRoomForSums(*lineValue->integer()),
+             Case::missingLineNumber);
   line = *lineValue->integer();
   visibleState = state(value.dictionary()->find("VisibleState"));
 }

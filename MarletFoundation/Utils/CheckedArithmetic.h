@@ -19,4 +19,11 @@ inline std::int64_t checkedDifference(std::int64_t a, std::int64_t b) {
   return difference;
 }
 
+/// Whether a line or an offset that a document holds leaves room for sums with what texts have of them. Beyond, it is
+/// damage: no text reaches so far.
+constexpr bool leavesRoomForSums(std::int64_t number) {
+  constexpr std::int64_t most = std::int64_t{1} << 62;
+  return -most <= number && number <= most;
+}
+
 }  // namespace MarletFoundation

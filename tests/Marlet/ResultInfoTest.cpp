@@ -114,6 +114,9 @@ TEST(ResultInfo, badInlineResultsAreGivenUpTogether) {
   const std::pair<PropertyListValue, std::string> cases[] = {
       {"x", "rootNotADictionary"},
       {D{{"Line", 2.0}}, "missingLineNumber"},
+      // No text reaches so far, and the learner's next line feed would end the process.
+      {D{{"Line", std::numeric_limits<std::int64_t>::max()}}, "missingLineNumber"},
+      {D{{"Line", std::numeric_limits<std::int64_t>::min()}}, "missingLineNumber"},
       {visible(D{}), "missingDisplayModeForVisibleState"},
       {visible(D{{"Mode", "latest"}}), R"(unknownDisplayMode("latest"))"},
       {visible(D{{"Mode", "List"}}), "missingTypeForVisibleState"},
@@ -223,10 +226,15 @@ TEST(LegacyTimeline, readsWhatItCan) {
 
 TEST(LegacyTimeline, anItemWithoutASizeIsHidden) {
   const auto read = [](const std::string& attributes) {
-    return Snapshot(Data("<T><LoggerValueHistoryTimelineItem documentLocation='CharacterRangeLoc=1&amp;"
-                         "StartingLineNumber=2' " +
-                         attributes + "/><LoggerValueHistoryTimelineItem lockedSize='1,2'/></T>"),
-                    LegacyInlineResultsTimeline)
+    return Snapshot(
+               Data("<T><LoggerValueHistoryTimelineItem documentLocation='CharacterRangeLoc=1&amp;"
+                    "StartingLineNumber=9223372036854775807'/>"
+                    "<LoggerValueHistoryTimelineItem documentLocation='CharacterRangeLoc=9223372036854775807"
+                    "&amp;StartingLineNumber=3'/>"
+                    "<LoggerValueHistoryTimelineItem documentLocation='CharacterRangeLoc=1&amp;"
+                    "StartingLineNumber=2' " +
+                    attributes + "/><LoggerValueHistoryTimelineItem lockedSize='1,2'/></T>"),
+               LegacyInlineResultsTimeline)
         .inlineResults();
   };
   EXPECT_EQ(read("shouldTrackSuperviewWidth='YES'"), results({{2, 1, hidden}}));
