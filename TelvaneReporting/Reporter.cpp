@@ -1,14 +1,15 @@
 #include "TelvaneReporting/Reporter.h"
 
-#include <fcntl.h>
 #include <sys/file.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <chrono>
 #include <filesystem>
+#include <thread>
 
 #include "MarletFoundation/Data/PropertyListSerializable.h"
-#include "MarletFoundation/Platform/Descriptor.h"
+#include "MarletFoundation/Platform/AppendedFile.h"
 #include "MarletFoundation/Platform/FileManager.h"
 #include "MarletFoundation/Platform/Host.h"
 #include "MarletFoundation/Platform/HostEnvironment.h"
@@ -31,16 +32,17 @@ URL directory() {
 
 std::string spoolPath() { return directory().appendingPathComponent("Messages.jsonl").path(); }
 
-Descriptor opened(const std::string& path, int flags) {
-  Descriptor file(retrying([&] { return ::open(path.c_str(), flags | O_CREAT | O_CLOEXEC, 0600); }));
-  if (!file) throw ErrorObject::posix(errno, path);
-  return file;
-}
-
-/// A file that only one writer at a time has open, for as long as it is.
+/// A file that only one writer at a time has open, for as long as it is. Writers need it for one line, so one that
+/// has it for a tenth of a second hangs, and isn't waited for.
 Descriptor lockedDirectory() {
-  auto lock = opened(directory().appendingPathComponent("Lock").path(), O_RDWR);
-  if (retrying([&] { return ::flock(lock.get(), LOCK_EX); }) != 0) throw ErrorObject::posix(errno, "Lock");
+  constexpr int attempts = 50;
+  const auto path = directory().appendingPathComponent("Lock").path();
+  auto lock = openToAppend(path);
+  for (int attempt = 1; ::flock(lock.get(), LOCK_EX | LOCK_NB) != 0; ++attempt) {
+    if ((errno != EWOULDBLOCK && errno != EINTR) || attempt == attempts)
+      throw ErrorObject::posix(errno, path);
+    std::this_thread::sleep_for(std::chrono::milliseconds(2));
+  }
   return lock;
 }
 
@@ -57,14 +59,14 @@ PropertyListObjectPointer objectOf(const Info& info) {
 void appendLine(const std::string& line) {
   const auto lock = lockedDirectory();
   const auto path = spoolPath();
-  auto file = opened(path, O_WRONLY | O_APPEND);
+  auto file = openToAppend(path);
   struct stat status;
   if (::fstat(file.get(), &status) != 0) throw ErrorObject::posix(errno, path);
   const auto size = static_cast<std::size_t>(status.st_size);
   if (size > 0 && size + line.size() > Reporter::SpoolLimit) {
     const auto former = directory().appendingPathComponent("Messages.old.jsonl").path();
     if (::rename(path.c_str(), former.c_str()) != 0) throw ErrorObject::posix(errno, former);
-    file = opened(path, O_WRONLY | O_APPEND);
+    file = openToAppend(path);
     status.st_size = 0;
   }
   if (writeAll(file.get(), line) == 0) return;
@@ -133,7 +135,7 @@ void Reporter::flushMessages(const std::function<void(const std::optional<ErrorO
   std::optional<ErrorObject> failure;
   try {
     const auto path = spoolPath();
-    if (::fsync(opened(path, O_WRONLY).get()) != 0) failure = ErrorObject::posix(errno, path);
+    if (::fsync(openToAppend(path).get()) != 0) failure = ErrorObject::posix(errno, path);
   } catch (const ErrorObject& error) {
     failure = error;
   }

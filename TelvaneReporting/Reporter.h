@@ -24,7 +24,8 @@ inline constexpr const char* SessionIdentifierKey = "sessionIdentifier";
 using Info = std::map<std::string, std::string>;
 using Strings = std::vector<std::string>;
 
-/// A session. One thread at a time; several processes may spool to one file.
+/// A session. One thread at a time; several processes may spool to one file. It is never waited for another process that
+/// holds the spool's lock for long, nor for what isn't a file in the spool's place: messages fail then.
 class Reporter {
  public:
   /// In bytes. A spool that would grow beyond it becomes "Messages.old.jsonl", in the place of any former one.

@@ -1,13 +1,12 @@
 #include "MarletFoundation/Logging/ActivityTracer.h"
 
-#include <fcntl.h>
-
+#include <atomic>
 #include <ctime>
 #include <filesystem>
 
 #include "MarletFoundation/Logging/SystemLog.h"
 #include "MarletFoundation/Logging/UserDefaultBoolKey.h"
-#include "MarletFoundation/Platform/Descriptor.h"
+#include "MarletFoundation/Platform/AppendedFile.h"
 #include "MarletFoundation/Platform/FatalError.h"
 #include "MarletFoundation/Platform/HostEnvironment.h"
 #include "MarletFoundation/Platform/JSONSerialization.h"
@@ -15,15 +14,26 @@
 namespace MarletFoundation {
 namespace {
 
-/// The file at its end, made when it isn't there; none when it can't be opened, or is a pipe that nobody reads.
+/// The file at its end, made when it isn't there, with its directory. Throws what stands against it.
 Descriptor openLog() {
   const auto& directory = HostEnvironment::current().applicationSupportDirectory;
+  if (!directory) fatalError("There is no application-support directory for the activity log.");
   std::error_code failure;
-  if (directory) std::filesystem::create_directories(directory->path(), failure);
-  if (!directory || failure) fatalError("There is no application-support directory for the activity log.");
-  const auto path = directory->appendingPathComponent("activity.log").path();
-  return Descriptor(retrying(
-      [&] { return ::open(path.c_str(), O_WRONLY | O_CREAT | O_APPEND | O_NONBLOCK | O_CLOEXEC, 0600); }));
+  std::filesystem::create_directories(directory->path(), failure);
+  if (failure) throwPosix(failure.value(), directory->path());
+  return openToAppend(directory->appendingPathComponent("activity.log").path());
+}
+
+/// Adds a line. As long as that fails, tracing is off, which is logged once and not for each event.
+void writeLine(const std::string& line) {
+  static std::atomic<bool> isOff = false;
+  try {
+    const auto file = openLog();
+    if (writeAll(file.get(), line) != 0) throwPosix(errno, "activity.log");
+    isOff = false;
+  } catch (const ErrorObject& error) {
+    if (!isOff.exchange(true)) log("Activity tracing is off: " + error.description());
+  }
 }
 
 /// "2026-11-23 05:20:40 +0000"
@@ -59,9 +69,7 @@ const std::shared_ptr<ActivityTracer>& ActivityTracer::sharedTracer() {
 }
 
 void ActivityTracer::traceEvent(std::string name, ActivityTracingEvent::Data data) {
-  loggingQueue.async([name = std::move(name), data = std::move(data)] {
-    if (const auto file = openLog()) writeAll(file.get(), lineOf(name, data));
-  });
+  loggingQueue.async([name = std::move(name), data = std::move(data)] { writeLine(lineOf(name, data)); });
 }
 
 void ActivityTracer::traceTelvaneEvent(ActivityTracingEvent event) {

@@ -21,8 +21,8 @@ class MARLET_EXPORT ActivityTracer : public std::enable_shared_from_this<Activit
   /// Another one, for a host that keeps events of its own apart.
   static std::shared_ptr<ActivityTracer> make();
 
-  /// Adds a line to the file: the time, the name, and the data as JSON. Without a directory for the file this is a
-  /// fatal error.
+  /// Adds a line to the file: the time, the name, and the data as JSON. As long as the file can't be written, or its
+  /// directory not be made, tracing is off, which is logged once. That the host knows no such directory is a fatal error.
   void traceEvent(std::string name, ActivityTracingEvent::Data data);
   /// Sends the event. One that can't be sent is logged and dropped.
   void traceTelvaneEvent(ActivityTracingEvent event);

@@ -1,6 +1,10 @@
 #include "MarletFoundation/Logging/ActivityTracer.h"
 
+#include <fcntl.h>
 #include <gtest/gtest.h>
+#include <sys/file.h>
+#include <sys/stat.h>
+#include <unistd.h>
 
 #include <filesystem>
 #include <fstream>
@@ -91,6 +95,59 @@ TEST_F(ActivityTracerTest, TriesAgainWhereNoReporterCouldBeSetUp) {
   tracer_->traceTelvaneEvent({Event::Category::page, Event::EventType::closed, {}});
   finish();
   EXPECT_EQ(lines("TelvaneReporting/Messages.jsonl").size(), 2u);
+}
+
+/// Whatever stands in a file's place, and whoever holds the lock: the queue goes on, and traces again afterwards.
+TEST_F(ActivityTracerTest, NothingInTheWayHoldsUpTheQueue) {
+  const auto support = directory_.path() / "support";
+  const auto trace = [&] {
+    logged_.clear();
+    for (int time = 0; time < 2; ++time) {
+      tracer_->traceEvent("Opened", {});
+      tracer_->traceTelvaneEvent({Event::Category::page, Event::EventType::opened, {}});
+    }
+    finish();
+  };
+  const auto contains = [&](const char* words) { return logged_.find(words) != std::string::npos; };
+  trace();
+  EXPECT_EQ(logged_, "");
+  for (const std::string name :
+       {"activity.log", "TelvaneReporting/Messages.jsonl", "TelvaneReporting/Lock"}) {
+    const auto place = support / name, kept = directory_.path() / "kept";
+    const std::pair<const char*, std::function<void()>> hindrances[] = {
+        {"pipe", [&] { ::mkfifo(place.c_str(), 0600); }},
+        {"link to a pipe",
+         [&] { ::mkfifo(kept.c_str(), 0600), std::filesystem::create_symlink(kept, place); }},
+        {"link to a file", [&] { std::ofstream{kept}, std::filesystem::create_symlink(kept, place); }},
+        {"directory", [&] { std::filesystem::create_directory(place); }},
+    };
+    for (const auto& [hindrance, put] : hindrances) {
+      std::filesystem::remove(place);
+      put();
+      trace();
+      EXPECT_EQ(contains("Activity tracing is off: "), name == "activity.log") << hindrance << logged_;
+      EXPECT_EQ(contains("Telvane Error, dropping log message"), name != "activity.log") << hindrance << name;
+      // Said once, not for each event.
+      EXPECT_EQ(logged_.find("Activity", logged_.find("Activity") + 1), std::string::npos) << logged_;
+      std::filesystem::remove(place);
+      std::filesystem::remove(kept);
+      trace();
+      EXPECT_EQ(logged_, "") << hindrance << name;
+    }
+  }
+  {
+    const int lock = ::open((support / "TelvaneReporting/Lock").c_str(), O_RDWR | O_CLOEXEC);
+    ASSERT_EQ(::flock(lock, LOCK_EX), 0);
+    trace();
+    ::close(lock);
+    EXPECT_TRUE(contains("Telvane Error, dropping log message"));
+  }
+  trace();
+  EXPECT_EQ(logged_, "");
+  std::filesystem::remove_all(support);
+  std::ofstream(support) << "no directory can be made";
+  trace();
+  EXPECT_TRUE(contains("Activity tracing is off: ")) << logged_;
 }
 
 TEST_F(ActivityTracerTest, SpoolStaysBounded) {
