@@ -1,7 +1,5 @@
 #include "MarletFoundation/PathUtilities/MLFSandboxedResource.h"
 
-#include <sys/stat.h>
-
 #include <cerrno>
 #include <cstring>
 
@@ -19,14 +17,14 @@ constexpr int symbolicLinkCode = 1;
 
 void refuseSymbolicLink(const URL& url) {
   const auto path = fileSystemPath(url);
-  struct stat status;
-  if (!path || ::lstat(path->c_str(), &status) != 0) {
+  const auto isLink = path ? SecurityScope::isSymbolicLink(*path) : std::nullopt;
+  if (!isLink) {
     const auto underlying = ErrorObject::posix(path ? errno : EINVAL, url.path());
     throw ErrorObject::withMessage(MarletFoundationErrorDomain, unknownKindCode,
                                    "Unable to determine if file is a symlink", underlying.copy());
   }
   // A link could be pointed elsewhere after the grant.
-  if (S_ISLNK(status.st_mode))
+  if (*isLink)
     throw ErrorObject(
         std::string(MarletFoundationErrorDomain), symbolicLinkCode,
         {{std::string(LocalizedDescriptionKey), "Unable to create sandbox extension for symlink"},

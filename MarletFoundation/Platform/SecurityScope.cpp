@@ -8,6 +8,8 @@
 #include <unistd.h>
 
 #include <array>
+#include <climits>
+#include <cstdint>
 #include <filesystem>
 #include <map>
 #include <mutex>
@@ -23,8 +25,8 @@ namespace {
 
 using Secret = std::array<char, 32>;
 
-// A token: this, 64 hexadecimal digits of its signature, ";" and the path.
-constexpr std::string_view readPrefix = "marlet-scope;1;read;";
+// A token: this, 64 hexadecimal digits of its signature, ";" and what the grant is for.
+constexpr std::string_view readPrefix = "marlet-scope;2;read;";
 
 /// The user's secret. Nothing, with errno set, unless it is one that nobody else can read.
 std::optional<Secret> readSecret(const std::string& path) {
@@ -75,22 +77,73 @@ std::string signatureOf(std::string_view text, const Secret& secret) {
   return hexadecimal({digest.data(), size});
 }
 
-std::string tokenFor(const std::string& path, const Secret& secret) {
+std::string tokenFor(const std::string& item, const Secret& secret) {
   const auto prefix = std::string(readPrefix);
-  return prefix + signatureOf(prefix + path, secret) + ";" + path;
+  return prefix + signatureOf(prefix + item, secret) + ";" + item;
 }
 
-bool isReadable(const std::string& path) {
-  return ::faccessat(AT_FDCWD, path.c_str(), R_OK, AT_EACCESS) == 0;
+/// What lies at a path, opened without being read: all that is asked of it later is asked of this one thing, whatever
+/// comes to lie at the path. Directories on the way may be links; the last name isn't followed.
+class Item {
+ public:
+  /// False when nothing was found, with errno set.
+  explicit operator bool() const { return static_cast<bool>(opened_); }
+
+  static Item at(std::string path) {
+    // Behind a "." nothing is called a link any more.
+    while (path.size() > 1 && (path.ends_with('/') || path.ends_with("/."))) path.pop_back();
+    Item item;
+    if (path.ends_with("/..")) {
+      errno = EINVAL;
+      return item;
+    }
+    item.opened_ =
+        Descriptor(retrying([&] { return ::open(path.c_str(), O_PATH | O_NOFOLLOW | O_CLOEXEC); }));
+    constexpr auto wanted = STATX_TYPE | STATX_INO | STATX_BTIME;
+    if (item.opened_ && ::statx(item.opened_.get(), "", AT_EMPTY_PATH, wanted, &item.facts_) != 0)
+      item.opened_ = Descriptor();
+    return item;
+  }
+
+  bool isLink() const { return S_ISLNK(facts_.stx_mode); }
+  bool isReadable() const { return ::faccessat(AT_FDCWD, link().c_str(), R_OK, AT_EACCESS) == 0; }
+
+  /// The file and its place, as a token names them: device, number, the time when it was made, since numbers are used
+  /// again, and the path without links. Nothing, with errno set, when that path can't be had.
+  std::optional<std::string> name() const {
+    std::array<char, PATH_MAX> place;
+    const auto length = ::readlink(link().c_str(), place.data(), place.size());
+    if (length < 0) return std::nullopt;
+    const auto& made = facts_.stx_btime;
+    const std::uint64_t numbers[] = {facts_.stx_dev_major, facts_.stx_dev_minor, facts_.stx_ino,
+                                     static_cast<std::uint64_t>(made.tv_sec), made.tv_nsec};
+    std::string name;
+    for (const auto number : numbers) name += std::to_string(number) + ".";
+    name.back() = ';';
+    return name.append(place.data(), static_cast<std::size_t>(length));
+  }
+
+ private:
+  std::string link() const { return "/proc/self/fd/" + std::to_string(opened_.get()); }
+
+  Descriptor opened_;
+  struct statx facts_ {};
+};
+
+/// The token of what lies at the path; nothing, with errno set, when there can't be one.
+std::optional<std::string> tokenForPath(const std::string& path) {
+  const auto item = Item::at(path);
+  if (item && item.isLink()) errno = ELOOP;
+  if (!item || item.isLink() || !item.isReadable()) return std::nullopt;
+  const auto name = item.name();
+  const auto secret = name ? userSecret() : std::nullopt;
+  return secret ? std::optional(tokenFor(*name, *secret)) : std::nullopt;
 }
 
 bool isGood(const std::string& token, const std::string& path) {
-  struct stat status;
-  if (::lstat(path.c_str(), &status) != 0 || S_ISLNK(status.st_mode) || !isReadable(path)) return false;
-  const auto secret = userSecret();
-  if (!secret) return false;
-  const auto expected = tokenFor(path, *secret);
-  return token.size() == expected.size() && ::CRYPTO_memcmp(token.data(), expected.data(), token.size()) == 0;
+  const auto expected = tokenForPath(path);
+  return expected && token.size() == expected->size() &&
+         ::CRYPTO_memcmp(token.data(), expected->data(), token.size()) == 0;
 }
 
 struct Accesses {
@@ -106,11 +159,12 @@ Accesses& accesses() {
 
 }  // namespace
 
-std::optional<std::string> issueSandboxExtension(const std::string& path) {
-  if (!isReadable(path)) return std::nullopt;
-  const auto secret = userSecret();
-  return secret ? std::optional(tokenFor(path, *secret)) : std::nullopt;
+std::optional<bool> isSymbolicLink(const std::string& path) {
+  const auto item = Item::at(path);
+  return item ? std::optional(item.isLink()) : std::nullopt;
 }
+
+std::optional<std::string> issueSandboxExtension(const std::string& path) { return tokenForPath(path); }
 
 std::optional<std::string> copySecurityScope(const URL& url) { return url.securityScope(); }
 

@@ -139,6 +139,40 @@ TEST_F(SandboxedResource, OpensInAnotherProcessUnlessForged) {
   EXPECT_FALSE(MLFSandboxedResource(good).resourceURL) << "another secret";
 }
 
+TEST_F(SandboxedResource, IsForTheFileThatItWasGivenFor) {
+  const auto root = directory_.path();
+  for (const char* name : {"one", "two"}) {
+    fs::create_directory(root / name);
+    std::ofstream(root / name / "f") << name;
+  }
+  const auto pointTo = [&](const char* name) {
+    fs::remove(root / "lnk");
+    fs::create_directory_symlink(name, root / "lnk");
+  };
+  pointTo("one");
+  const auto grant = MLFSandboxedResource(directory_.url("lnk/f")).propertyListObject();
+  const auto isGood = [&] { return MLFSandboxedResource(grant).resourceURL.has_value(); };
+  EXPECT_TRUE(isGood());
+  pointTo("two");
+  EXPECT_FALSE(isGood()) << "the way leads elsewhere";
+  fs::remove(root / "two/f");
+  fs::create_hard_link(root / "one/f", root / "two/f");
+  EXPECT_FALSE(isGood()) << "the same file elsewhere";
+  pointTo("one");
+  EXPECT_TRUE(isGood());
+  std::ofstream(root / "one/f") << "what it holds may change";
+  EXPECT_TRUE(isGood());
+  fs::rename(root / "page", root / "one/f");
+  EXPECT_FALSE(isGood()) << "another file in its place";
+
+  for (const char* name : {"lnk/.", "lnk/././", "one/../lnk/."})
+    EXPECT_EQ(thrown<ErrorObject>([&] { MLFSandboxedResource resource(directory_.url(name)); }).code(), 1)
+        << name;
+  const auto unclear = thrown<ErrorObject>([&] { MLFSandboxedResource resource(directory_.url("lnk/..")); });
+  EXPECT_EQ(unclear.underlyingError()->code(), EINVAL);
+  EXPECT_NO_THROW(MLFSandboxedResource(directory_.url("one/.")));
+}
+
 TEST_F(SandboxedResource, IsRefusedForLinksAndWhatIsNotThere) {
   const auto failure = [&](const char* name) {
     return thrown<ErrorObject>([&] { MLFSandboxedResource resource(directory_.url(name)); });
