@@ -18,7 +18,8 @@ constexpr std::string_view versionKey = "MarletFoundationVersion";
 constexpr std::string_view sdkRootKey = "SDKRoot";
 
 const LogAspect& logAspect() {
-  static const LogAspect aspect("DerivedData");
+  // Never destroyed: other static objects may still ask, and removals log, while the process ends.
+  static const auto& aspect = *new LogAspect("DerivedData");
   return aspect;
 }
 
@@ -64,13 +65,17 @@ std::string directoryName(std::string_view name, std::string_view uniquifier) {
   return whole;
 }
 
+std::function<void(const std::optional<ErrorObject>&)> reportingRemoval(const URL& url) {
+  return [url](const std::optional<ErrorObject>& error) {
+    if (error)
+      report("Failed to asynchronously remove item at '" + url.absoluteString() +
+             "': " + error->description());
+  };
+}
+
 void removeAndCreateDirectory(const URL& url) {
   try {
-    FileManager::asynchronouslyRemoveItem(url, [url](const std::optional<ErrorObject>& error) {
-      if (error)
-        report("Failed to asynchronously remove item at '" + url.absoluteString() +
-               "': " + error->description());
-    });
+    FileManager::asynchronouslyRemoveItem(url, reportingRemoval(url));
   } catch (const ErrorObject& error) {
     if (error.domain() != PosixErrorDomain || error.code() != ENOENT) throw;
   }
@@ -120,11 +125,11 @@ bool DerivedDataManager::mustReset() const {
 }
 
 void DerivedDataManager::resetDerivedDataIfNecessary() const {
+  const auto wiped = {&derivedDataURL, &privateDerivedDataURL, &moduleCacheURL, &codeCompletionCacheURL};
+  for (const auto* url : wiped) FileManager::finishRemovals(*url, reportingRemoval(*url));
   if (!mustReset()) return;
   try {
-    for (const auto* url :
-         {&derivedDataURL, &privateDerivedDataURL, &moduleCacheURL, &codeCompletionCacheURL})
-      removeAndCreateDirectory(*url);
+    for (const auto* url : wiped) removeAndCreateDirectory(*url);
   } catch (const ErrorObject& error) {
     return report("Failed to wipe data: " + error.description());
   }

@@ -50,5 +50,9 @@ MARLET_EXPORT Data mapFile(const URL& url);
 /// on the background queue, with what stood against the removal or nothing.
 MARLET_EXPORT void asynchronouslyRemoveItem(
     const URL& url, std::function<void(const std::optional<ErrorObject>&)> completion = {});
+/// Removes, on the background queue, what an `asynchronouslyRemoveItem` of the same URL has left beside it because
+/// its process ended too soon. Nothing is thrown; `completion` is called for each thing that was found.
+MARLET_EXPORT void finishRemovals(const URL& url,
+                                  std::function<void(const std::optional<ErrorObject>&)> completion = {});
 
 }  // namespace MarletFoundation::FileManager

@@ -7,7 +7,9 @@
 
 #include "MarletFoundation/Data/PropertyListSerializable.h"
 #include "MarletFoundation/Environment/Target.h"
+#include "MarletFoundation/Platform/DispatchQueue.h"
 #include "MarletFoundation/Platform/FileManager.h"
+#include "MarletFoundation/Platform/Host.h"
 #include "MarletFoundation/Platform/HostEnvironment.h"
 #include "MarletFoundation/Version/MarletFoundationVersion.h"
 #include "support/Fatal.h"
@@ -89,6 +91,26 @@ TEST_F(DerivedData, IsWipedWhereAnotherVersionMadeIt) {
   leaveTraces(first);
   const DerivedDataManager manager;
   EXPECT_EQ(traces(manager), 0);
+  EXPECT_TRUE(FileManager::fileExists(info()));
+}
+
+TEST_F(DerivedData, TheNextStartClearsWhatAWipeThatEndedTooSoonLeft) {
+  const DerivedDataManager first;
+  const auto left = [&](const URL& url, const std::string& unique) {
+    const auto place = fs::path(url.path()).parent_path() / ("." + url.lastPathComponent() + "-" + unique);
+    fs::create_directories(place / "deep");
+    return place;
+  };
+  const auto unique = randomUUIDString();
+  const std::vector<fs::path> lefts = {
+      left(first.derivedDataURL, unique), left(first.privateDerivedDataURL, unique),
+      left(first.moduleCacheURL, unique), left(first.codeCompletionCacheURL, unique)};
+  const fs::path others[] = {left(first.moduleCacheURL, "mine"),
+                             left(directory_.url("support/Other"), unique)};
+  const DerivedDataManager second;
+  const auto isThere = [](const fs::path& place) { return fs::exists(place); };
+  EXPECT_TRUE(runUntil([&] { return std::none_of(lefts.begin(), lefts.end(), isThere); }, 10));
+  EXPECT_TRUE(std::all_of(std::begin(others), std::end(others), isThere));
   EXPECT_TRUE(FileManager::fileExists(info()));
 }
 
