@@ -1,13 +1,17 @@
 #include "MarletFoundation/Platform/HostEnvironment.h"
 
 #include <dlfcn.h>
+#include <link.h>
+#include <pwd.h>
 #include <syslog.h>
+#include <unistd.h>
 
 #include <atomic>
 #include <cstdio>
 #include <cstdlib>
 #include <forward_list>
 #include <mutex>
+#include <vector>
 
 #include "MarletFoundation/Platform/Descriptor.h"
 #include "MarletFoundation/Platform/Error.h"
@@ -23,9 +27,21 @@ std::optional<URL> directoryFromEnvironment(const char* variable) {
   return path && *path == '/' ? std::optional(URL::file(path, true)) : std::nullopt;
 }
 
+/// A process may run without HOME, as services do; its user has one all the same.
+std::optional<URL> homeDirectory() {
+  if (auto named = directoryFromEnvironment("HOME")) return named;
+  std::vector<char> buffer(1024);
+  passwd entry;
+  passwd* found = nullptr;
+  while (::getpwuid_r(::geteuid(), &entry, buffer.data(), buffer.size(), &found) == ERANGE)
+    buffer.resize(2 * buffer.size());
+  return found && found->pw_dir && *found->pw_dir == '/' ? std::optional(URL::file(found->pw_dir, true))
+                                                         : std::nullopt;
+}
+
 std::optional<URL> directoryInHome(const char* variable, std::string_view pathInHome) {
   if (auto named = directoryFromEnvironment(variable)) return named;
-  const auto home = directoryFromEnvironment("HOME");
+  const auto home = homeDirectory();
   return home ? std::optional(home->appendingPathComponent(pathInHome, true)) : std::nullopt;
 }
 
@@ -37,14 +53,25 @@ bool isDirectory(const URL& url) {
   }
 }
 
+/// The file that holds this code: the library, or a program that was linked with it statically. The name that a program
+/// was started under may be a relative one, which whoever chooses the working directory would give a meaning.
+std::optional<URL> ownBinary() {
+  Dl_info library{};
+  link_map* map = nullptr;
+  if (!::dladdr1(reinterpret_cast<const void*>(&ownBinary), &library, reinterpret_cast<void**>(&map),
+                 RTLD_DL_LINKMAP) ||
+      !map) {
+    return std::nullopt;
+  }
+  return URL::file(*map->l_name ? map->l_name : "/proc/self/exe");
+}
+
 /// The resources lie in the prefix that the library was installed to, or built in, one or, where the system has a
 /// directory for each architecture, two directories up.
 std::optional<URL> installedResources() {
-  Dl_info library{};
-  if (!::dladdr(reinterpret_cast<const void*>(&installedResources), &library) || !library.dli_fname) {
-    return std::nullopt;
-  }
-  auto prefix = URL::file(library.dli_fname).resolvingSymlinksInPath().deletingLastPathComponent();
+  const auto binary = ownBinary();
+  if (!binary) return std::nullopt;
+  auto prefix = binary->resolvingSymlinksInPath().deletingLastPathComponent();
   for (int level = 0; level < 2; ++level) {
     prefix = prefix.deletingLastPathComponent();
     auto resources = prefix.appendingPathComponent("share/marlet-foundation", true);

@@ -14,7 +14,8 @@ namespace MarletFoundation {
 /// What the library asks of its host: places, settings and sinks. A host that wants others than the defaults
 /// sets them once, at start-up, before it uses the library.
 struct MARLET_EXPORT HostEnvironment {
-  /// The user's documents. Default: XDG_DOCUMENTS_DIR, else ~/Documents; nothing without a home.
+  /// The user's documents. Default: XDG_DOCUMENTS_DIR, else ~/Documents, where the home is HOME, else what the
+  /// system's list of users says; nothing for a user whom that doesn't know.
   std::optional<URL> documentsDirectory;
   /// Where the library keeps support files. Default: XDG_DATA_HOME, else ~/.local/share.
   std::optional<URL> applicationSupportDirectory;
