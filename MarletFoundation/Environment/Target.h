@@ -50,7 +50,7 @@ class MARLET_EXPORT Target {
   /// The target registered for a directory, with or without the mark of one, else one loaded from it and, if
   /// asked, registered. Null when the directory holds no good one; that has no message.
   static TargetPointer loadFrom(const URL& url, bool registerTarget);
-  /// False, with nothing changed, when the URL or the target's identifier is registered.
+  /// False, with nothing changed, when the URL or the target's identifier is registered. Null is a fatal error.
   static bool registerTarget(const TargetPointer& target, const std::optional<URL>& url);
   /// For diagnostics: forgets every target. The bundled ones are not loaded again.
   static void _resetTargetRegistry();

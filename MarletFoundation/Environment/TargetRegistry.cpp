@@ -5,6 +5,7 @@
 #include "MarletFoundation/Environment/TargetInfo.h"
 #include "MarletFoundation/Logging/Log.h"
 #include "MarletFoundation/PathUtilities/URLExtensions.h"
+#include "MarletFoundation/Platform/FatalError.h"
 #include "MarletFoundation/Platform/FileManager.h"
 #include "MarletFoundation/Platform/Host.h"
 #include "MarletFoundation/Utils/Locks.h"
@@ -36,7 +37,8 @@ struct Registry {
 };
 
 Registry& registry() {
-  static Registry registry;
+  // Never destroyed: other static objects may still ask while the process ends.
+  static auto& registry = *new Registry;
   return registry;
 }
 
@@ -48,8 +50,11 @@ void report(const std::string& message) {
 /// stands.
 bool loadBundledTargets() {
   const auto resources = libraryResourcesURL();
-  const auto directory =
-      resources ? resources->appendingPathComponent("Targets", true) : URL::file("Targets", true);
+  if (!resources) {
+    report("Failed to load contents of 'Targets': the library's resources were not found");
+    return false;
+  }
+  const auto directory = resources->appendingPathComponent("Targets", true);
   std::vector<std::string> names;
   try {
     names = FileManager::contentsOfDirectory(directory, true);
@@ -102,6 +107,7 @@ TargetPointer Target::loadFrom(const URL& url, bool registerTarget) {
 }
 
 bool Target::registerTarget(const TargetPointer& target, const std::optional<URL>& url) {
+  if (!target) fatalError("A null target can't be registered.");
   const bool isKnown = registry().targetRegistryLock.read([&] {
     return (url && registry().urlToTargetMap.contains(directoryURL(*url))) ||
            registry().identifierToTargetMap.contains(target->identifier);

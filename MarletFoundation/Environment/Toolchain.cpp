@@ -24,7 +24,9 @@ URL globalToolchainRoot() {
 }  // namespace
 
 const std::shared_ptr<const Toolchain>& Toolchain::globalToolchain() {
-  static const std::shared_ptr<const Toolchain> toolchain(new Toolchain(globalToolchainRoot(), true));
+  // Never destroyed: other static objects may still ask while the process ends.
+  static const auto& toolchain =
+      *new std::shared_ptr<const Toolchain>(new Toolchain(globalToolchainRoot(), true));
   return toolchain;
 }
 

@@ -3,7 +3,8 @@
 namespace MarletFoundation {
 
 const LogAspect& documentLogAspect() {
-  static const LogAspect aspect("MarletFoundation");
+  // Never destroyed: other static objects may still log while the process ends.
+  static const auto& aspect = *new LogAspect("MarletFoundation");
   return aspect;
 }
 

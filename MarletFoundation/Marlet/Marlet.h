@@ -5,8 +5,8 @@
 
 namespace MarletFoundation {
 
-/// A live classic document, which owns its pages and its store. Nothing that is assigned is checked. No locks:
-/// one thread at a time.
+/// A live classic document, which owns its pages and its store. Nothing that is assigned is checked; but a snapshot with
+/// a null page, and writing one with a null target, are fatal errors. No locks: one thread at a time.
 struct MARLET_EXPORT Marlet {
   using Pages = std::vector<std::unique_ptr<MarletPage>>;
 

@@ -5,8 +5,9 @@
 
 namespace MarletFoundation {
 
-/// A live book, which owns its chapters and its store. Nothing that is assigned is checked, so a snapshot can
-/// describe a book that doesn't open. No locks: one thread at a time.
+/// A live book, which owns its chapters and its store. Nothing that is assigned is checked, so a snapshot can describe
+/// a book that doesn't open; but of a null chapter there is none, and with a null target none can be written: fatal errors.
+/// No locks: one thread at a time.
 struct MARLET_EXPORT MarletBook {
   using Chapters = std::vector<std::unique_ptr<MarletChapter>>;
 

@@ -3,6 +3,7 @@
 #include "MarletFoundation/Marlet/LoadChecks.h"
 #include "MarletFoundation/Marlet/MarletBook.h"
 #include "MarletFoundation/PathUtilities/PathUniquifier.h"
+#include "MarletFoundation/Platform/FatalError.h"
 #include "MarletFoundation/Platform/Host.h"
 #include "MarletFoundation/Version/ManifestVersion.h"
 
@@ -171,10 +172,14 @@ MarletBookSnapshot::MarletBookSnapshot(const MarletBook& book)
       userResourcesDirectoryURL(book.userResourcesDirectoryURL),
       imageReference(book.imageReference),
       keyValueStore(book.keyValueStore.snapshot()) {
-  for (const auto& chapter : book.chapters) chapters.push_back(chapter->snapshot());
+  for (const auto& chapter : book.chapters) {
+    if (!chapter) fatalError("A book's chapters can't be null.");
+    chapters.push_back(chapter->snapshot());
+  }
 }
 
 PropertyListValue MarletBookSnapshot::manifest() const {
+  if (!target) fatalError("A book can't be written without a target.");
   PropertyListValue::Array filenames;
   for (const auto& chapter : chapters) filenames.emplace_back(chapter.filename);
   PropertyListDictionary manifest{

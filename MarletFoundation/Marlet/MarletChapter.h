@@ -7,7 +7,8 @@
 
 namespace MarletFoundation {
 
-/// A live chapter, which owns its placeholders. Nothing that is assigned is checked.
+/// A live chapter, which owns its placeholders. Nothing that is assigned is checked; but a snapshot with a null page is
+/// a fatal error.
 struct MARLET_EXPORT MarletChapter {
   using Pages = std::vector<std::unique_ptr<BookPagePlaceholder>>;
 

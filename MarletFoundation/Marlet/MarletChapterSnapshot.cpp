@@ -2,6 +2,7 @@
 
 #include "MarletFoundation/Marlet/LoadChecks.h"
 #include "MarletFoundation/Marlet/MarletChapter.h"
+#include "MarletFoundation/Platform/FatalError.h"
 
 namespace MarletFoundation {
 
@@ -101,7 +102,10 @@ MarletChapterSnapshot::MarletChapterSnapshot(const MarletChapter& chapter)
       imageReference(chapter.imageReference),
       sourcesDirectoryURL(chapter.sourcesDirectoryURL),
       resourcesDirectoryURL(chapter.resourcesDirectoryURL) {
-  for (const auto& page : chapter.pages) pages.push_back(page->snapshot());
+  for (const auto& page : chapter.pages) {
+    if (!page) fatalError("A chapter's pages can't be null.");
+    pages.push_back(page->snapshot());
+  }
 }
 
 PropertyListValue MarletChapterSnapshot::manifest() const {

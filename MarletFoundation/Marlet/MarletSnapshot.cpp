@@ -71,7 +71,10 @@ MarletSnapshot::MarletSnapshot(const Marlet& marlet)
     : MarletSnapshot(marlet.name, marlet.uniquifier, marlet.target, marlet.requiresFullEnvironment,
                      marlet.sharedResourcesDirectoryURL, marlet.sharedSourcesDirectoryURL,
                      marlet.marletIconURL, {}, marlet.keyValueStore.snapshot()) {
-  for (const auto& page : marlet.pages) pages.push_back(page->snapshot());
+  for (const auto& page : marlet.pages) {
+    if (!page) fatalError("A marlet's pages can't be null.");
+    pages.push_back(page->snapshot());
+  }
 }
 
 bool MarletSnapshot::isSinglePage() const {
@@ -79,6 +82,7 @@ bool MarletSnapshot::isSinglePage() const {
 }
 
 Data MarletSnapshot::manifest() const {
+  if (!target) fatalError("A marlet can't be written without a target.");
   const MLFXMLAttributes attributes{
       {"version", isSinglePage() ? "5.0" : "6.0"},
       {"target-platform", target->identifier},

@@ -15,7 +15,8 @@ struct ProviderRegistry {
 };
 
 ProviderRegistry& registry() {
-  static ProviderRegistry registry;
+  // Never destroyed: errors may still be described while the process ends.
+  static auto& registry = *new ProviderRegistry;
   return registry;
 }
 

@@ -11,7 +11,8 @@ namespace {
 std::mutex handlerMutex;
 
 FatalErrorHandler& installedHandler() {
-  static FatalErrorHandler handler;
+  // Never destroyed: something may still go wrong while the process ends.
+  static auto& handler = *new FatalErrorHandler;
   return handler;
 }
 

@@ -2,7 +2,14 @@
 
 #include <gtest/gtest.h>
 
+#include <filesystem>
+#include <iostream>
+
+#include "MarletFoundation/DerivedData/DerivedDataManager.h"
+#include "MarletFoundation/Marlet/MarletSnapshot.h"
 #include "MarletFoundation/Platform/Host.h"
+#include "support/ChangedHost.h"
+#include "support/Failure.h"
 #include "support/Tree.h"
 
 namespace MarletFoundation::test {
@@ -94,6 +101,55 @@ TEST(TargetRegistry, BundledTargetsAreThereAndOthersAreAddedOnce) {
   EXPECT_EQ(Target::allTargets().size(), bundled.size() + 1);
   EXPECT_FALSE(Target::registerTarget(target, URL::file("/elsewhere")));
   EXPECT_EQ(Target::allTargets().size(), bundled.size() + 1);
+}
+
+TEST(TargetRegistry, WithoutResourcesNoTargetIsFoundAndThatIsLogged) {
+  GTEST_FLAG_SET(death_test_style, "threadsafe");  // what is loaded once must not be loaded yet
+  const TemporaryDirectory directory;
+  goodTarget().writeTo(directory.path() / "Targets");
+  EXPECT_EXIT(
+      {
+        std::filesystem::current_path(directory.path());
+        const ChangedHost changed([](HostEnvironment& host) {
+          host.resourcesDirectory.reset();
+          host.systemLog = [](std::string_view entry) { std::cerr << entry << std::endl; };
+        });
+        std::exit(Target::allTargets().empty() && !Target::targetWithIdentifier("test.x") ? 0 : 1);
+      },
+      testing::ExitedWithCode(0),
+      "Failed to load contents of 'Targets': the library's resources were not found");
+}
+
+/// It is older than all that it asks, and so goes last.
+struct AsksAtExit {
+  ~AsksAtExit() {
+    const auto target = Target::targetWithIdentifier("desk");
+    const auto& manager = DerivedDataManager::sharedDerivedDataManager();
+    manager.buildDirectoryURLForMarletWithName("N", std::string(300, 'u'));  // too long: it is logged
+    const Tree classic{
+        {"contents.wbmarlet",
+         "<marlet version='6.0' target-platform='desk' requires-full-environment='true'><pages/></marlet>"}};
+    errorOf([&] { MarletSnapshot(classic.wrapper(), URL::file("/N.marlet")); });  // no "Pages": logged, too
+    std::cerr << target->librarySearchPath().searchPaths().size() << " paths" << std::endl;
+  }
+};
+
+TEST(TargetRegistry, AnswersToTheVeryEndOfTheProcess) {
+  GTEST_FLAG_SET(death_test_style, "threadsafe");
+  const TemporaryDirectory directory;
+  EXPECT_EXIT(
+      {
+        static AsksAtExit last;
+        auto host = HostEnvironment::current();
+        host.applicationSupportDirectory = directory.url();
+        host.groupContainer = [url = directory.url()](std::string_view) { return url; };
+        host.systemLog = [](std::string_view entry) { std::cerr << entry << std::endl; };
+        HostEnvironment::setCurrent(host);
+        DerivedDataManager::sharedDerivedDataManager().buildDirectoryURLForMarletWithName("N", "u");
+        Toolchain::globalToolchain();
+        std::exit(0);
+      },
+      testing::ExitedWithCode(0), "Failed to create DerivedData directory: .*File wrappers: .*2 paths");
 }
 
 TEST(SearchPath, FirstHitWinsAndFormIsAnArrayOfPaths) {

@@ -2,6 +2,7 @@
 #include <rapidcheck.h>
 
 #include "MarletFoundation/Marlet/CutsceneBookPage.h"
+#include "MarletFoundation/Marlet/Marlet.h"
 #include "MarletFoundation/Marlet/MarletBook.h"
 #include "MarletFoundation/Marlet/MarletBookPage.h"
 #include "MarletFoundation/Marlet/MarletPage.h"
@@ -177,6 +178,33 @@ TEST(LiveBook, SnapshotOfALiveBookIsTheBook) {
   live.chapters.clear();
   EXPECT_EQ(*live.snapshot().manifest().dictionary()->find("Chapters"),
             PropertyListValue(PropertyListValue::Array{}));
+}
+
+TEST(LiveBook, NullPartsAreStatedFatalErrors) {
+  const auto book = [] {
+    return std::make_unique<MarletBook>(MarletBookSnapshot(goodBook().wrapper(), baseURL));
+  };
+  const auto withoutTarget = book(), withoutChapter = book(), withoutPage = book();
+  withoutTarget->target = nullptr;
+  withoutChapter->chapters[1] = nullptr;
+  withoutPage->chapters[1]->pages[0] = nullptr;
+  const auto classic = [](TargetPointer target, bool hasPage) {
+    Marlet::Pages pages;
+    pages.push_back(hasPage ? std::make_unique<MarletPage>(MarletPageSnapshot("P", u"", {}, {}, {}, {}))
+                            : nullptr);
+    Marlet("N", "U", std::move(target), true, {}, {}, {}, std::move(pages), MarletKeyValueStore())
+        .snapshot()
+        .fileWrapper();
+  };
+  const std::pair<std::function<void()>, const char*> cases[] = {
+      {[&] { withoutTarget->snapshot().manifest(); }, "A book can't be written without a target."},
+      {[&] { withoutChapter->snapshot(); }, "A book's chapters can't be null."},
+      {[&] { withoutPage->snapshot(); }, "A chapter's pages can't be null."},
+      {[&] { classic(nullptr, true); }, "A marlet can't be written without a target."},
+      {[&] { classic(withoutPage->target, false); }, "A marlet's pages can't be null."},
+      {[] { Target::registerTarget(nullptr, std::nullopt); }, "A null target can't be registered."},
+  };
+  for (const auto& [use, message] : cases) EXPECT_EQ(fatalMessage(use), message);
 }
 
 TEST(LiveBook, PropertiesOfABookThatNeedNotOpen) {
