@@ -20,6 +20,8 @@ class MARLET_EXPORT ActivityTracer : public std::enable_shared_from_this<Activit
   static const std::shared_ptr<ActivityTracer>& sharedTracer();
   /// Another one, for a host that keeps events of its own apart.
   static std::shared_ptr<ActivityTracer> make();
+  ActivityTracer(const ActivityTracer&) = delete;
+  ActivityTracer& operator=(const ActivityTracer&) = delete;
 
   /// Adds a line to the file: the time, the name, and the data as JSON. As long as the file can't be written, or its
   /// directory not be made, tracing is off, which is logged once. That the host knows no such directory is a fatal error.
