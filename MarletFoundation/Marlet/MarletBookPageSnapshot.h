@@ -77,8 +77,8 @@ class MARLET_EXPORT MarletBookPageSnapshot final : public BookPageSnapshotType,
 
   MarletBookPageSnapshot snapshot() const { return *this; }
   /// The page's whole directory, with a binary manifest. "Sources", "Resources" and "LiveView.swift" are taken
-  /// from where their URLs point, each left out where nothing can be opened there: of an opened directory nothing
-  /// is left out, and what can't be read in it ends the writing with its error. Throws the property-list writer's
+  /// from where their URLs point, each left out where nothing lies there: of what does nothing is left out, and
+  /// what can't be read of it ends the writing with its error. Throws the property-list writer's
   /// error for strings that aren't valid; a source that isn't valid UTF-16 is a fatal error.
   FileWrapper fileWrapper() const override;
   std::unique_ptr<BookPageType> convertToMutablePage() const override;

@@ -36,8 +36,8 @@ class MARLET_EXPORT MarletPageSnapshot final : public MarletPageSnapshotType {
 
   MarletPageSnapshot snapshot() const { return *this; }
   /// The page's directory: "Contents.swift", and "Sources" and "Resources" from where their URLs point, each left
-  /// out where nothing can be opened there: of an opened directory nothing is left out, and what can't be read in
-  /// it ends the writing with its error. Result info and hints aren't stored. A text that isn't valid UTF-16 throws
+  /// out where nothing lies there: of what does nothing is left out, and what can't be read of it ends the writing
+  /// with its error. Result info and hints aren't stored. A text that isn't valid UTF-16 throws
   /// an `ErrorObject` of `MarletSerializationErrorDomain`.
   FileWrapper fileWrapper() const override;
 

@@ -50,9 +50,8 @@ struct MARLET_EXPORT MarletSnapshot {
   /// shared. Any other is written with a directory for each page, version 6.0.
   bool isSinglePage() const;
 
-  /// The document's directory. The icon and the directories are left out where nothing can be opened at their
-  /// URLs: of an opened directory nothing is left out, and what can't be read in it ends the writing with its
-  /// error. In the form with a directory for each page, a page without a name is a fatal error. Throws an
+  /// The document's directory. The icon and the directories are left out where nothing lies at their URLs:
+  /// of what does nothing is left out, and what can't be read of it ends the writing with its error. In the form with a directory for each page, a page without a name is a fatal error. Throws an
   /// `ErrorObject` of `MarletSerializationErrorDomain` for names that XML can't carry and for texts that aren't
   /// valid UTF-16.
   /// The argument is there for likeness with books and changes nothing.

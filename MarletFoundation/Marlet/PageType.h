@@ -46,8 +46,8 @@ class MARLET_EXPORT PageType {
 /// A page as an immutable value.
 class MARLET_EXPORT PageSnapshotType : public virtual PageType {
  public:
-  /// The page's directory, made anew. A directory it refers to that can't be opened is an error or left out, as
-  /// the kind of page says; what can't be read within one ends the writing of the wrapper with its error.
+  /// The page's directory, made anew. Where nothing lies at a URL that it refers to, that is an error or left
+  /// out, as the kind of page says; what lies there and can't be read ends the writing of the wrapper with its error.
   virtual FileWrapper fileWrapper() const = 0;
 
  protected:
