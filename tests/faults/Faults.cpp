@@ -1,6 +1,6 @@
 /// Preloaded into a command, lets one of its calls to the file system go wrong. $FAULT_AT counts the calls that
 /// can go wrong so, from 1; $FAULT is `error` (EIO), `short` (a write of one byte less) or `exit` (the process
-/// ends ahead of the call), or `hold`: the call waits for 30 ms, and so does each $FAULT_EVERYth. $NO_EXCHANGE makes the file system one that can't exchange two names. The number of
+/// ends ahead of the call), or `hold`: the call waits for $FAULT_FOR ms, else 30, and so does each $FAULT_EVERYth. $NO_EXCHANGE makes the file system one that can't exchange two names. The number of
 /// calls made goes to $FAULT_COUNT, a file.
 
 #include <dlfcn.h>
@@ -12,9 +12,11 @@
 
 #include <atomic>
 #include <cerrno>
+#include <chrono>
 #include <cstdio>
 #include <cstdlib>
 #include <string_view>
+#include <thread>
 
 #define INTERPOSED extern "C" __attribute__((visibility("default")))
 
@@ -49,12 +51,19 @@ bool isHeld(long number) {
   return isAsked && (number == at || (every > 0 && number % every == 0));
 }
 
+void hold() {
+  static const long milliseconds = *setting("FAULT_FOR") ? std::atol(setting("FAULT_FOR")) : 30;
+  // A signal that comes meanwhile must not end it early.
+  const auto end = std::chrono::steady_clock::now() + std::chrono::milliseconds(milliseconds);
+  std::this_thread::sleep_until(end);
+}
+
 /// Counts a call, and says whether it is the one to fail. Ends the process if that is to happen here.
 bool isFaulty(Call call) {
   static const long at = std::atol(setting("FAULT_AT"));
   if (!counts(call)) return false;
   const long number = ++counted;
-  if (isHeld(number)) ::usleep(30'000);
+  if (isHeld(number)) hold();
   if (number != at) return false;
   if (setting("FAULT") == "exit"sv) ::_exit(99);
   return true;
