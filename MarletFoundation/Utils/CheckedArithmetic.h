@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <limits>
 
 #include "MarletFoundation/Platform/FatalError.h"
 
@@ -22,8 +23,9 @@ inline std::int64_t checkedDifference(std::int64_t a, std::int64_t b) {
 /// Whether a line or an offset that a document holds leaves room for sums with what texts have of them. Beyond, it is
 /// damage: no text reaches so far.
 constexpr bool leavesRoomForSums(std::int64_t number) {
-  constexpr std::int64_t most = std::int64_t{1} << 62;
-  return -most <= number && number <= most;
+  using Limits = std::numeric_limits<std::int64_t>;
+  constexpr std::int64_t room = std::int64_t{1} << 40;
+  return number >= Limits::min() + room && number <= Limits::max() - room;
 }
 
 }  // namespace MarletFoundation

@@ -40,7 +40,7 @@ MarletHint hint(bool hasResources) {
 MarletResultInfoSnapshot resultInfo() {
   InlineResults results;
   for (const auto line : *rc::gen::container<std::vector<std::int64_t>>(rc::gen::arbitrary<std::int64_t>()))
-    results.emplace(line, MarletInlineResultData(line, 0, MarletInlineResultData::Hidden{}));
+    results.emplace(line / 2, MarletInlineResultData(line / 2, 0, MarletInlineResultData::Hidden{}));
   std::optional<AssessmentInformation> assessment;
   if (*rc::gen::arbitrary<bool>()) {
     assessment.emplace(AssessmentStatus(AssessmentStatus::Fail{{text()}, optionalText()}),
