@@ -9,6 +9,8 @@
 #include <bit>
 #include <climits>
 
+#include "MarletFoundation/Platform/SharedRelease.h"
+
 namespace MarletFoundation {
 namespace {
 
@@ -122,9 +124,7 @@ DiskDirectory::DiskDirectory(Key, std::shared_ptr<DiskDirectory> parent, SharedS
 
 DiskDirectory::~DiskDirectory() {
   if (descriptor_ >= 0) tree_->forget(descriptor_);
-  // A long chain of ancestors that nothing else holds goes link by link, not in a recursion.
-  auto ancestor = std::move(parent_);
-  while (ancestor && ancestor.use_count() == 1) ancestor = std::shared_ptr(std::move(ancestor->parent_));
+  releaseWithoutStack(std::move(parent_));
 }
 
 std::shared_ptr<DiskDirectory> DiskDirectory::root(Descriptor descriptor) {

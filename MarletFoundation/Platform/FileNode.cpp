@@ -2,11 +2,9 @@
 
 #include <dirent.h>
 
-#include <new>
-#include <vector>
-
 #include "MarletFoundation/Platform/AtomicReplacement.h"
 #include "MarletFoundation/Platform/ErrorObject.h"
+#include "MarletFoundation/Platform/SharedRelease.h"
 
 namespace MarletFoundation {
 namespace {
@@ -95,22 +93,11 @@ std::shared_ptr<FileNode> FileNode::found(std::shared_ptr<DiskDirectory> parent,
 FileNode::~FileNode() {
   if (file() && file()->descriptor >= 0) parent_->forget(file()->descriptor);
   auto* const directory = std::get_if<Directory>(&facts_);
-  if (!directory || directory->children.empty()) return;
-  // Level by level: a tree may be deeper than the stack.
-  try {
-    std::vector<Children> pending;
-    pending.push_back(std::move(directory->children));
-    while (!pending.empty()) {
-      const auto children = std::move(pending.back());
-      pending.pop_back();
-      for (const auto& [name, node] : children) {
-        if (!node || node.use_count() > 1) continue;
-        auto* const below = std::get_if<Directory>(&node->facts_);
-        if (below && !below->children.empty()) pending.push_back(std::move(below->children));
-      }
-    }
-  } catch (const std::bad_alloc&) {
-    // What wasn't moved goes with its node, on the stack.
+  for (auto* const list :
+       {directory ? &directory->children : nullptr, directory ? directory->replaced.get() : nullptr}) {
+    if (!list) continue;
+    // A tree may be deeper than the stack.
+    for (auto& [name, node] : *list) releaseWithoutStack(std::move(node));
   }
 }
 
