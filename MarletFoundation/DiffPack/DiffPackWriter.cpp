@@ -3,6 +3,7 @@
 #include "MarletFoundation/Data/PropertyListSerializable.h"
 #include "MarletFoundation/DiffPack/DiffPackFormat.h"
 #include "MarletFoundation/DiffPack/DiffPackSnapshot.h"
+#include "MarletFoundation/DiffPack/PackPaths.h"
 #include "MarletFoundation/DiffPack/TreePaths.h"
 #include "MarletFoundation/Platform/RelativePath.h"
 #include "MarletFoundation/Platform/Text.h"
@@ -48,11 +49,11 @@ class DiffPackWriter {
   Dictionary operator()(const FileDiffDescriptor::Replaced& file) { return carry(file.path, file.data); }
 
   Dictionary operator()(const FileDiffDescriptor::Modified& file) {
-    auto deltaPath = file.path.substr(0, file.path.find_last_not_of('/') + 1) + std::string(deltaExtension);
+    auto delta = deltaPath(file.path);
     PropertyListValue::Array descriptors;
     for (const auto& descriptor : file.diff) descriptors.push_back(dictionary(descriptor, file.path));
-    place(deltaPath, propertyListFile(Dictionary{{fileKey, file.path}, {diffKey, std::move(descriptors)}}));
-    return {{fileKey, file.path}, {diffKey, std::move(deltaPath)}};
+    place(delta, propertyListFile(Dictionary{{fileKey, file.path}, {diffKey, std::move(descriptors)}}));
+    return {{fileKey, file.path}, {diffKey, std::move(delta)}};
   }
 
  private:

@@ -22,8 +22,14 @@ MARLET_EXPORT DiffPackSnapshot makeUserEditDiffPack(const MarletBookSnapshot& bo
 
 /// The pack with the given files' edits in place of those it held; edits never pile up. Of a text only the
 /// changes stay that `UserEditDiffPackValidator` lets pass and that leave the page's tags as they are, also those of a
-/// field within another one, without a word about the others; a file with none left has no entry. What isn't UTF-8, or has no authored text beside it, is carried whole. Throws what the
-/// validator throws for the pack.
+/// field within another one, without a word about the others; a file with none left has no entry. What isn't UTF-8, or has no authored text beside it, is carried whole, and so is a text whose
+/// changes hold a character that XML has none for, such as a form feed (as authored where it isn't editable).
+///
+/// Doubled slashes in a path and one at its end count for nothing: the pack names a file in one way. Throws what the
+/// validator throws for the pack, and an `ErrorObject` of `DiffErrorDomain` with the code
+/// `CriticalDiffPackValidationError` for a file that is edited by two paths, and for one that has no room in the
+/// pack's directory beside another: below a path at which there is a file, or where the pack keeps its manifest or
+/// another file's changes.
 MARLET_EXPORT DiffPackSnapshot updatedUserEditDiffPack(const DiffPackSnapshot& pack,
                                                        const UserEdits& userEdits);
 
