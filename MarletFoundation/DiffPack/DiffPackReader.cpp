@@ -1,9 +1,10 @@
+#include "MarletFoundation/DiffPack/DiffPackReader.h"
+
 #include <algorithm>
 #include <map>
 
 #include "MarletFoundation/Data/PropertyListSerializable.h"
 #include "MarletFoundation/DiffPack/DiffPackFormat.h"
-#include "MarletFoundation/DiffPack/DiffPackSnapshot.h"
 #include "MarletFoundation/Platform/RelativePath.h"
 #include "MarletFoundation/Platform/Text.h"
 
@@ -62,10 +63,13 @@ PropertyListValue readManifest(const FileWrapper& pack) {
   }
 }
 
-/// Reads the entries of the updates.
+using Unreadable = PartialDiffPack::Unreadable;
+
+/// Reads the entries of the updates; those that can't be read go to a list, if there is one.
 class UpdatesReader {
  public:
-  UpdatesReader(const FileWrapper& pack, DiffPackType type) : pack_(pack), type_(type) {}
+  UpdatesReader(const FileWrapper& pack, DiffPackType type, std::vector<Unreadable>* unreadable)
+      : pack_(pack), type_(type), unreadable_(unreadable) {}
 
   std::vector<FileDiffDescriptor> read(const Dictionary& updates) {
     std::vector<FileDiffDescriptor> entries;
@@ -74,23 +78,32 @@ class UpdatesReader {
       const auto name = std::find(std::begin(sectionKeys), std::end(sectionKeys), key.view());
       if (name == std::end(sectionKeys) || !elements) throw failure(invalidUpdateEntry, "");
       for (const auto& element : *elements) {
-        const auto* entry = element.dictionary();
-        if (entry) entries.push_back({change(*name, *entry)});
+        if (const auto* entry = element.dictionary()) add(*name, *entry, entries);
       }
     }
     return entries;
   }
 
  private:
-  FileDiffDescriptor::Change change(std::string_view section, const Dictionary& entry) {
+  void add(std::string_view section, const Dictionary& entry, std::vector<FileDiffDescriptor>& entries) {
     const auto* path = stringAt(entry, fileKey);
     if (!path) throw failure(invalidUpdateEntry, "");
-    if (section == "Added") return FileDiffDescriptor::Added{*path, carriedData(*path)};
-    if (section == "Removed") return FileDiffDescriptor::Removed{*path};
-    if (section == "Replaced") return FileDiffDescriptor::Replaced{*path, carriedData(*path)};
+    try {
+      entries.push_back({change(section, *path, entry)});
+    } catch (const Error& error) {
+      if (!unreadable_) throw;
+      unreadable_->push_back({*path, section, error.copy()});
+    }
+  }
+
+  FileDiffDescriptor::Change change(std::string_view section, const std::string& path,
+                                    const Dictionary& entry) {
+    if (section == "Added") return FileDiffDescriptor::Added{path, carriedData(path)};
+    if (section == "Removed") return FileDiffDescriptor::Removed{path};
+    if (section == "Replaced") return FileDiffDescriptor::Replaced{path, carriedData(path)};
     const auto* deltaPath = stringAt(entry, diffKey);
     if (!deltaPath) throw failure(invalidUpdateEntry, "");
-    return FileDiffDescriptor::Modified{*path, delta(*deltaPath)};
+    return FileDiffDescriptor::Modified{path, delta(*deltaPath)};
   }
 
   /// What the pack holds of an added or replaced file. An update pack's files stay on disk until it is
@@ -151,11 +164,14 @@ class UpdatesReader {
 
   const FileWrapper& pack_;
   DiffPackType type_;
+  std::vector<Unreadable>* unreadable_;
   /// What was read of the deltas, by the components of their paths.
   std::map<std::vector<std::string_view>, DiffDescriptors> deltas_;
 };
 
-DiffPackSnapshot readPack(const FileWrapper& pack, URL contentUrl) {
+}  // namespace
+
+DiffPackSnapshot readDiffPack(const FileWrapper& pack, URL contentUrl, std::vector<Unreadable>* unreadable) {
   const auto value = readManifest(pack);
   const auto* manifest = value.dictionary();
   if (!manifest) throw failure("Invalid Manifest.plist format, manifest root is not a dictionary");
@@ -177,12 +193,13 @@ DiffPackSnapshot readPack(const FileWrapper& pack, URL contentUrl) {
           name,
           base,
           update,
-          UpdatesReader(pack, type).read(*updates->dictionary())};
+          UpdatesReader(pack, type, unreadable).read(*updates->dictionary())};
 }
 
-}  // namespace
-
 DiffPackSnapshot::DiffPackSnapshot(const FileWrapper& fileWrapper, URL content)
-    : DiffPackSnapshot(readPack(fileWrapper, std::move(content))) {}
+    : DiffPackSnapshot(readDiffPack(fileWrapper, std::move(content))) {}
+
+PartialDiffPack::PartialDiffPack(const FileWrapper& fileWrapper, URL contentUrl)
+    : pack(readDiffPack(fileWrapper, std::move(contentUrl), &unreadable)) {}
 
 }  // namespace MarletFoundation

@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "DiffPack/Packs.h"
+#include "MarletFoundation/DiffPack/PartialDiffPack.h"
 #include "MarletFoundation/Platform/PropertyListError.h"
 #include "support/Failure.h"
 
@@ -142,6 +143,36 @@ TEST(DiffPackReading, FailsInTheWordsOfEachCheck) {
 
   EXPECT_EQ(std::get<1>(outcome(FileWrapper::regularFile(Data()))),
             "Invalid diffpack format, no directory contents.");
+}
+
+/// What of a pack can't be read is told by its paths; what it doesn't tell ends the reading.
+TEST(DiffPackReading, TellsWhatOfADamagedPackCantBeRead) {
+  const auto good = goodPack();
+  const std::pair<Tree, std::string> cases[] = {
+      {good, ""},
+      {good.without("new.txt"), "Added new.txt; "},
+      {good.without("new.txt").with("new.txt/", std::string()), "Added new.txt; "},
+      {good.without("Pages/image.png").without("new.txt"), "Added new.txt; Replaced Pages/image.png; "},
+      {good.without(delta), "Modified Pages/text.swift; "},
+      {good.with(delta, notAPlist), "Modified Pages/text.swift; "},
+      {withHunks({hunkEntry(), D{}}), "Modified Pages/text.swift; "},
+      {good.without(manifest), "none"},
+      {good.with(manifest, notAPlist), "none"},
+      {withUpdates({{"Added", A{D{}}}}), "none"},
+      {withUpdates({{"Moved", A{}}}), "none"},
+  };
+  for (const auto& [tree, unreadable] : cases) {
+    std::string found;
+    try {
+      const PartialDiffPack partial(tree.wrapper(), contentUrl);
+      for (const auto& entry : partial.unreadable)
+        found += std::string(entry.section) + " " + entry.filePath + "; ";
+      EXPECT_EQ(partial.pack.updates.size() + partial.unreadable.size(), 4u) << tree;
+    } catch (const ErrorObject&) {
+      found = "none";
+    }
+    EXPECT_EQ(found, unreadable) << tree;
+  }
 }
 
 TEST(DiffPackReading, KeepsTheCauseOfABadManifest) {

@@ -8,11 +8,14 @@
 #include "DiffPack/Packs.h"
 #include "MarletDiff/ContentDiff.h"
 #include "MarletDiff/Texts.h"
+#include "MarletFoundation/DiffPack/CheckedDiffPack.h"
 #include "MarletFoundation/DiffPack/MergedUserEdit.h"
 #include "MarletFoundation/DiffPack/UserEditDiffPackValidator.h"
+#include "MarletFoundation/DiffPack/UserEditsPlace.h"
 #include "MarletFoundation/Marlet/MarletBookSnapshot.h"
 #include "MarletFoundation/SourceAnnotations/EditableRanges.h"
 #include "MarletFoundation/SourceAnnotations/SourceTag.h"
+#include "MarletFoundation/Platform/FileManager.h"
 #include "support/Documents.h"
 #include "support/Failure.h"
 #include "support/Fatal.h"
@@ -215,6 +218,118 @@ TEST_F(UpdatingUserEdits, CarriesWholeWhatIsNoText) {
                                    {FileDiff::Replaced{"binary", text}},
                                    {FileDiff::Added{"new", text}},
                                    {FileDiff::Replaced{"page", bytes}}}));
+}
+
+/// One change with a character that XML has none for must not keep the call's others from being saved.
+TEST_F(UpdatingUserEdits, CarriesWholeATextWhoseChangesADeltaCantHold) {
+  Tree{{"feed", "a\fb\n"s}}.writeTo(directory_.path());
+  for (const auto& written : {"\f"s, "\x1b[0m"s, "\xef\xbf\xbe"s, "\0"s}) {
+    const auto edited = replacing(source, "second", written);
+    const auto pack = updatedUserEditDiffPack(
+        packOf(directory_.url()),
+        {{"page", Data(replacing(edited, "fixed()", "broken()"))}, {"bare", Data("1"s)}});
+    EXPECT_EQ(entries(pack).back(), (FileDiff{FileDiff::Replaced{"page", Data(edited)}}));
+    const DiffPackSnapshot saved(checkedFileWrapper(pack), directory_.url());
+    EXPECT_EQ(mergedUserEdit(saved, "page")->view(), edited);
+    EXPECT_EQ(mergedUserEdit(saved, "bare")->view(), "1");
+  }
+  EXPECT_EQ(updated({{"feed", Data("a\fc\n"s)}}),
+            (std::vector<FileDiff>{{FileDiff::Modified{"feed", {{{2, 1}, {2, 1}, u"b", u"c"}}}}}));
+  EXPECT_EQ(updated({{"feed", Data("ab\n"s)}}),
+            (std::vector<FileDiff>{{FileDiff::Replaced{"feed", Data("ab\n"s)}}}));
+}
+
+TEST_F(UpdatingUserEdits, NamesAFileInOneWay) {
+  const Data text("text"s);
+  const FileDiff added{FileDiff::Added{"a/b", text}}, other{FileDiff::Added{"a//b/", Data("old"s)}};
+  for (const auto& path : {"a/b", "a//b", "a/b/", "a///b//"}) {
+    EXPECT_EQ(updated({{path, text}}), std::vector{added}) << path;
+    EXPECT_EQ(updated({{path, text}}, {other, added, other}), std::vector{added}) << path;
+    EXPECT_TRUE(updated({{path, std::nullopt}}, {other, added, other}).empty()) << path;
+  }
+}
+
+/// What has no room beside another file of the pack is refused, whichever of the two came first.
+TEST_F(UpdatingUserEdits, RefusesFilesThatCollide) {
+  const std::optional<Data> text("text"s), edited("one\n2"s);
+  const auto added = [](const std::string& path) { return FileDiff{FileDiff::Added{path, Data("old"s)}}; };
+  const struct {
+    UserEdits edits;
+    std::vector<FileDiff> before;
+    std::string place;
+  } cases[] = {
+      {{{"n", text}, {"n/m", text}}, {}, "n"},
+      {{{"n/m/o", text}}, {added("n.x"), added("n")}, "n"},
+      {{{"n", text}}, {added("n.x"), added("n/m/o")}, "n"},
+      {{{"bare", edited}, {"bare.delta", text}}, {}, "bare.delta"},
+      {{{"bare.delta/x", text}}, {{FileDiff::Modified{"bare"}}}, "bare.delta"},
+      {{{"bare", edited}}, {added("bare.delta")}, "bare.delta"},
+      {{{"Manifest.plist", text}}, {}, "Manifest.plist"},
+      {{{"Manifest.plist/x", text}}, {}, "Manifest.plist"},
+      {{{"a/b", text}, {"a//b", text}}, {}, ""},
+      // What is no file of the pack is in nobody's way, and what was there before waits until it is reverted.
+      {{{"n/m", text}}, {{FileDiff::Removed{"n"}}}, "room"},
+      {{{"n", std::nullopt}}, {added("n"), added("n/m")}, "room"},
+      {{{"other", text}}, {added("n"), added("n/m")}, "room"},
+      {{{"Manifest", text}, {"bare.delt", text}, {"n", text}, {"n-", text}, {"n.m", text}}, {}, "room"},
+  };
+  for (const auto& [edits, before, place] : cases) {
+    const auto error = errorOf([&] { updated(edits, before); });
+    if (place == "room") {
+      EXPECT_FALSE(error) << edits.begin()->first;
+      continue;
+    }
+    ASSERT_TRUE(error) << edits.begin()->first;
+    EXPECT_EQ(error->code(), static_cast<int>(DiffErrorCode::CriticalDiffPackValidationError));
+    const auto words = ErrorObject(*error).localizedDescription();
+    const auto reason = place.empty() ? "edited twice" : "both need \"" + place + "\"";
+    EXPECT_NE(words.find(reason), std::string::npos) << words;
+  }
+}
+
+TEST_F(UpdatingUserEdits, APackIsReadBackBeforeItIsWritten) {
+  const auto checked = [&](std::vector<FileDiff> updates) {
+    return failure([&] { checkedFileWrapper(packOf(directory_.url(), std::move(updates))); });
+  };
+  const Data old("old"s), text("text"s);
+  EXPECT_EQ(
+      checked(
+          {{FileDiff::Replaced{"binary", text}}, {FileDiff::Modified{"bare"}}, {FileDiff::Added{"a", old}}}),
+      "");
+  for (const auto& updates : std::vector<std::vector<FileDiff>>{
+           // The first counts, and the last is what would be in the file.
+           {{FileDiff::Added{"a", text}}, {FileDiff::Added{"a", old}}},
+           // A learner's file that couldn't be read, with the authored one in its place.
+           {{FileDiff::Replaced{"bare"}}},
+           {{FileDiff::Added{"a", text}}, {FileDiff::Added{"a/b", old}}},
+           {{FileDiff::Added{"Manifest.plist", text}}},
+       }) {
+    EXPECT_TRUE(checked(updates).starts_with("Error(domain: Diff, code: 5, ")) << updates[0].filePath();
+  }
+}
+
+/// A pack of which nothing can be read goes out of the way, and nothing is ever removed.
+TEST(UserEditsPlace, SetsAsideWhatCantBeRead) {
+  const TemporaryDirectory directory;
+  const auto url = directory.url();
+  const auto edits = directory.path() / "Edits";
+  EXPECT_EQ(thrown<ErrorObject>([&] {
+              goodBook().writeTo(directory.path());
+              setUserEditsAside(url);
+            }).code(),
+            ENOENT);
+  for (const auto& name :
+       {"UserEdits.aside.diffpack", "UserEdits.aside-2.diffpack", "UserEdits.aside-3.diffpack"}) {
+    Tree{{"Edits/UserEdits.diffpack/mine", std::string(name)}}.writeTo(directory.path());
+    EXPECT_NE(failure([&] { MarletBookSnapshot(FileWrapper(url), url); }), "");
+    EXPECT_NO_THROW(MarletBookSnapshot(withoutUserEdits(FileWrapper(url)), url));
+    EXPECT_EQ(setUserEditsAside(url), "Edits/"s + name);
+    EXPECT_EQ(FileManager::readFile(directory.url("Edits/"s + name + "/mine")).view(), name);
+    EXPECT_NO_THROW(MarletBookSnapshot(FileWrapper(url), url));
+  }
+  packOf(url).fileWrapper().write(directory.url("Edits/UserEdits.diffpack"));
+  EXPECT_EQ(thrown<ErrorObject>([&] { setUserEditsAside(url); }).domain(), DiffErrorDomain);
+  EXPECT_TRUE(std::filesystem::exists(edits / "UserEdits.diffpack"));
 }
 
 TEST_F(UpdatingUserEdits, TakesThePlaceOfTheFirstEntryOfThatPath) {

@@ -15,8 +15,11 @@ namespace {
 
 class BookCheck {
  public:
-  explicit BookCheck(const Document& document)
-      : document_(document), book_(document.wrapper, document.url, pack_) {}
+  /// The book opens as authored; its pages do with what can be read of the learner's pack, if there is one.
+  BookCheck(const Document& document, std::optional<DiffPackSnapshot> pack)
+      : document_(document),
+        pack_(std::move(pack)),
+        book_(withoutUserEdits(document.wrapper), document.url) {}
 
   std::vector<Problem> run() && {
     checkImage("book", "Contents", book_.imageReference);
@@ -99,14 +102,41 @@ class BookCheck {
   std::vector<Problem> problems_;
 };
 
+/// Reads what can be read of the learner's pack, which is not to hide what else is wrong.
+std::optional<DiffPackSnapshot> readPack(const Document& document, std::vector<Problem>& problems) {
+  const auto directory = userEditsIn(document.wrapper);
+  if (!directory) return std::nullopt;
+  const auto contents = document.url.appendingPathComponent("Contents", true);
+  const auto add = [&](const Error& error, const std::string& suggestion) -> Problem& {
+    problems.push_back(problemOfBookLoad(error));
+    problems.back().recoverySuggestion = suggestion;
+    return problems.back();
+  };
+  try {
+    const PartialDiffPack pack(*directory, contents);
+    for (const auto& entry : pack.unreadable) {
+      auto& problem = add(*entry.error, "`marlet edit --revert` takes it back.");
+      problem.description = entry.filePath + ": " + problem.description;
+    }
+    return pack.pack;
+  } catch (const Error& error) {
+    add(error, "`marlet edit --set-aside` puts the pack aside, so that the book opens.");
+    return DiffPackSnapshot(DiffPackType::UserEditPack, DiffPackDocumentType::MarletBook, contents, "", "",
+                            "", {});
+  }
+}
+
 }  // namespace
 
 std::vector<Problem> problemsOfBook(const Document& document) {
+  std::vector<Problem> problems;
   try {
-    return BookCheck(document).run();
+    auto found = BookCheck(document, readPack(document, problems)).run();
+    problems.insert(problems.end(), found.begin(), found.end());
   } catch (const Error& error) {
-    return {problemOfBookLoad(error)};
+    problems.push_back(problemOfBookLoad(error));
   } catch (const FatalProblem& fatal) {
-    return {problemOfFatalError(fatal.message)};
+    problems.push_back(problemOfFatalError(fatal.message));
   }
+  return problems;
 }

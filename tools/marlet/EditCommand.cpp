@@ -6,7 +6,7 @@
 #include "Book.h"
 #include "Hunks.h"
 #include "JSON.h"
-
+#include "MarletFoundation/DiffPack/PackPaths.h"
 #include "MarletFoundation/Platform/Text.h"
 
 using namespace MarletFoundation;
@@ -38,16 +38,17 @@ UserEdits readEdits(const std::vector<std::string>& settings, const std::vector<
   return edits;
 }
 
-/// The hunks of an edit of a text that its entry doesn't hold.
-std::vector<DiffDescriptor> droppedHunks(const Book& book, const std::string& file,
-                                         const std::optional<Data>& data,
-                                         const std::optional<FileDiffDescriptor>& entry) {
+/// The hunks of an edit of a text that aren't editable.
+std::vector<DiffDescriptor> droppedHunks(const MendableBook& book, const DiffPackSnapshot& pack,
+                                         const std::string& file, const std::optional<Data>& data) {
   const auto authored = mergedUserEdit(makeUserEditDiffPack(book.snapshot, book.contentsUrl()), file);
   const auto original = authored ? utf16FromUTF8(authored->view()) : std::nullopt;
   const auto edited = data ? utf16FromUTF8(data->view()) : std::nullopt;
   if (!original || !edited) return {};
   auto hunks = userEditHunks(*original, *edited);
-  const auto kept = entry ? hunksOf(*entry) : MarletDiff::DiffDescriptors();
+  const auto valid =
+      UserEditDiffPackValidator(pack).validatedUpdate({FileDiffDescriptor::Modified{file, hunks}}, *original);
+  const auto kept = valid ? hunksOf(*valid) : MarletDiff::DiffDescriptors();
   // Both lists are in the same order.
   const auto* next = kept.begin();
   std::erase_if(hunks, [&](const DiffDescriptor& hunk) {
@@ -58,18 +59,55 @@ std::vector<DiffDescriptor> droppedHunks(const Book& book, const std::string& fi
   return hunks;
 }
 
-void write(const Book& book, const DiffPackSnapshot& pack) {
-  auto root = book.document.wrapper;
-  auto edits = root.child("Edits");
-  if (!edits) {
-    edits = FileWrapper::directory();
-    edits->setPreferredFilename("Edits");
-    root.addFileWrapper(*edits);
+/// What can't be read would be gone from a pack that is written anew, unless it is named.
+void requireNothingElseUnreadable(const MendableBook& book, const UserEdits& edits) {
+  for (const auto& entry : book.unreadable()) {
+    const auto names = [&](const auto& edit) { return plainPath(edit.first) == plainPath(entry.filePath); };
+    if (std::any_of(edits.begin(), edits.end(), names)) continue;
+    const auto mended =
+        "Take it back with --revert " + entry.filePath + ", or put the pack aside with --set-aside.";
+    throw CommandFailure{ExitStatus::negative,
+                         book.document.path + ": " + entry.filePath +
+                             " can't be read from the learner's pack: " + wordsOf(*entry.error) +
+                             suggested(wordsOf(*entry.error), mended)};
   }
-  auto wrapper = pack.fileWrapper();
-  wrapper.setPreferredFilename("UserEdits.diffpack");
-  edits->addFileWrapper(std::move(wrapper));
-  orFailWith(ExitStatus::failedWrite, book.document.path, [&] { root.write(book.document.url); });
+}
+
+/// Opens the book, saves the edits and writes it. Saving again what was saved changes nothing, so this may run more
+/// than once.
+std::vector<SavedEdit> save(const MendableBook& book, const UserEdits& edits) {
+  requireNothingElseUnreadable(book, edits);
+  const auto pack = updatedUserEditDiffPack(book.userEditPack(), edits);
+  std::vector<SavedEdit> saved;
+  for (const auto& [path, data] : edits) {
+    const auto file = plainPath(path);
+    const auto* entry = pack.updates.first(file);
+    saved.push_back(
+        {file, entry ? std::optional(*entry) : std::nullopt, droppedHunks(book, pack, file, data)});
+  }
+  setUserEdits(book.document.wrapper, checkedFileWrapper(pack));
+  orFailWith(ExitStatus::failedWrite, book.document.path,
+             [&] { book.document.wrapper.write(book.document.url); });
+  return saved;
+}
+
+ExitStatus setAside(const std::string& path, bool asJSON) {
+  const auto document = openBookDocument(path);
+  if (!userEditsIn(document.wrapper))
+    throw CommandFailure{ExitStatus::negative, path + ": there are no edits to put aside."};
+  std::string place;
+  try {
+    place = setUserEditsAside(document.url);
+  } catch (const ErrorObject& error) {
+    if (error.domain() != PosixErrorDomain) throw;
+    throw CommandFailure{ExitStatus::failedWrite, path + ": " + wordsWithSuggestion(error)};
+  }
+  if (asJSON) {
+    std::cout << dumped({{"setAside", place}}) << "\n";
+  } else {
+    std::cout << "Set aside: " << printable(place) << "\n";
+  }
+  return ExitStatus::good;
 }
 
 void print(const SavedEdit& saved, const Terminal& terminal) {
@@ -84,25 +122,15 @@ void print(const SavedEdit& saved, const Terminal& terminal) {
 
 }  // namespace
 
-ExitStatus edit(const std::string& path, const std::vector<std::string>& settings,
-                const std::vector<std::string>& reverted, bool asJSON, const Terminal& terminal) {
+ExitStatus edit(const std::string& path, const EditOptions& options, const Terminal& terminal) {
   return guarded(path, terminal, [&] {
-    const auto edits = readEdits(settings, reverted);
-    // Saving again what was saved changes nothing, so this may run more than once.
-    const auto result = withBook(path, [&](const Book& book) {
-      const auto pack = updatedUserEditDiffPack(book.userEditPack(), edits);
-      std::vector<SavedEdit> saved;
-      for (const auto& [file, data] : edits) {
-        const auto* entry = pack.updates.first(file);
-        saved.push_back({file, entry ? std::optional(*entry) : std::nullopt, {}});
-        saved.back().dropped = droppedHunks(book, file, data, saved.back().entry);
-      }
-      write(book, pack);
-      return saved;
-    });
+    if (options.setAside) return setAside(path, options.asJSON);
+    const auto edits = readEdits(options.settings, options.reverted);
+    const auto result =
+        withBook<MendableBook>(path, [&](const MendableBook& book) { return save(book, edits); });
     auto list = ordered_json::array();
     for (const auto& saved : result) {
-      if (!asJSON) {
+      if (!options.asJSON) {
         print(saved, terminal);
         continue;
       }
@@ -112,7 +140,7 @@ ExitStatus edit(const std::string& path, const std::vector<std::string>& setting
            {"kept", hunksJSON(saved.entry ? hunksOf(*saved.entry) : MarletDiff::DiffDescriptors())},
            {"dropped", hunksJSON(saved.dropped)}});
     }
-    if (asJSON) std::cout << dumped(list) << "\n";
+    if (options.asJSON) std::cout << dumped(list) << "\n";
     return ExitStatus::good;
   });
 }

@@ -21,7 +21,8 @@ ExitStatus printLearnerText(const std::string& path, const std::string& file, co
 
 ExitStatus listEdits(const std::string& path, bool asJSON, const Terminal& terminal) {
   return guarded(path, terminal, [&] {
-    const auto pack = withBook(path, [](const Book& book) { return book.userEditPack(); });
+    const auto [pack, unreadable] = withBook<MendableBook>(
+        path, [](const MendableBook& book) { return std::pair(book.userEditPack(), book.unreadable()); });
     auto list = ordered_json::array();
     for (const auto& entry : pack.updates) {
       const auto count = hunksOf(entry).size();
@@ -33,7 +34,16 @@ ExitStatus listEdits(const std::string& path, bool asJSON, const Terminal& termi
                   << (isModified ? ", " + counted(count, "hunk") : "") << "\n";
       }
     }
+    for (const auto& entry : unreadable) {
+      const auto words = wordsWithSuggestion(*entry.error);
+      if (asJSON) {
+        list.push_back({{"file", entry.filePath}, {"kind", entry.section}, {"hunks", 0}, {"error", words}});
+      } else {
+        std::cout << entry.section << " " << printable(entry.filePath)
+                  << ", can't be read: " << printable(words) << "\n";
+      }
+    }
     if (asJSON) std::cout << dumped(list) << "\n";
-    return ExitStatus::good;
+    return unreadable.empty() ? ExitStatus::good : ExitStatus::negative;
   });
 }

@@ -197,17 +197,26 @@ int run(int argc, char** argv) {
   applyCommand->add_flag("--json", applyOptions.asJSON, "Report as JSON");
   applyCommand->callback([&] { status = apply(path, pack, applyOptions, terminal); });
 
-  std::vector<std::string> settings, reverted;
+  EditOptions editOptions;
   auto* editCommand = app.add_subcommand("edit", "Save files as the learner's edits");
   editCommand->add_option("BOOK", path, "The book")->required()->type_name("DIR");
-  editCommand->add_option("--set", settings, "A path below Contents and the file that holds its edited text")
-      ->type_name("PATH=FILE")
-      ->allow_extra_args(false);
-  editCommand->add_option("--revert", reverted, "A path below Contents to take back to its authored text")
-      ->type_name("PATH")
-      ->allow_extra_args(false);
-  editCommand->add_flag("--json", asJSON, "Report as JSON");
-  editCommand->callback([&] { status = edit(path, settings, reverted, asJSON, terminal); });
+  auto* setOption = editCommand
+                        ->add_option("--set", editOptions.settings,
+                                     "A path below Contents and the file that holds its edited text")
+                        ->type_name("PATH=FILE")
+                        ->allow_extra_args(false);
+  auto* revertOption = editCommand
+                           ->add_option("--revert", editOptions.reverted,
+                                        "A path below Contents to take back to its authored text")
+                           ->type_name("PATH")
+                           ->allow_extra_args(false);
+  editCommand
+      ->add_flag("--set-aside", editOptions.setAside,
+                 "Rename edits that can't be read, so that the book opens")
+      ->excludes(setOption)
+      ->excludes(revertOption);
+  editCommand->add_flag("--json", editOptions.asJSON, "Report as JSON");
+  editCommand->callback([&] { status = edit(path, editOptions, terminal); });
 
   std::string file;
   auto* textCommand = app.add_subcommand("text", "Print a file as the learner sees it");
