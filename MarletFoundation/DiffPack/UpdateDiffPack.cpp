@@ -4,24 +4,21 @@
 #include "MarletFoundation/DiffPack/MarletBookDiffMergeContext.h"
 
 namespace MarletFoundation {
-namespace {
 
-void requireBook(const URL& url) {
+void requireBookDocument(const URL& url) {
   if (url.pathExtension() == "marletbook") return;
   // A merge error also for a pack that isn't made: hosts know the failure by this code.
   throw diffError(DiffErrorCode::CriticalMergeError, "Unrecognized document format " + url.absoluteString());
 }
 
-}  // namespace
-
 DiffPackSnapshot makeUpdateDiffPack(const URL& originalUrl, const URL& updatedUrl) {
-  requireBook(originalUrl);
-  requireBook(updatedUrl);
+  requireBookDocument(originalUrl);
+  requireBookDocument(updatedUrl);
   return MarletBookDiffContext(originalUrl, updatedUrl).generateDiffPack();
 }
 
 void applyUpdateDiffPack(const URL& documentUrl, const DiffPackSnapshot& diffPack) {
-  requireBook(documentUrl);
+  requireBookDocument(documentUrl);
   MarletBookDiffMergeContext(documentUrl).mergeDiffPack(diffPack);
 }
 

@@ -40,8 +40,10 @@ class Application {
   }
 
  private:
+  /// Opens the book, applies the update in memory, looks at what came of it, and writes it. May run again.
   void attempt() {
     const auto url = withBook(path_, [&](const Book& book) {
+      requireBookDocument(book.document.url);
       if (!options_.force) requireMeantFor(book.snapshot);
       preview_.emplace(book, update_);
       return book.document.url;
@@ -51,11 +53,14 @@ class Application {
           ExitStatus::negative,
           path_ + ": the update and the learner's edits change the same text. Nothing was changed."};
     }
-    const MarletBookDiffMergeContext context(url);
-    const auto merged = context.mergedDocument(update_);
+    const auto merged = checkedUpdate(url, update_);
+    preview_->take(merged.conflicts);
+    // No flag waives this: it is about the learner's work, and not about what the update is meant for.
+    if (!merged.conflicts.empty())
+      throw CommandFailure{ExitStatus::negative, path_ + ": " + description(merged.conflicts)};
     if (options_.isDryRun) return;
     if (options_.backup) backUp(url);
-    orFailWith(ExitStatus::failedWrite, path_, [&] { merged.write(url); });
+    orFailWith(ExitStatus::failedWrite, path_, [&] { merged.document.write(url); });
     isApplied_ = true;
   }
 
@@ -84,16 +89,18 @@ class Application {
   }
 
   void printJSON() const {
-    auto files = ordered_json::array(), edits = ordered_json::array();
+    auto files = ordered_json::array(), edits = ordered_json::array(), conflicts = ordered_json::array();
     if (preview_) {
       for (const auto& file : preview_->files) files.push_back(json(file));
       for (const auto& edit : preview_->edits) edits.push_back(json(edit));
+      for (const auto& conflict : preview_->conflicts) conflicts.push_back(json(conflict));
     }
     std::cout << dumped({{"applied", isApplied_},
                          {"baseVersion", update_.baseVersion},
                          {"updateVersion", update_.updateVersion},
                          {"files", std::move(files)},
                          {"edits", std::move(edits)},
+                         {"conflicts", std::move(conflicts)},
                          {"error", error_ ? ordered_json(*error_) : ordered_json(nullptr)}})
               << "\n";
   }
@@ -114,6 +121,9 @@ class Application {
         std::cout << "the update has:\n";
         printMarked('+', edit.conflict->update, Style::green, terminal_);
       }
+      for (const auto& conflict : preview_->conflicts)
+        std::cout << "Conflict at " << printable(conflict.file) << ": " << printable(wordsOf(conflict))
+                  << "\n";
     }
     if (error_) return;
     std::cout << (options_.isDryRun ? "Would be applied: " : "Applied: ") << printable(update_.description())

@@ -1,6 +1,7 @@
 #include "UpdatePreview.h"
 
 #include <algorithm>
+#include <set>
 
 #include "Hunks.h"
 #include "MarletDiff/ContentMerge.h"
@@ -72,6 +73,23 @@ bool UpdatePreview::hasConflict() const {
   return std::any_of(edits.begin(), edits.end(), [](const Edit& edit) { return edit.conflict.has_value(); });
 }
 
+void UpdatePreview::take(std::vector<UpdateConflict> found) {
+  conflicts = std::move(found);
+  std::set<std::string_view> unfitting;
+  for (const auto& conflict : conflicts) {
+    if (conflict.kind == UpdateConflict::Kind::DoesNotFitEdit) unfitting.insert(conflict.file);
+  }
+  for (auto& edit : edits) {
+    if (unfitting.contains("Contents/" + edit.file)) edit.state = Edit::State::conflict;
+  }
+}
+
+std::string wordsOf(const UpdateConflict& conflict) {
+  std::string words(conflict.reason());
+  if (conflict.error) words += ": " + wordsWithSuggestion(*conflict.error);
+  return words;
+}
+
 std::string_view stateName(Edit::State state) {
   static constexpr std::string_view names[] = {"kept", "rebased", "conflict"};
   return names[static_cast<int>(state)];
@@ -90,4 +108,12 @@ ordered_json json(const Edit& edit) {
                 {"update", edit.conflict->update}};
   }
   return {{"file", edit.file}, {"state", stateName(edit.state)}, {"conflict", std::move(conflict)}};
+}
+
+ordered_json json(const UpdateConflict& conflict) {
+  static constexpr std::string_view kinds[] = {"alreadyApplied", "doesNotOpen", "losesLearnersFile",
+                                               "doesNotFitEdit"};
+  return {{"kind", kinds[static_cast<int>(conflict.kind)]},
+          {"file", conflict.file},
+          {"reason", wordsOf(conflict)}};
 }
