@@ -9,6 +9,7 @@
 #include <functional>
 
 #include "MarletFoundation/Platform/ErrorObject.h"
+#include "MarletFoundation/Platform/LinkProtection.h"
 #include "support/Tree.h"
 
 namespace MarletFoundation::test {
@@ -28,6 +29,24 @@ int errorOf(Action action) {
     return error.code();
   }
   return 0;
+}
+
+TEST(FileManager, LinksOfOthersInDirectoriesOpenToAllAreNotFollowed) {
+  constexpr uid_t we = 1000, owner = 1001, stranger = 1002;
+  const struct {
+    mode_t mode;
+    uid_t link;
+    bool mayFollow;
+  } rows[] = {{01777, stranger, false}, {01777, we, true},      {01777, owner, true},
+              {01002, stranger, false}, {0777, stranger, true}, {01775, stranger, true}};
+  for (const auto& row : rows) {
+    struct stat directory {
+    }, link{};
+    directory.st_mode = S_IFDIR | row.mode;
+    directory.st_uid = owner;
+    link.st_uid = row.link;
+    EXPECT_EQ(mayFollowLink(directory, link, we), row.mayFollow) << std::oct << row.mode << " " << row.link;
+  }
 }
 
 TEST(FileManager, RelationshipGoesByTheItemsThemselves) {
