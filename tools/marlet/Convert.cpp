@@ -1,11 +1,11 @@
 #include "Convert.h"
 
 #include <algorithm>
-#include <set>
 
 #include "ConvertedBook.h"
 #include "Document.h"
 #include "Guarded.h"
+#include "LeftOut.h"
 #include "MarletFoundation/MarletFoundation.h"
 #include "Writing.h"
 
@@ -40,29 +40,19 @@ FileWrapper currentForm(const MarletSnapshot& marlet, const std::string& path, c
   return tree;
 }
 
-/// What lies in the document without being part of it, and so isn't carried over: directories that its version has
-/// none of, and pages that its list doesn't name.
-std::vector<std::string> leftOut(const Document& document, const MarletSnapshot& marlet) {
-  std::vector<std::optional<URL>> carried{marlet.sharedSourcesDirectoryURL,
-                                          marlet.sharedResourcesDirectoryURL};
-  std::set<std::string> filenames;
-  for (const auto& page : marlet.pages) {
-    carried.insert(carried.end(), {page.sourcesDirectoryURL(), page.resourcesDirectoryURL()});
-    filenames.insert(page.filename());
-  }
-  std::vector<std::string> names;
-  for (const auto name : {SourcesDirectoryName, ResourcesDirectoryName}) {
-    const auto url = document.url.appendingPathComponent(name, true);
-    if (document.wrapper.child(name) && std::find(carried.begin(), carried.end(), url) == carried.end())
-      names.emplace_back(name);
-  }
-  const auto pages = document.wrapper.child("Pages");
-  const auto children = pages ? pages->fileWrappers() : std::nullopt;
-  if (!children) return names;
-  for (const auto& [name, page] : *children) {
-    if (page.isDirectory() && !filenames.contains(name)) names.push_back("Pages/" + name);
-  }
-  return names;
+/// Replacing a document by itself in another form must keep all that lies in it, and replacing what it lies in nothing.
+void requireNothingLost(const Document& document, const std::vector<std::string>& leftOut,
+                        const URL& output) {
+  if (!FileManager::fileExists(output)) return;
+  const auto relationship = orFailWith(ExitStatus::unreadablePath, document.path,
+                                       [&] { return FileManager::relationship(output, document.url); });
+  if (relationship == FileManager::Relationship::contains)
+    refuse(document.path, "It lies in what would be replaced: " + output.path());
+  if (relationship == FileManager::Relationship::other || leftOut.empty()) return;
+  std::string names;
+  for (const auto& name : leftOut) names += (names.empty() ? "" : ", ") + name;
+  refuse(document.path,
+         "What isn't part of the document would be lost: " + names + ". Convert it under another name.");
 }
 
 std::string counted(std::size_t number, const std::string& noun) {
@@ -88,15 +78,18 @@ ExitStatus convert(const std::string& path, const std::string& output, bool forc
     manifest.parse();
     const auto version =
         std::to_string(manifest.majorVersion()) + "." + std::to_string(manifest.minorVersion());
-    terminal.note(printable("read " + path + ": version " + version + ", " +
-                            (manifest.didJoinSections() ? "its sections joined in one page"
-                                                        : counted(marlet.pages.size(), "page"))));
+    terminal.note("read " + path + ": version " + version + ", " +
+                  (manifest.didJoinSections() ? "its sections joined in one page"
+                                              : counted(marlet.pages.size(), "page")));
     const auto tree = makesBook ? bookOfMarlet(marlet, path, url) : currentForm(marlet, path, url);
-    for (const auto& name : leftOut(document, marlet))
-      terminal.complain(printable(path + ": left out, since it is no part of the document: " + name));
-    writeTree(tree, url, force ? ExistingItem::Replaced : ExistingItem::Kept);
+    const auto others = leftOut(document, marlet);
+    requireNothingLost(document, others, url);
+    for (const auto& name : others)
+      terminal.complain(path + ": left out, since it is no part of the document: " + name);
     const std::string form = makesBook ? "a book" : marlet.isSinglePage() ? "version 5.0" : "version 6.0";
-    terminal.note(printable("wrote " + output + ": " + form + ", " + counted(marlet.pages.size(), "page")));
+    const auto done = "wrote " + output + ": " + form + ", " + counted(marlet.pages.size(), "page");
+    writeTree(tree, url, force ? ExistingItem::Replaced : ExistingItem::Kept);
+    terminal.note(done);
     return ExitStatus::good;
   });
 }
