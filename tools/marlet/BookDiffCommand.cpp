@@ -1,9 +1,11 @@
 #include "BookDiffCommand.h"
 
+#include <algorithm>
 #include <filesystem>
 #include <iostream>
 #include <set>
 
+#include "Ending.h"
 #include "Guarded.h"
 #include "Hunks.h"
 #include "JSON.h"
@@ -56,21 +58,49 @@ void requireNoLinks(const DiffPackSnapshot& pack, const URL& updated) {
   }
 }
 
-/// A former pack may be replaced, but nothing else.
-void requireNothingButAPackAt(const URL& url) {
-  const std::filesystem::path place = url.path();
-  if (!std::filesystem::exists(place / "Manifest.plist")) requireNothingAt(place);
+bool isUpdate(const URL& url) {
+  try {
+    return DiffPackSnapshot(FileWrapper(url), url).diffPackType == DiffPackType::UpdatePack;
+  } catch (const Error&) {
+    return false;
+  }
 }
 
-void writePack(const DiffPackSnapshot& pack, const URL& updated, const std::string& output) {
-  const auto url = URL::file(output, true).standardized();
+/// A former update may be replaced, but nothing else, and least of all what a learner has.
+void requireNothingButAnUpdateAt(const URL& url, const std::string& output) {
+  if (!isUpdate(url)) requireNothingAt(output);
+}
+
+/// A book is no place for a pack, under whatever name its directories are reached.
+void requireOutsideOfBooks(const std::string& output, const std::vector<URL>& books) {
+  std::error_code unknown;
+  auto place = std::filesystem::weakly_canonical(output, unknown);
+  const auto isBook = [&](const std::filesystem::path& directory) {
+    return directory.extension() == ".marletbook" ||
+           std::any_of(books.begin(), books.end(), [&](const URL& book) {
+             return std::filesystem::equivalent(directory, book.path(), unknown);
+           });
+  };
+  for (auto directory = place.parent_path(); directory.has_relative_path();
+       directory = directory.parent_path()) {
+    if (isBook(directory))
+      throw CommandFailure{ExitStatus::failedWrite,
+                           output + ": this lies in a book. Give the pack another place."};
+  }
+}
+
+/// Where the pack is to be written, if it can be.
+URL requiredPlace(const DiffPackSnapshot& pack, const URL& original, const URL& updated,
+                  const std::string& output) {
+  auto url = URL::file(output, true).standardized();
   if (url.pathExtension() != "diffpack") {
     throw CommandFailure{ExitStatus::wrongUsage, output + ": a pack's name ends in .diffpack."};
   }
   requireNoCollision(pack);
   requireNoLinks(pack, updated);
-  requireNothingButAPackAt(url);
-  orFailWith(ExitStatus::failedWrite, output, [&] { pack.fileWrapper().write(url); });
+  requireOutsideOfBooks(url.path(), {original, updated});
+  requireNothingButAnUpdateAt(url, output);
+  return url;
 }
 
 ordered_json json(const DiffPackSnapshot& pack) {
@@ -112,11 +142,18 @@ ExitStatus diffBooks(const std::string& original, const std::string& updated, co
     const auto originalUrl = urlOf(original);
     const auto updatedUrl = urlOf(updated);
     const auto pack = makeUpdateDiffPack(originalUrl, updatedUrl);
-    if (options.output) writePack(pack, updatedUrl, *options.output);
+    const auto place = options.output
+                           ? std::optional(requiredPlace(pack, originalUrl, updatedUrl, *options.output))
+                           : std::nullopt;
     if (options.asJSON) {
       std::cout << dumped(json(pack)) << "\n";
     } else if (!options.output || options.withHunks) {
       print(pack, options.withHunks, terminal);
+    }
+    if (place) {
+      const auto tree = pack.fileWrapper();
+      requirePrinted();
+      commit(*options.output, [&] { tree.write(*place); });
     }
     return options.exitCode && !pack.updates.empty() ? ExitStatus::negative : ExitStatus::good;
   });
