@@ -1,7 +1,9 @@
 /// Preloaded into a command, lets one of its calls to the file system go wrong. $FAULT_AT counts the calls that
 /// can go wrong so, from 1; $FAULT is `error` (EIO), `short` (a write of one byte less) or `exit` (the process
-/// ends ahead of the call), or `hold`: the call waits for $FAULT_FOR ms, else 30, and so does each $FAULT_EVERYth. $NO_EXCHANGE makes the file system one that can't exchange two names. The number of
-/// calls made goes to $FAULT_COUNT, a file.
+/// ends ahead of the call), or `hold`: the call waits for $FAULT_FOR ms, else 30, and so does each $FAULT_EVERYth.
+/// $NO_EXCHANGE makes the file system one that can't exchange two names. The number of calls made goes to
+/// $FAULT_COUNT, a file. $STARVE leaves no descriptor to open once two names were exchanged. With `memory` for $FAULT no
+/// allocation succeeds from the one at $FAULT_AT on, counted from the start of `main`.
 
 #include <dlfcn.h>
 #include <fcntl.h>
@@ -13,6 +15,7 @@
 #include <atomic>
 #include <cerrno>
 #include <chrono>
+#include <csignal>
 #include <cstdio>
 #include <cstdlib>
 #include <string_view>
@@ -25,6 +28,9 @@ using namespace std::string_view_literals;
 namespace {
 
 std::atomic<long> counted = 0;
+bool isStarved = false;
+bool isStarted = false;
+std::atomic<long> allocated = 0;
 
 const char* setting(const char* name) {
   const char* value = std::getenv(name);
@@ -42,7 +48,7 @@ enum class Call { look, change, write };
 /// change after it.
 bool counts(Call call) {
   static const std::string_view fault = setting("FAULT");
-  return fault == "short" ? call == Call::write : fault == "exit" ? call != Call::look : true;
+  return fault == "short" ? call == Call::write : fault == "exit" ? call != Call::look : fault == "error";
 }
 
 bool isHeld(long number) {
@@ -135,7 +141,9 @@ INTERPOSED int renameat2(int from, const char* path, int to, const char* name, u
     errno = EINVAL;
     return -1;
   }
-  return original(from, path, to, name, flags);
+  const int result = original(from, path, to, name, flags);
+  if (result == 0 && (flags & RENAME_EXCHANGE) != 0 && *setting("STARVE")) isStarved = true;
+  return result;
 }
 
 INTERPOSED ssize_t write(int file, const void* bytes, size_t size) {
@@ -147,12 +155,42 @@ INTERPOSED ssize_t write(int file, const void* bytes, size_t size) {
   return original(file, bytes, size);
 }
 
+/// The command's first call of all.
+INTERPOSED sighandler_t signal(int number, sighandler_t handler) {
+  static const auto original = next(&::signal, "signal");
+  isStarted = setting("FAULT") == "memory"sv;
+  return original(number, handler);
+}
+
+namespace {
+
+bool hasMemory() {
+  if (!isStarted) return true;
+  static const long at = std::atol(setting("FAULT_AT"));
+  if (++allocated < at) return true;
+  errno = ENOMEM;
+  return false;
+}
+
+}  // namespace
+
+extern "C" void *__libc_malloc(size_t), *__libc_calloc(size_t, size_t), *__libc_realloc(void*, size_t);
+INTERPOSED void* malloc(size_t size) { return hasMemory() ? __libc_malloc(size) : nullptr; }
+INTERPOSED void* calloc(size_t count, size_t size) {
+  return hasMemory() ? __libc_calloc(count, size) : nullptr;
+}
+INTERPOSED void* realloc(void* old, size_t size) { return hasMemory() ? __libc_realloc(old, size) : nullptr; }
+
 INTERPOSED int open(const char* path, int flags, ...) {
   static const auto original = next(&::open, "open");
   va_list arguments;
   va_start(arguments, flags);
   const auto mode = va_arg(arguments, mode_t);
   va_end(arguments);
+  if (isStarved) {
+    errno = EMFILE;
+    return -1;
+  }
   return isFaulty((flags & O_CREAT) != 0 ? Call::change : Call::look) && isError()
              ? fail<int>()
              : original(path, flags, mode);
@@ -164,6 +202,10 @@ INTERPOSED int openat(int directory, const char* path, int flags, ...) {
   va_start(arguments, flags);
   const auto mode = va_arg(arguments, mode_t);
   va_end(arguments);
+  if (isStarved) {
+    errno = EMFILE;
+    return -1;
+  }
   return isFaulty((flags & O_CREAT) != 0 ? Call::change : Call::look) && isError()
              ? fail<int>()
              : original(directory, path, flags, mode);

@@ -3,6 +3,7 @@
 #include <iostream>
 
 #include "Book.h"
+#include "Ending.h"
 #include "Hunks.h"
 #include "JSON.h"
 #include "UpdatePreview.h"
@@ -60,7 +61,7 @@ class Application {
       throw CommandFailure{ExitStatus::negative, path_ + ": " + description(merged.conflicts)};
     if (options_.isDryRun) return;
     if (options_.backup) backUp(url);
-    orFailWith(ExitStatus::failedWrite, path_, [&] { merged.document.write(url); });
+    commit(path_, [&] { merged.document.write(url); });
     isApplied_ = true;
   }
 

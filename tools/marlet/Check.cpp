@@ -91,7 +91,7 @@ ExitStatus check(const std::vector<std::string>& paths, bool asJSON, const Termi
   std::vector<Report> reports;
   for (const auto& path : paths) {
     reports.push_back(report(path));
-    if (terminal.verbose) terminal.note(printable(path) + ": " + reports.back().kind);
+    if (terminal.verbose) terminal.note(path + ": " + reports.back().kind);
     if (!asJSON) {
       for (const auto& problem : reports.back().problems) print(reports.back(), problem, terminal);
     }

@@ -5,8 +5,10 @@
 #include <csignal>
 #include <iostream>
 
+#include "ErrorWords.h"
 #include "MarletFoundation/MarletFoundation.h"
 #include "MarletFoundation/Platform/Digest.h"
+#include "SafeOutput.h"
 
 using namespace MarletFoundation;
 
@@ -54,9 +56,9 @@ ExitStatus printDigests(const std::vector<std::string>& paths, bool isSHA1, cons
   for (const auto& path : paths) {
     complaint = "marlet: " + printable(path) + ": it can't be read to its end.\n";
     try {
-      std::cout << line(digest(URL::file(path), isSHA1), path) << std::flush;
+      printText(line(digest(URL::file(path), isSHA1), path));
     } catch (const Error& error) {
-      terminal.complain(printable(path + ": " + ErrorObject(error).localizedDescription()));
+      terminal.complain(path + ": " + wordsOf(error));
       status = ExitStatus::unreadablePath;
     }
   }

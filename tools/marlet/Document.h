@@ -2,6 +2,7 @@
 
 #include <string>
 
+#include "Ending.h"
 #include "MarletFoundation/Platform/FileWrapper.h"
 
 enum class DocumentKind { book, classic, unknown };
@@ -18,13 +19,16 @@ struct Document {
 };
 
 /// What `use` makes of the document that `open` opens. One that another process replaces meanwhile is opened
-/// again, so that the answer is about the old one or the new one and no mixture; `use` may thus run more than once.
+/// again, so that the answer is about the old one or the new one and no mixture; `use` may thus run more than once,
+/// but never again after its change is made.
 template <class Open, class Use>
 auto withSettled(Open open, Use use) {
   constexpr int mostAttempts = 1000;
   for (int attempt = 1;; ++attempt) {
     const Document document = open();
-    const auto isSettled = [&] { return !document.wrapper.wasReplaced() || attempt == mostAttempts; };
+    const auto isSettled = [&] {
+      return isChangeMade() || !document.wrapper.wasReplaced() || attempt == mostAttempts;
+    };
     try {
       auto result = use(document);
       if (isSettled()) return result;

@@ -4,6 +4,7 @@
 #include <iostream>
 
 #include "Book.h"
+#include "Ending.h"
 #include "Hunks.h"
 #include "JSON.h"
 #include "MarletFoundation/DiffPack/PackPaths.h"
@@ -86,8 +87,7 @@ std::vector<SavedEdit> save(const MendableBook& book, const UserEdits& edits) {
         {file, entry ? std::optional(*entry) : std::nullopt, droppedHunks(book, pack, file, data)});
   }
   setUserEdits(book.document.wrapper, checkedFileWrapper(pack));
-  orFailWith(ExitStatus::failedWrite, book.document.path,
-             [&] { book.document.wrapper.write(book.document.url); });
+  commit(book.document.path, [&] { book.document.wrapper.write(book.document.url); });
   return saved;
 }
 

@@ -1,7 +1,9 @@
 #include "ErrorWords.h"
 
+#include <cerrno>
 #include <map>
 
+#include "Ending.h"
 #include "MarletFoundation/MarletFoundation.h"
 
 using namespace MarletFoundation;
@@ -42,6 +44,7 @@ std::string wordsOfCase(std::string_view name) {
 }  // namespace
 
 std::string wordsOf(const Error& error) {
+  if (error.domain() == PosixErrorDomain && error.code() == ENOMEM) noteOutOfMemory();
   const auto* payload = dynamic_cast<const ErrorPayload*>(&error);
   if (!payload || dynamic_cast<const UserVisibleError*>(&error))
     return ErrorObject(error).localizedDescription();

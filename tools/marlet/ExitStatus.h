@@ -9,9 +9,13 @@ enum class ExitStatus {
   unreadablePath = 3,
   /// Nothing was changed, but for what was extracted before.
   failedWrite = 4,
+  /// What failed came behind the change, which is made.
+  changeMade = 5,
+  /// No answer at all. Nothing was changed, but for what was extracted before.
+  outOfMemory = 6,
 };
 
-/// The statuses in the words of the manual page.
+/// The statuses in the words of the manual page and the help.
 struct ExitStatusWords {
   ExitStatus status;
   const char* words;
@@ -24,4 +28,8 @@ inline constexpr ExitStatusWords exitStatusWords[] = {
     {ExitStatus::wrongUsage, "Wrong usage."},
     {ExitStatus::unreadablePath, "A path can't be read."},
     {ExitStatus::failedWrite, "A write failed; nothing was changed, but for what unzip had extracted."},
+    {ExitStatus::changeMade,
+     "The change is made, but something failed behind it, such as the printing of the report."},
+    {ExitStatus::outOfMemory,
+     "There was not enough memory; nothing was changed, but for what unzip had extracted."},
 };

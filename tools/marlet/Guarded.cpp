@@ -1,9 +1,16 @@
 #include "Guarded.h"
 
+#include <iostream>
+
+#include "Ending.h"
 #include "FatalProblem.h"
 #include "JSON.h"
 
 using namespace MarletFoundation;
+
+void requirePrinted() {
+  if (!std::cout.flush()) throw CommandFailure{ExitStatus::failedWrite, "standard output can't be written."};
+}
 
 ExitStatus guarded(const std::string& path, const Terminal& terminal,
                    const std::function<ExitStatus()>& work) {
@@ -21,6 +28,5 @@ ExitStatus guarded(const std::string& path, const Terminal& terminal,
   } catch (const NotRepresentable& reason) {
     sentence = path + ": " + reason.what();
   }
-  terminal.complain(printable(sentence));
-  return status;
+  return failing(status, sentence, terminal);
 }

@@ -14,9 +14,12 @@ struct CommandFailure {
 };
 
 /// Runs a command's work, and complains about what it throws; a library error or a fatal condition of the
-/// document at `path` ends in `ExitStatus::negative`.
+/// document at `path` ends in `ExitStatus::negative`, all behind a commit in `ExitStatus::changeMade`.
 ExitStatus guarded(const std::string& path, const Terminal& terminal,
                    const std::function<ExitStatus()>& work);
+
+/// Throws `CommandFailure` when the output so far can't be printed: before a change that it reports.
+void requirePrinted();
 
 /// Runs work whose library errors end the command with `status`.
 template <class Work>

@@ -1,9 +1,11 @@
 #include "JSON.h"
 
+#include <algorithm>
 #include <cmath>
 #include <ctime>
 
 #include "MarletFoundation/Utils/Overloaded.h"
+#include "SafeText.h"
 
 using namespace MarletFoundation;
 using nlohmann::ordered_json;
@@ -40,37 +42,101 @@ std::string iso8601(Date date) {
   return std::string(text) + fraction + "Z";
 }
 
+ordered_json jsonOfScalar(const Data& data) { return {{"$data", base64(data.bytes())}}; }
+
+ordered_json jsonOfScalar(const Date& date) { return {{"$date", iso8601(date)}}; }
+
+ordered_json jsonOfScalar(double number) {
+  if (!std::isfinite(number)) throw NotRepresentable("JSON has no form for a number that is not finite.");
+  return number;
+}
+
+template <class Scalar>
+ordered_json jsonOfScalar(const Scalar& scalar) {
+  return scalar;
+}
+
+using Members = std::vector<ordered_json::object_t::value_type>;
+
+/// A value whose JSON is still to be put in its place.
+struct Pending {
+  const PropertyListValue* source;
+  ordered_json* target;
+};
+
+/// An array or object that is being written, and what of it comes next.
+struct Open {
+  const ordered_json* container;
+  ordered_json::const_iterator next;
+};
+
+/// Levels from which on lines move no further to the right, so that deep values stay linear in length.
+constexpr std::size_t deepestIndentation = 512;
+
 }  // namespace
 
 ordered_json json(const PropertyListValue& value) {
-  return std::visit(overloaded{
-                        [](const PropertyListValue::Array& array) {
-                          auto result = ordered_json::array();
-                          for (const auto& element : array) result.push_back(json(element));
-                          return result;
-                        },
-                        [](const PropertyListDictionary& dictionary) {
-                          auto result = ordered_json::object();
-                          for (const auto& [key, element] : dictionary)
-                            result.emplace(std::string(key), json(element));
-                          return result;
-                        },
-                        [](const Data& data) {
-                          return ordered_json{{"$data", base64(data.bytes())}};
-                        },
-                        [](const Date& date) {
-                          return ordered_json{{"$date", iso8601(date)}};
-                        },
-                        [](double number) {
-                          if (!std::isfinite(number))
-                            throw NotRepresentable("JSON has no form for a number that is not finite.");
-                          return ordered_json(number);
-                        },
-                        [](const auto& scalar) { return ordered_json(scalar); },
-                    },
-                    value.payload);
+  ordered_json root;
+  // Not by recursion: a list may be deeper than the stack.
+  std::vector<Pending> pending{{&value, &root}};
+  while (!pending.empty()) {
+    const auto [source, target] = pending.back();
+    pending.pop_back();
+    std::visit(overloaded{
+                   [&](const PropertyListValue::Array& array) {
+                     *target = ordered_json::array();
+                     auto& elements = target->get_ref<ordered_json::array_t&>();
+                     elements.resize(array.size());
+                     for (std::size_t i = 0; i < elements.size(); ++i)
+                       pending.push_back({&array[i], &elements[i]});
+                   },
+                   [&](const PropertyListDictionary& dictionary) {
+                     *target = ordered_json::object();
+                     // Its keys are different from each other; an object would look for each among all.
+                     Members& members = target->get_ref<ordered_json::object_t&>();
+                     members.reserve(dictionary.size());
+                     for (const auto& [key, element] : dictionary) {
+                       members.emplace_back(std::string(key), nullptr);
+                       pending.push_back({&element, &members.back().second});
+                     }
+                   },
+                   [&](const auto& scalar) { *target = jsonOfScalar(scalar); },
+               },
+               source->payload);
+  }
+  return root;
 }
 
 std::string dumped(const ordered_json& value) {
-  return value.dump(2, ' ', false, ordered_json::error_handler_t::replace);
+  std::string text;
+  std::vector<Open> open;
+  const auto startLine = [&] {
+    text += '\n';
+    text.append(2 * std::min(open.size(), deepestIndentation), ' ');
+  };
+  const auto put = [&](const ordered_json& item) {
+    if (item.is_structured() && !item.empty()) {
+      text += item.is_array() ? '[' : '{';
+      open.push_back({&item, item.begin()});
+    } else {
+      text += item.dump(-1, ' ', false, ordered_json::error_handler_t::replace);
+    }
+  };
+  put(value);
+  while (!open.empty()) {
+    auto& [container, next] = open.back();
+    if (next == container->end()) {
+      const char end = container->is_array() ? ']' : '}';
+      open.pop_back();
+      startLine();
+      text += end;
+      continue;
+    }
+    if (next != container->begin()) text += ',';
+    startLine();
+    if (container->is_object())
+      text += ordered_json(next.key()).dump(-1, ' ', false, ordered_json::error_handler_t::replace) + ": ";
+    put(*next++);
+  }
+  return printableJSON(text);
 }

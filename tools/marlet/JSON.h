@@ -21,5 +21,5 @@ nlohmann::ordered_json orNull(const std::optional<T>& value) {
   return value ? nlohmann::ordered_json(*value) : nlohmann::ordered_json(nullptr);
 }
 
-/// Indented, in UTF-8; ill-formed bytes, which only paths can hold, as U+FFFD.
+/// Indented, in UTF-8, safe on a terminal (`printableJSON`); ill-formed bytes, which only paths can hold, as U+FFFD.
 std::string dumped(const nlohmann::ordered_json& value);

@@ -5,6 +5,7 @@
 #include "Book.h"
 #include "Hunks.h"
 #include "JSON.h"
+#include "SafeOutput.h"
 
 using namespace MarletFoundation;
 using nlohmann::ordered_json;
@@ -14,7 +15,7 @@ ExitStatus printLearnerText(const std::string& path, const std::string& file, co
     const auto text =
         withBook(path, [&](const Book& book) { return mergedUserEdit(book.userEditPack(), file); });
     if (!text) throw CommandFailure{ExitStatus::negative, file + ": the learner sees no such file."};
-    std::cout << text->view();
+    printText(text->view());
     return ExitStatus::good;
   });
 }

@@ -18,8 +18,9 @@ namespace {
 template <class Make>
 ExitStatus making(const std::string& what, const Terminal& terminal, Make make) {
   return guarded(what, terminal, [&] {
+    const auto done = "made " + what;
     make();
-    terminal.note("made " + printable(what));
+    terminal.note(done);
     return ExitStatus::good;
   });
 }

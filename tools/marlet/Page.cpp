@@ -8,6 +8,7 @@
 #include "MarletFoundation/MarletFoundation.h"
 #include "MarletFoundation/Platform/Text.h"
 #include "PageJSON.h"
+#include "SafeOutput.h"
 
 using namespace MarletFoundation;
 
@@ -80,7 +81,7 @@ ExitStatus showPage(const std::string& book, const std::string& chapter, const s
     } else if (output == PageOutput::json) {
       std::cout << dumped(json(*fetched)) << "\n";
     } else if (code) {
-      std::cout << sourceOf(*code);
+      printText(sourceOf(*code));
     } else {
       throw CommandFailure{ExitStatus::negative, page + ": A page of this kind has no source."};
     }

@@ -16,10 +16,10 @@ ProgressBar::ProgressBar(const Terminal& terminal) : isShown_(!terminal.quiet &&
 void ProgressBar::show(double fraction) {
   if (!isShown_) return;
   const auto filled = static_cast<std::size_t>(fraction * Width);
-  std::cerr << "\r[" << std::string(filled, '#') << std::string(Width - filled, ' ') << "] "
+  std::cerr << newLineStart << "[" << std::string(filled, '#') << std::string(Width - filled, ' ') << "] "
             << static_cast<int>(fraction * 100) << " %" << std::flush;
 }
 
 void ProgressBar::clear() {
-  if (isShown_) std::cerr << "\r\033[K" << std::flush;
+  if (isShown_) std::cerr << newLineStart << std::flush;
 }

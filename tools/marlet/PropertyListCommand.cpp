@@ -1,11 +1,16 @@
 #include "PropertyListCommand.h"
 
+#include <cerrno>
+#include <cstdio>
 #include <iostream>
 #include <iterator>
 #include <optional>
 
+#include "Ending.h"
+#include "Guarded.h"
 #include "JSON.h"
 #include "MarletFoundation/MarletFoundation.h"
+#include "SafeOutput.h"
 
 using namespace MarletFoundation;
 
@@ -13,7 +18,9 @@ namespace {
 
 Data readInput(const std::string& input) {
   if (input != "-") return FileManager::readFile(URL::file(input));
-  return Data(std::string(std::istreambuf_iterator<char>(std::cin), {}));
+  std::string text(std::istreambuf_iterator<char>(std::cin), {});
+  if (std::ferror(stdin)) throw ErrorObject::posix(errno, input);
+  return Data(std::move(text));
 }
 
 Data inForm(const PropertyListValue& value, PropertyListOutput form) {
@@ -32,35 +39,14 @@ Data inForm(const PropertyListValue& value, PropertyListOutput form) {
 
 ExitStatus convertPropertyList(const std::string& input, PropertyListOutput form, const std::string& output,
                                const Terminal& terminal) {
-  const auto complain = [&](const std::string& path, const std::string& reason) {
-    terminal.complain(printable(path + ": " + reason));
-  };
-  Data source;
-  try {
-    source = readInput(input);
-  } catch (const Error& error) {
-    complain(input, ErrorObject(error).localizedDescription());
-    return ExitStatus::unreadablePath;
-  }
-  Data result;
-  try {
-    result = inForm(PropertyListSerialization::read(source), form);
-  } catch (const Error& error) {
-    complain(input, ErrorObject(error).localizedDescription());
-    return ExitStatus::negative;
-  } catch (const NotRepresentable& reason) {
-    complain(input, reason.what());
-    return ExitStatus::negative;
-  }
-  if (output == "-") {
-    std::cout << result.view();
+  return guarded(input, terminal, [&] {
+    const auto source = orFailWith(ExitStatus::unreadablePath, input, [&] { return readInput(input); });
+    const auto result = inForm(PropertyListSerialization::read(source), form);
+    if (output == "-") {
+      printText(result.view());
+    } else {
+      commit(output, [&] { FileManager::writeFileAtomically(URL::file(output), result); });
+    }
     return ExitStatus::good;
-  }
-  try {
-    FileManager::writeFileAtomically(URL::file(output), result);
-  } catch (const Error& error) {
-    complain(output, ErrorObject(error).localizedDescription());
-    return ExitStatus::failedWrite;
-  }
-  return ExitStatus::good;
+  });
 }

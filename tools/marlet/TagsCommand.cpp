@@ -4,6 +4,7 @@
 #include <iostream>
 #include <optional>
 
+#include "ErrorWords.h"
 #include "JSON.h"
 #include "MarletFoundation/MarletFoundation.h"
 #include "MarletFoundation/Platform/Text.h"
@@ -96,7 +97,7 @@ ExitStatus showTags(const std::vector<std::string>& paths, bool asJSON, const Te
   auto status = ExitStatus::good;
   auto report = ordered_json::array();
   const auto fail = [&](const std::string& path, const std::string& reason, ExitStatus failure) {
-    terminal.complain(printable(path + ": " + reason));
+    terminal.complain(path + ": " + reason);
     report.push_back({{"path", path}, {"error", reason}});
     status = std::max(status, failure);
   };
@@ -105,7 +106,7 @@ ExitStatus showTags(const std::vector<std::string>& paths, bool asJSON, const Te
     try {
       data = FileManager::readFile(URL::file(path));
     } catch (const Error& error) {
-      fail(path, ErrorObject(error).localizedDescription(), ExitStatus::unreadablePath);
+      fail(path, wordsOf(error), ExitStatus::unreadablePath);
       continue;
     }
     const auto source = utf16FromUTF8(data.view());

@@ -3,6 +3,8 @@
 #include <string>
 #include <string_view>
 
+#include "SafeText.h"
+
 /// How the command speaks: results on standard output, everything else on standard error.
 struct Terminal {
   enum class Color { automatic, always, never };
@@ -11,9 +13,9 @@ struct Terminal {
   bool verbose = false;
   Color color = Color::automatic;
 
-  /// A line for the person at the terminal, unless quiet.
+  /// A line for the person at the terminal, made `printable`, unless quiet.
   void note(std::string_view line) const;
-  /// What went wrong with the command itself, as a sentence; printed even when quiet.
+  /// What went wrong with the command itself, as a sentence, made `printable`; printed even when quiet.
   void complain(std::string_view sentence) const;
 
   enum class Style { bold, red, yellow, green, dim };
@@ -21,6 +23,8 @@ struct Terminal {
   std::string styled(Style style, std::string_view text, int stream = 1) const;
 };
 
-/// Text of a document on its way to a terminal: control characters, which could steer the terminal, as
-/// escapes.
-std::string printable(std::string_view text);
+/// All that the command itself tells a terminal: the styles in their order, back to none, and to begin the line anew.
+inline constexpr std::string_view terminalSequences[] = {"\033[1m", "\033[31m", "\033[33m", "\033[32m",
+                                                         "\033[2m", "\033[0m",  "\r\033[K"};
+inline constexpr std::string_view plainStyle = terminalSequences[5];
+inline constexpr std::string_view newLineStart = terminalSequences[6];

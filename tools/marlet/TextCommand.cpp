@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <iostream>
 
+#include "Ending.h"
 #include "Guarded.h"
 #include "Hunks.h"
 #include "JSON.h"
@@ -10,6 +11,7 @@
 #include "MarletDiff/ContentMerge.h"
 #include "MarletFoundation/MarletFoundation.h"
 #include "MarletFoundation/Platform/Text.h"
+#include "SafeOutput.h"
 
 using namespace MarletFoundation;
 
@@ -53,7 +55,7 @@ void printConflict(const ErrorObject& error, const std::u16string& base, const s
                    const Terminal& terminal) {
   const auto location = std::get<std::int64_t>(error.value(MarletDiff::LocationKey).value());
   const auto line = 1 + std::count(base.begin(), base.begin() + location, u'\n');
-  terminal.complain(printable(path) + ":" + std::to_string(line) + ": " + error.localizedDescription());
+  terminal.complain(path + ":" + std::to_string(line) + ": " + error.localizedDescription());
   const std::pair<const char*, std::string_view> texts[] = {
       {"base", MarletDiff::BaseTextKey}, {"ours", MarletDiff::TextKey}, {"theirs", MarletDiff::OtherTextKey}};
   for (const auto& [name, key] : texts) {
@@ -84,11 +86,10 @@ ExitStatus merge(const std::string& base, const std::string& ours, const std::st
       return ExitStatus::negative;
     }
     if (!output) {
-      std::cout << merged;
+      printText(merged);
       return ExitStatus::good;
     }
-    orFailWith(ExitStatus::failedWrite, *output,
-               [&] { FileManager::writeFileAtomically(URL::file(*output), Data(std::move(merged))); });
+    commit(*output, [&] { FileManager::writeFileAtomically(URL::file(*output), Data(std::move(merged))); });
     return ExitStatus::good;
   });
 }

@@ -41,7 +41,7 @@ ExitStatus unzip(const std::string& archive, const std::string& directory, const
     if (bar.isShown()) copier.progressCallback = [&](double fraction, double) { bar.show(fraction); };
     copier.problemCallback = [&](const std::string& path, const std::string& reason) {
       bar.clear();
-      terminal.complain(printable((path == source.path() ? archive : path) + ": " + reason + "."));
+      terminal.complain((path == source.path() ? archive : path) + ": " + reason + ".");
     };
     std::optional<ErrorObject> error;
     const bool isWhole = copier.unzip(source.path(), URL::file(directory).path(), &error);

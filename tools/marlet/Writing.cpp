@@ -2,6 +2,7 @@
 
 #include <filesystem>
 
+#include "Ending.h"
 #include "Guarded.h"
 #include "MarletFoundation/Platform/Text.h"
 
@@ -24,5 +25,5 @@ void requireNothingAt(const std::string& path) {
 }
 
 void writeTree(const FileWrapper& tree, const URL& url, ExistingItem existing) {
-  orFailWith(ExitStatus::failedWrite, url.path(), [&] { tree.write(url, existing); });
+  commit(url.path(), [&] { tree.write(url, existing); });
 }

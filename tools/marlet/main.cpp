@@ -1,13 +1,17 @@
 #include <CLI/CLI.hpp>
 #include <csignal>
 #include <iostream>
+#include <new>
+#include <stdexcept>
 
 #include "ApplyCommand.h"
 #include "Check.h"
 #include "Convert.h"
 #include "DigestCommand.h"
 #include "EditCommand.h"
+#include "Ending.h"
 #include "FatalProblem.h"
+#include "Guarded.h"
 #include "LearnerText.h"
 #include "MarletFoundation/MarletFoundation.h"
 #include "New.h"
@@ -16,6 +20,7 @@
 #include "Position.h"
 #include "PropertyListCommand.h"
 #include "Reference.h"
+#include "SafeOutput.h"
 #include "Show.h"
 #include "TagsCommand.h"
 #include "Targets.h"
@@ -35,13 +40,21 @@ void setUpLibrary(const Terminal& terminal) {
   registerUserVisibleError<AssessmentInformation::SerializationError>();
   registerUserVisibleError<AssessmentStatus::SerializationError>();
   auto environment = HostEnvironment::defaults();
-  environment.systemLog = [&terminal](std::string_view line) { terminal.note(printable(line)); };
+  environment.systemLog = [&terminal](std::string_view line) { terminal.note(line); };
   environment.diagnostics = [&terminal](std::string_view line) {
-    if (terminal.verbose) terminal.note(printable(line));
+    if (terminal.verbose) terminal.note(line);
   };
   HostEnvironment::setCurrent(std::move(environment));
   setFatalErrorHandler(
       [](std::string_view message, const SourceLocation&) { throw FatalProblem{std::string(message)}; });
+}
+
+/// The statuses, for the end of the help.
+std::string statusTable() {
+  std::string table = "Exit status:";
+  for (const auto& [status, words] : exitStatusWords)
+    table += "\n  " + std::to_string(static_cast<int>(status)) + "  " + words;
+  return table;
 }
 
 /// An empty path would be the working directory, which hardly anybody means.
@@ -55,7 +68,7 @@ void refuseEmptyPaths(CLI::App& app) {
   for (auto* command : app.get_subcommands({})) refuseEmptyPaths(*command);
 }
 
-int run(int argc, char** argv) {
+ExitStatus run(int argc, char** argv) {
   CLI::App app("Create, check and ship books of interactive lessons.", "marlet");
   app.require_subcommand(1);
   app.fallthrough();
@@ -291,19 +304,40 @@ int run(int argc, char** argv) {
                            {"fish", Reference::fish}});
   referenceCommand->callback([&] { printReference(app, reference, std::cout); });
 
+  app.footer(statusTable());
   refuseEmptyPaths(app);
   app.parse_complete_callback([&] { setUpLibrary(terminal); });
   try {
     app.parse(argc, argv);
   } catch (const CLI::ParseError& error) {
-    return app.exit(error, std::cout, std::cerr) == 0 ? 0 : static_cast<int>(ExitStatus::wrongUsage);
+    if (error.get_exit_code() != 0) {
+      std::cerr << printable(error.what()) << "\nRun with --help for more information.\n";
+      return ExitStatus::wrongUsage;
+    }
+    app.exit(error, std::cout);
   }
-  std::cout.flush();
-  if (!std::cout) {
-    terminal.complain("standard output can't be written.");
-    return static_cast<int>(ExitStatus::failedWrite);
+  return status;
+}
+
+/// Runs the command to its end, the last of its output included.
+ExitStatus runToTheEnd(int argc, char** argv) {
+  const Terminal terminal;
+  auto status = ExitStatus::negative;
+  try {
+    status = run(argc, argv);
+    requirePrinted();
+  } catch (const CommandFailure& failure) {
+    status = failing(failure.status, failure.sentence, terminal);
+  } catch (const FatalProblem& fatal) {
+    status = failing(status, fatal.message, terminal);
+  } catch (const std::length_error&) {
+    noteOutOfMemory();
+  } catch (const std::bad_alloc&) {
+    noteOutOfMemory();
+  } catch (const std::exception& error) {
+    status = failing(status, error.what(), terminal);
   }
-  return static_cast<int>(status);
+  return wasOutOfMemory() ? endingWithoutMemory() : status;
 }
 
 }  // namespace
@@ -311,12 +345,11 @@ int run(int argc, char** argv) {
 int main(int argc, char** argv) {
   // A file that may not grow any more is an error of the write.
   std::signal(SIGXFSZ, SIG_IGN);
+  watchMemory();
   try {
-    return run(argc, argv);
-  } catch (const FatalProblem& fatal) {
-    std::cerr << "marlet: " << fatal.message << "\n";
-  } catch (const std::exception& error) {
-    std::cerr << "marlet: " << error.what() << "\n";
+    const SafeOutput output;
+    return static_cast<int>(runToTheEnd(argc, argv));
+  } catch (const std::bad_alloc&) {
+    return static_cast<int>(endingWithoutMemory());
   }
-  return static_cast<int>(ExitStatus::negative);
 }
