@@ -1,9 +1,11 @@
 #include "MarletFoundation/DiffPack/MarletBookDiffContext.h"
 
 #include <limits>
+#include <optional>
 
 #include "MarletDiff/RecursiveFileDiff.h"
 #include "MarletFoundation/Marlet/MarletBookSnapshot.h"
+#include "MarletFoundation/Platform/OneState.h"
 
 namespace MarletFoundation {
 namespace {
@@ -12,14 +14,35 @@ ErrorObject failure(std::string message, ErrorPointer cause = nullptr) {
   return diffError(DiffErrorCode::CriticalDiffPackCreationError, std::move(message), std::move(cause));
 }
 
-MarletBookSnapshot load(const URL& url) {
+ErrorObject unableToLoad(const URL& url, const Error& error) {
+  return failure("Unable to load document " + url.absoluteString() + ", error: " + error.description(),
+                 error.copy());
+}
+
+FileWrapper open(const URL& url) {
   try {
-    return {FileWrapper(url), url};
+    return FileWrapper(url);
   } catch (const Error& error) {
-    throw failure("Unable to load document " + url.absoluteString() + ", error: " + error.description(),
-                  error.copy());
+    throw unableToLoad(url, error);
   }
 }
+
+MarletBookSnapshot load(const FileWrapper& document, const URL& url) {
+  try {
+    return {document, url};
+  } catch (const Error& error) {
+    throw unableToLoad(url, error);
+  }
+}
+
+/// The books that are compared. Loading looks at each page's manifest, so that a page which is exchanged meanwhile is
+/// noticed.
+struct TwoBooks {
+  FileWrapper original;
+  std::optional<FileWrapper> updated;  // once the original was loaded
+
+  bool isUnchanged() const { return original.isUnchanged() && (!updated || updated->isUnchanged()); }
+};
 
 bool isNextPatch(const Version& original, const Version& updated) {
   const auto patch = original.patchVersion().value_or(0);
@@ -34,8 +57,20 @@ MarletBookDiffContext::MarletBookDiffContext(URL original, URL updated)
     : originalUrl(std::move(original)), updatedUrl(std::move(updated)) {}
 
 DiffPackSnapshot MarletBookDiffContext::generateDiffPack() const {
-  const auto original = load(originalUrl);
-  const auto updated = load(updatedUrl);
+  return readOneState(
+      updatedUrl.path(),
+      [&] {
+        return TwoBooks{open(originalUrl), std::nullopt};
+      },
+      [&](TwoBooks& books) {
+        const auto original = load(books.original, originalUrl);
+        books.updated = open(updatedUrl);
+        return diffPack(original, load(*books.updated, updatedUrl));
+      });
+}
+
+DiffPackSnapshot MarletBookDiffContext::diffPack(const MarletBookSnapshot& original,
+                                                 const MarletBookSnapshot& updated) const {
   if (original.contentIdentifier != updated.contentIdentifier) {
     throw failure("Mismatched Marlet Book content identifier: " + original.contentIdentifier + " -> " +
                   updated.contentIdentifier);

@@ -6,6 +6,7 @@
 
 #include "MarletFoundation/Platform/CommitLock.h"
 #include "MarletFoundation/Platform/HostEnvironment.h"
+#include "MarletFoundation/Platform/LinkProtection.h"
 #include "MarletFoundation/Platform/StageNames.h"
 #include "MarletFoundation/Platform/TreeSurvey.h"
 
@@ -95,6 +96,7 @@ AtomicReplacement::Place AtomicReplacement::currentPlace() const {
     }
     if (existing_ == ExistingItem::Kept) throwPosix(EEXIST, path_);
     if (links == MostLinks) throwPosix(ELOOP, path_);
+    if (!mayFollowLink(place.parent.get(), status)) throwPosix(EACCES, path_);
     std::string target(static_cast<std::size_t>(PATH_MAX), '\0');
     const auto length = ::readlinkat(place.parent.get(), place.name.c_str(), target.data(), target.size());
     if (length < 0) throwPosix(errno, path_);

@@ -85,4 +85,12 @@ void writeFileAtomically(const URL& url, const Data& contents) {
   replacement.commit();
 }
 
+void removeAbandonedStages(const URL& url) {
+  try {
+    const AtomicReplacement clearing(systemPath(url));
+  } catch (const ErrorObject&) {
+    // Who goes on to write meets it again.
+  }
+}
+
 }  // namespace MarletFoundation::FileManager

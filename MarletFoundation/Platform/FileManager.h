@@ -50,6 +50,9 @@ MARLET_EXPORT Data mapFile(const URL& url);
 /// on the background queue, with what stood against the removal or nothing.
 MARLET_EXPORT void asynchronouslyRemoveItem(
     const URL& url, std::function<void(const std::optional<ErrorObject>&)> completion = {});
+/// Removes what writers of the item at `url` that died have left beside it, and nothing that is being built. Each write
+/// does so by itself; this is for who means to write and then doesn't. Nothing is thrown.
+MARLET_EXPORT void removeAbandonedStages(const URL& url);
 /// Removes, on the background queue, what an `asynchronouslyRemoveItem` of the same URL has left beside it because
 /// its process ended too soon. Nothing is thrown; `completion` is called for each thing that was found.
 MARLET_EXPORT void finishRemovals(const URL& url,

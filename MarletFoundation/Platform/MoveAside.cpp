@@ -4,6 +4,7 @@
 #include <stdio.h>
 #include <unistd.h>
 
+#include "MarletFoundation/Platform/CommitLock.h"
 #include "MarletFoundation/Platform/Descriptor.h"
 
 namespace MarletFoundation {
@@ -25,8 +26,17 @@ int renameToFreeName(int directory, const std::string& from, const std::string& 
 }  // namespace
 
 std::string moveAside(const URL& directory, std::string_view name) {
-  const Descriptor parent(retrying([&] { return ::open(systemPath(directory).c_str(), DirectoryFlags); }));
-  if (!parent) throwPosix(errno, directory.path());
+  const auto open = [&] {
+    Descriptor opened(retrying([&] { return ::open(systemPath(directory).c_str(), DirectoryFlags); }));
+    if (!opened) throwPosix(errno, directory.path());
+    return opened;
+  };
+  const auto parent = open();
+  const CommitLock lock(parent.get(), Descriptor(), directory.path());
+  struct stat locked, now;
+  if (::fstat(parent.get(), &locked) != 0 || ::fstat(open().get(), &now) != 0)
+    throwPosix(errno, directory.path());
+  if (!isSameItem(locked, now)) throwPosix(ESTALE, directory.path());
   const auto dot = std::min(name.rfind('.'), name.size());
   const auto stem = std::string(name.substr(0, dot)) + ".aside", extension = std::string(name.substr(dot));
   for (int number = 1;; ++number) {

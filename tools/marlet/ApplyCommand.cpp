@@ -23,7 +23,7 @@ class Application {
   ExitStatus run() {
     auto status = ExitStatus::good;
     try {
-      attempt();
+      committing(path_, [&] { attempt(); });
     } catch (const CommandFailure& failure) {
       status = failure.status;
       error_ = failure.sentence;
@@ -54,7 +54,7 @@ class Application {
           ExitStatus::negative,
           path_ + ": the update and the learner's edits change the same text. Nothing was changed."};
     }
-    const auto merged = checkedUpdate(url, update_);
+    const auto merged = mergedBook(url);
     preview_->take(merged.conflicts);
     // No flag waives this: it is about the learner's work, and not about what the update is meant for.
     if (!merged.conflicts.empty())
@@ -80,13 +80,24 @@ class Application {
       refuse("the pack is for version " + update_.baseVersion + ", and the book has " + version + ".");
   }
 
-  void backUp(const URL& url) const {
+  CheckedUpdate mergedBook(const URL& url) const {
+    try {
+      return checkedUpdate(url, update_);
+    } catch (const ErrorObject& error) {
+      if (error.domain() != PosixErrorDomain || error.code() != ESTALE) throw;
+      throw ChangedMeanwhile{{ExitStatus::failedWrite, path_ + ": " + wordsWithSuggestion(error)}};
+    }
+  }
+
+  /// A copy that an earlier attempt made gives way to one of the book as it is now.
+  void backUp(const URL& url) {
     const auto copy = URL::file(*options_.backup, true).appendingPathComponent(url.lastPathComponent(), true);
-    if (FileManager::fileExists(copy)) {
+    if (!isBackedUp_ && FileManager::fileExists(copy)) {
       throw CommandFailure{ExitStatus::failedWrite,
                            copy.path() + ": there is something already. Nothing was changed."};
     }
     orFailWith(ExitStatus::failedWrite, copy.path(), [&] { FileWrapper(url).write(copy); });
+    isBackedUp_ = true;
   }
 
   void printJSON() const {
@@ -136,7 +147,7 @@ class Application {
   const ApplyOptions& options_;
   const Terminal& terminal_;
   std::optional<UpdatePreview> preview_;
-  bool isApplied_ = false;
+  bool isApplied_ = false, isBackedUp_ = false;
   std::optional<std::string> error_;
 };
 

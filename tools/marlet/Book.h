@@ -41,12 +41,13 @@ struct MendableBook {
 /// Throws `CommandFailure` for a path that can't be read or is no book.
 Document openBookDocument(const std::string& path);
 
-/// What `use` makes of the book at the path; see `withSettled`.
+/// What `use` makes of one state of the book at the path; see `readOneState`. It may run more than once.
 template <class BookType = Book, class Use>
 auto withBook(const std::string& path, Use use) {
-  return withSettled([&] { return openBookDocument(path); },
-                     [&](const Document& document) {
-                       const BookType book(document);
-                       return use(book);
-                     });
+  return MarletFoundation::readOneState(
+      path, [&] { return openBookDocument(path); },
+      [&](const Document& document) {
+        const BookType book(document);
+        return use(book);
+      });
 }

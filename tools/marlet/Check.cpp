@@ -43,7 +43,8 @@ Report reportOf(const Document& document) {
 
 Report report(const std::string& path) {
   try {
-    return withSettled([&] { return Document(path); }, reportOf);
+    return readOneState(
+        path, [&] { return Document(path); }, reportOf);
   } catch (const Error& error) {
     return {path, "unknown", false, {problemOfUnreadablePath(error)}};
   }

@@ -3,7 +3,7 @@
 #include <string>
 
 #include "Ending.h"
-#include "MarletFoundation/Platform/FileWrapper.h"
+#include "MarletFoundation/MarletFoundation.h"
 
 enum class DocumentKind { book, classic, unknown };
 
@@ -16,24 +16,7 @@ struct Document {
 
   /// Throws the file error when the path can't be read at all.
   explicit Document(const std::string& path);
-};
 
-/// What `use` makes of the document that `open` opens. One that another process replaces meanwhile is opened
-/// again, so that the answer is about the old one or the new one and no mixture; `use` may thus run more than once,
-/// but never again after its change is made.
-template <class Open, class Use>
-auto withSettled(Open open, Use use) {
-  constexpr int mostAttempts = 1000;
-  for (int attempt = 1;; ++attempt) {
-    const Document document = open();
-    const auto isSettled = [&] {
-      return isChangeMade() || !document.wrapper.wasReplaced() || attempt == mostAttempts;
-    };
-    try {
-      auto result = use(document);
-      if (isSettled()) return result;
-    } catch (...) {
-      if (isSettled()) throw;
-    }
-  }
-}
+  /// Whether what was read of it is one state, or doesn't matter any more since our change is made.
+  bool isUnchanged() const { return isChangeMade() || wrapper.isUnchanged(); }
+};

@@ -126,8 +126,9 @@ ExitStatus edit(const std::string& path, const EditOptions& options, const Termi
   return guarded(path, terminal, [&] {
     if (options.setAside) return setAside(path, options.asJSON);
     const auto edits = readEdits(options.settings, options.reverted);
-    const auto result =
-        withBook<MendableBook>(path, [&](const MendableBook& book) { return save(book, edits); });
+    const auto result = committing(path, [&] {
+      return withBook<MendableBook>(path, [&](const MendableBook& book) { return save(book, edits); });
+    });
     auto list = ordered_json::array();
     for (const auto& saved : result) {
       if (!options.asJSON) {

@@ -3,6 +3,7 @@
 #include <unistd.h>
 
 #include <atomic>
+#include <cerrno>
 #include <csignal>
 #include <exception>
 #include <new>
@@ -31,7 +32,14 @@ std::terminate_handler otherTermination;
 
 void commit(const std::string& path, const std::function<void()>& write) {
   auto words = printable(path) + ": the change is made, but then: ";
-  orFailWith(ExitStatus::failedWrite, path, write);
+  try {
+    write();
+  } catch (const MarletFoundation::Error& error) {
+    CommandFailure failure{ExitStatus::failedWrite, path + ": " + wordsWithSuggestion(error)};
+    if (error.domain() == MarletFoundation::PosixErrorDomain && error.code() == ESTALE)
+      throw ChangedMeanwhile{std::move(failure)};
+    throw failure;
+  }
   madeWords = std::move(words);
   // A reader of the report who goes away must not end the command before it has said so.
   std::signal(SIGPIPE, SIG_IGN);

@@ -29,7 +29,8 @@ void handleInterruptions() {
   for (const int number : {SIGINT, SIGTERM, SIGHUP}) {
     struct sigaction now {};
     // One that is ignored, as below nohup, stays so.
-    if (::sigaction(number, nullptr, &now) == 0 && now.sa_handler != SIG_IGN) ::sigaction(number, &action, nullptr);
+    if (::sigaction(number, nullptr, &now) == 0 && now.sa_handler != SIG_IGN)
+      ::sigaction(number, &action, nullptr);
   }
 }
 

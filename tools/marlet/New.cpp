@@ -3,6 +3,7 @@
 #include <algorithm>
 
 #include "Document.h"
+#include "Ending.h"
 #include "Guarded.h"
 #include "MarletFoundation/MarletFoundation.h"
 #include "MarletFoundation/Platform/Host.h"
@@ -25,8 +26,19 @@ ExitStatus making(const std::string& what, const Terminal& terminal, Make make) 
   });
 }
 
-Document openBook(const std::string& path) {
-  return orFailWith(ExitStatus::unreadablePath, path, [&] { return Document(path); });
+/// Opens a book, which must load, lets `change` change its tree, and writes that.
+template <class Change>
+void changing(const std::string& path, Change change) {
+  const auto open = [&] {
+    return orFailWith(ExitStatus::unreadablePath, path, [&] { return Document(path); });
+  };
+  committing(path, [&] {
+    return readOneState(path, open, [&](const Document& document) {
+      change(document, MarletBookSnapshot(document.wrapper, document.url));
+      writeTree(document.wrapper, document.url, ExistingItem::Replaced);
+      return true;
+    });
+  });
 }
 
 void addTo(FileWrapper& parent, const std::string& key, FileWrapper item) {
@@ -55,11 +67,10 @@ ExitStatus makeBook(const std::string& path, const std::optional<std::string>& n
 ExitStatus makeChapter(const std::string& book, const std::string& name, const Terminal& terminal) {
   return making(book + ": " + name, terminal, [&] {
     requireFilename(name);
-    const auto document = openBook(book);
-    const MarletBookSnapshot mustOpen(document.wrapper, document.url);
-    auto contents = *document.wrapper.child("Contents");
-    addTo(contents, "Chapters", newChapter(name, name));
-    writeTree(document.wrapper, document.url, ExistingItem::Replaced);
+    changing(book, [&](const Document& document, const MarletBookSnapshot&) {
+      auto contents = *document.wrapper.child("Contents");
+      addTo(contents, "Chapters", newChapter(name, name));
+    });
   });
 }
 
@@ -67,15 +78,14 @@ ExitStatus makePage(const std::string& book, const std::string& chapter, const s
                     bool isCutscene, const Terminal& terminal) {
   return making(book + ": " + chapter + ": " + name, terminal, [&] {
     requireFilename(name);
-    const auto document = openBook(book);
-    const MarletBookSnapshot snapshot(document.wrapper, document.url);
-    const auto isWanted = [&](const MarletChapterSnapshot& c) { return c.filename == chapter; };
-    if (std::none_of(snapshot.chapters.begin(), snapshot.chapters.end(), isWanted))
-      throw BookPageLoadingError(BookPageLoadingErrorCase::NoSuchChapter, chapter);
-    auto directory = *nodeAt(document.wrapper, "Contents/Chapters/" + chapter);
-    addTo(
-        directory, "Pages",
-        isCutscene ? newCutscenePage(name + ".cutscenepage", name) : newCodePage(name + ".marletpage", name));
-    writeTree(document.wrapper, document.url, ExistingItem::Replaced);
+    changing(book, [&](const Document& document, const MarletBookSnapshot& snapshot) {
+      const auto isWanted = [&](const MarletChapterSnapshot& c) { return c.filename == chapter; };
+      if (std::none_of(snapshot.chapters.begin(), snapshot.chapters.end(), isWanted))
+        throw BookPageLoadingError(BookPageLoadingErrorCase::NoSuchChapter, chapter);
+      auto directory = *nodeAt(document.wrapper, "Contents/Chapters/" + chapter);
+      addTo(directory, "Pages",
+            isCutscene ? newCutscenePage(name + ".cutscenepage", name)
+                       : newCodePage(name + ".marletpage", name));
+    });
   });
 }

@@ -70,7 +70,7 @@ ExitStatus showPage(const std::string& book, const std::string& chapter, const s
     const auto open = [&] {
       return orFailWith(ExitStatus::unreadablePath, book, [&] { return Document(book); });
     };
-    const auto fetched = withSettled(open, [&](const Document& document) {
+    const auto fetched = readOneState(book, open, [&](const Document& document) {
       std::optional<DiffPackSnapshot> pack;
       const MarletBookSnapshot snapshot(document.wrapper, document.url, pack);
       return snapshotForPageWithFilename(page, chapter, document.url, &snapshot, pack);

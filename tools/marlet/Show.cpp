@@ -92,7 +92,7 @@ ExitStatus show(const std::string& path, bool asJSON, const Terminal& terminal) 
     const auto open = [&] {
       return orFailWith(ExitStatus::unreadablePath, path, [&] { return Document(path); });
     };
-    const auto print = withSettled(open, [&](const Document& document) -> std::function<void()> {
+    const auto print = readOneState(path, open, [&](const Document& document) -> std::function<void()> {
       if (document.kind == DocumentKind::unknown)
         throw CommandFailure{ExitStatus::negative, path + ": this is neither a book nor a classic document."};
       if (document.kind == DocumentKind::classic) {

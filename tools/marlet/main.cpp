@@ -12,6 +12,7 @@
 #include "Ending.h"
 #include "FatalProblem.h"
 #include "Guarded.h"
+#include "Interruption.h"
 #include "LearnerText.h"
 #include "MarletFoundation/MarletFoundation.h"
 #include "New.h"
@@ -43,6 +44,9 @@ void setUpLibrary(const Terminal& terminal) {
   environment.systemLog = [&terminal](std::string_view line) { terminal.note(line); };
   environment.diagnostics = [&terminal](std::string_view line) {
     if (terminal.verbose) terminal.note(line);
+  };
+  environment.leftBehind = [&terminal](std::string_view path, const ErrorObject& reason) {
+    terminal.complain(leftBehindSentence(path, reason));
   };
   HostEnvironment::setCurrent(std::move(environment));
   setFatalErrorHandler(
@@ -345,10 +349,13 @@ ExitStatus runToTheEnd(int argc, char** argv) {
 int main(int argc, char** argv) {
   // A file that may not grow any more is an error of the write.
   std::signal(SIGXFSZ, SIG_IGN);
+  handleInterruptions();
   watchMemory();
   try {
     const SafeOutput output;
-    return static_cast<int>(runToTheEnd(argc, argv));
+    const auto status = runToTheEnd(argc, argv);
+    endIfInterrupted();
+    return static_cast<int>(status);
   } catch (const std::bad_alloc&) {
     return static_cast<int>(endingWithoutMemory());
   }
