@@ -1,6 +1,7 @@
 #include "SafeOutput.h"
 
 #include <fcntl.h>
+#include <poll.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -15,7 +16,13 @@ constexpr std::size_t mostHeld = 1 << 16;
 bool writeAll(int descriptor, std::string_view bytes) {
   while (!bytes.empty()) {
     const auto written = ::write(descriptor, bytes.data(), bytes.size());
-    if (written < 0 && errno != EINTR) return false;
+    if (written < 0 && errno == EAGAIN) {
+      // Whoever shares the descriptor made it one that doesn't wait.
+      pollfd writable{descriptor, POLLOUT, 0};
+      ::poll(&writable, 1, -1);
+    } else if (written < 0 && errno != EINTR) {
+      return false;
+    }
     if (written > 0) bytes.remove_prefix(static_cast<std::size_t>(written));
   }
   return true;

@@ -45,7 +45,8 @@ std::string escape(const char* form, unsigned value) {
 
 /// `kept` tells how many bytes at the start of a text stay though they are unsafe.
 template <class Kept>
-std::string escaped(std::string_view text, Kept kept, const char* asciiForm, const char* form) {
+std::string escaped(std::string_view text, Kept kept, const char* asciiForm = "\\x%02X",
+                    const char* form = "\\u%04X") {
   std::string safe;
   safe.reserve(text.size());
   while (true) {
@@ -72,32 +73,25 @@ std::string escaped(std::string_view text, Kept kept, const char* asciiForm, con
   }
 }
 
-bool isLineFeedOrTab(char character) { return character == '\n' || character == '\t'; }
+/// Bytes in front that only lay out lines.
+std::size_t layoutLength(std::string_view text) {
+  return text.starts_with("\r\n") ? 2 : text.front() == '\n' || text.front() == '\t' ? 1 : 0;
+}
+
+std::size_t ownSequenceLength(std::string_view text) {
+  for (const auto sequence : terminalSequences)
+    if (text.starts_with(sequence)) return sequence.size();
+  return layoutLength(text);
+}
 
 }  // namespace
 
 std::string printable(std::string_view text) {
-  return escaped(
-      text, [](std::string_view) { return std::size_t{0}; }, "\\x%02X", "\\u%04X");
+  return escaped(text, [](std::string_view) -> std::size_t { return 0; });
 }
 
-std::string printableLines(std::string_view text) {
-  return escaped(
-      text, [](std::string_view rest) { return std::size_t{isLineFeedOrTab(rest.front())}; }, "\\x%02X",
-      "\\u%04X");
-}
+std::string printableLines(std::string_view text) { return escaped(text, layoutLength); }
 
-std::string printableOutput(std::string_view output) {
-  const auto kept = [](std::string_view rest) {
-    if (isLineFeedOrTab(rest.front())) return std::size_t{1};
-    for (const auto sequence : terminalSequences)
-      if (rest.starts_with(sequence)) return sequence.size();
-    return std::size_t{0};
-  };
-  return escaped(output, kept, "\\x%02X", "\\u%04X");
-}
+std::string printableOutput(std::string_view output) { return escaped(output, ownSequenceLength); }
 
-std::string printableJSON(std::string_view json) {
-  return escaped(
-      json, [](std::string_view rest) { return std::size_t{rest.front() == '\n'}; }, "\\u%04x", "\\u%04x");
-}
+std::string printableJSON(std::string_view json) { return escaped(json, layoutLength, "\\u%04x", "\\u%04x"); }

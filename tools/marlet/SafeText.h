@@ -10,7 +10,7 @@
 
 /// A text for a place within a line: unsafe ASCII and bytes become `\x1B`, other unsafe characters `\u202E`.
 std::string printable(std::string_view text);
-/// The same for a whole text: its line feeds and tabs stay.
+/// The same for a whole text: its ends of lines and tabs stay.
 std::string printableLines(std::string_view text);
 /// The same for what the command itself has put together: its own colours stay as well.
 std::string printableOutput(std::string_view output);
