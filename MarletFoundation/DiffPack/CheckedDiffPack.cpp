@@ -4,6 +4,7 @@
 #include <set>
 
 #include "MarletFoundation/DiffPack/PackPaths.h"
+#include "MarletFoundation/Platform/RelativePath.h"
 
 namespace MarletFoundation {
 namespace {
@@ -24,17 +25,25 @@ Entries inSections(const DiffPackSnapshot& pack) {
   return entries;
 }
 
+ErrorObject failure(std::string message) {
+  return diffError(DiffErrorCode::CriticalDiffPackValidationError, std::move(message));
+}
+
 ErrorObject wouldChange(const std::string& path) {
-  return diffError(
-      DiffErrorCode::CriticalDiffPackValidationError,
-      "\"" + path + "\" would not be read from the pack as it was put there. Revert it, or set it anew.");
+  return failure("\"" + path +
+                 "\" would not read back from the pack as it was put there. Revert it, or set it anew.");
 }
 
 }  // namespace
 
 FileWrapper checkedFileWrapper(const DiffPackSnapshot& pack) {
   std::set<std::string, std::less<>> paths;
-  for (const auto& entry : pack.updates) paths.insert(entry.filePath());
+  for (const auto& entry : pack.updates) {
+    const auto& path = entry.filePath();
+    if (!std::holds_alternative<FileDiffDescriptor::Removed>(entry.change) && !relativePathComponents(path))
+      throw failure("\"" + path + "\" names no file below a book's contents.");
+    paths.insert(path);
+  }
   requireRoomInPack(pack.updates, paths);
   auto wrapper = pack.fileWrapper();
   const auto expected = inSections(pack), found = inSections(DiffPackSnapshot(wrapper, pack.contentUrl));

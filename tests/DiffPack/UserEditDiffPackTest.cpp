@@ -303,6 +303,8 @@ TEST_F(UpdatingUserEdits, APackIsReadBackBeforeItIsWritten) {
            {{FileDiff::Replaced{"bare"}}},
            {{FileDiff::Added{"a", text}}, {FileDiff::Added{"a/b", old}}},
            {{FileDiff::Added{"Manifest.plist", text}}},
+           {{FileDiff::Added{"../x", text}}},
+           {{FileDiff::Modified{""}}},
        }) {
     EXPECT_TRUE(checked(updates).starts_with("Error(domain: Diff, code: 5, ")) << updates[0].filePath();
   }
