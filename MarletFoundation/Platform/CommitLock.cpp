@@ -6,6 +6,7 @@
 #include <thread>
 
 #include "MarletFoundation/Platform/TreeSurvey.h"
+#include "MarletFoundation/Platform/WriteCancellation.h"
 
 namespace MarletFoundation {
 namespace {
@@ -43,6 +44,7 @@ void CommitLock::lock(int descriptor, int operation, const std::string& path) {
        pause = std::min(pause * 2, std::chrono::microseconds{20'000})) {
     if (retrying([&] { return ::flock(descriptor, operation | LOCK_NB); }) == 0 || errno != EWOULDBLOCK)
       return;
+    requireNotCancelled(path);
     if (std::chrono::steady_clock::now() > end)
       throwPosix(EBUSY, path, "Another program keeps it, or what it lies in, locked. Nothing was changed.");
     std::this_thread::sleep_for(pause);
