@@ -1,3 +1,4 @@
+#include "MarletFoundation/Data/PropertyListChildren.h"
 #include "MarletFoundation/Data/PropertyListSerializable.h"
 #include "MarletFoundation/Data/PropertyListValueBuilder.h"
 #include "MarletFoundation/Platform/PropertyListObjectBuilder.h"
@@ -14,40 +15,27 @@ void sendScalar(const PropertyListValue& value, PropertyListEvents& events) {
   events.boolean(*value.boolean());
 }
 
-// A value's container of which `next` children were sent.
-struct OpenValue {
-  const PropertyListValue* value;
-  std::size_t next = 0;
-};
-
 void sendValue(const PropertyListValue& root, PropertyListEvents& events) {
-  std::vector<OpenValue> open;
+  std::vector<PropertyListChildren> open;
   const auto send = [&](const PropertyListValue& value) {
+    if (!isPropertyListContainer(value)) return sendScalar(value, events);
     if (value.array()) {
       events.beginArray();
-      open.push_back({&value});
-    } else if (value.dictionary()) {
-      events.beginDictionary();
-      open.push_back({&value});
     } else {
-      sendScalar(value, events);
+      events.beginDictionary();
     }
+    open.emplace_back(value);
   };
   send(root);
   while (!open.empty()) {
-    const auto* const value = open.back().value;
-    const auto index = open.back().next++;
-    const auto* array = value->array();
-    if (index == (array ? array->size() : value->dictionary()->size())) {
+    auto& children = open.back();
+    if (children.atEnd()) {
       events.end();
       open.pop_back();
-    } else if (array) {
-      send((*array)[index]);
-    } else {
-      const auto& entry = value->dictionary()->begin()[static_cast<std::ptrdiff_t>(index)];
-      events.key(entry.key);
-      send(entry.value);
+      continue;
     }
+    if (children.isDictionary()) events.key(children.key());
+    send(children.next());
   }
 }
 

@@ -1,6 +1,6 @@
 #include <charconv>
 
-#include "MarletFoundation/Data/PropertyListValue.h"
+#include "MarletFoundation/Data/PropertyListChildren.h"
 #include "MarletFoundation/Platform/Text.h"
 
 namespace MarletFoundation {
@@ -21,10 +21,9 @@ std::string scalarDescription(const PropertyListValue& value) {
   return *value.boolean() ? "boolean(true)" : "boolean(false)";
 }
 
-// A container of which `next` children are printed.
 struct OpenContainer {
-  const PropertyListValue* value;
-  std::size_t next = 0;
+  PropertyListChildren children;
+  bool isFirst = true;
 };
 
 }  // namespace
@@ -33,32 +32,24 @@ std::string description(const PropertyListValue& value) {
   std::string text;
   std::vector<OpenContainer> open;
   const auto print = [&](const PropertyListValue& child) {
-    if (child.payload.index() > 1) {
+    if (!isPropertyListContainer(child)) {
       text += scalarDescription(child);
       return;
     }
     text += child.array() ? "array([" : child.dictionary()->empty() ? "dictionary([:" : "dictionary([";
-    open.push_back({&child});
+    open.push_back({PropertyListChildren(child)});
   };
   print(value);
   while (!open.empty()) {
-    auto& container = open.back();
-    const auto index = container.next++;
-    const auto* array = container.value->array();
-    const auto* dictionary = container.value->dictionary();
-    if (index == (array ? array->size() : dictionary->size())) {
+    auto& [children, isFirst] = open.back();
+    if (children.atEnd()) {
       text += "])";
       open.pop_back();
       continue;
     }
-    if (index > 0) text += ", ";
-    if (array) {
-      print((*array)[index]);
-    } else {
-      const auto& entry = dictionary->begin()[static_cast<std::ptrdiff_t>(index)];
-      text += quoted(entry.key) + ": ";
-      print(entry.value);
-    }
+    if (!std::exchange(isFirst, false)) text += ", ";
+    if (children.isDictionary()) text += quoted(children.key()) + ": ";
+    print(children.next());
   }
   return text;
 }

@@ -15,6 +15,12 @@ using Entry = PropertyListDictionary::Entry;
 constexpr int clearDepthLimit = 64;
 thread_local int clearDepth = 0;
 
+// Where more entries than these lie behind a place in an array, none comes or goes there.
+constexpr std::ptrdiff_t mostMoved = 64;
+
+// A set gives its elements as constants, since their keys must stay. Values may change.
+Entry& fromTree(const Entry& entry) { return const_cast<Entry&>(entry); }
+
 bool isContainer(const PropertyListValue& value) { return value.payload.index() < 2; }
 
 // The first bytes mostly tell.
@@ -42,8 +48,14 @@ bool equalScalars(const PropertyListValue& a, const PropertyListValue& b) {
 
 }  // namespace
 
-PropertyListDictionary::PropertyListDictionary(const PropertyListDictionary&) = default;
-PropertyListDictionary& PropertyListDictionary::operator=(const PropertyListDictionary&) = default;
+PropertyListDictionary::PropertyListDictionary(const PropertyListDictionary& other) {
+  entries_.reserve(other.size());
+  for (const auto& entry : other) entries_.push_back(entry);
+}
+
+PropertyListDictionary& PropertyListDictionary::operator=(const PropertyListDictionary& other) {
+  return *this = PropertyListDictionary(other);
+}
 
 PropertyListDictionary::PropertyListDictionary(
     std::initializer_list<std::pair<std::string_view, PropertyListValue>> entries) {
@@ -68,6 +80,10 @@ void PropertyListDictionary::sortEntries() {
 }
 
 const PropertyListValue* PropertyListDictionary::find(std::string_view key) const {
+  if (tree_) {
+    const auto found = tree_->find(key);
+    return found == tree_->end() ? nullptr : &found->value;
+  }
   // In a few keys, the right one is found sooner by its length than by order.
   constexpr std::size_t few = 12;
   if (entries_.size() <= few) {
@@ -76,8 +92,7 @@ const PropertyListValue* PropertyListDictionary::find(std::string_view key) cons
     }
     return nullptr;
   }
-  const auto found = std::lower_bound(entries_.begin(), entries_.end(), key,
-                                      [](const Entry& e, std::string_view k) { return e.key.view() < k; });
+  const auto found = std::lower_bound(entries_.begin(), entries_.end(), key, Before());
   return found != entries_.end() && found->key.view() == key ? &found->value : nullptr;
 }
 
@@ -86,24 +101,57 @@ PropertyListValue* PropertyListDictionary::find(std::string_view key) {
 }
 
 PropertyListValue& PropertyListDictionary::operator[](std::string_view key) {
-  const auto place = std::lower_bound(entries_.begin(), entries_.end(), key,
-                                      [](const Entry& e, std::string_view k) { return e.key.view() < k; });
-  if (place != entries_.end() && place->key.view() == key) return place->value;
-  return entries_.insert(place, {SharedString(key), PropertyListValue()})->value;
+  if (auto* const value = find(key)) return *value;
+  const auto place =
+      tree_ ? entries_.end() : std::lower_bound(entries_.begin(), entries_.end(), key, Before());
+  if (entries_.end() - place > mostMoved) growTree();
+  if (!tree_) return entries_.insert(place, {SharedString(key), PropertyListValue()})->value;
+  return fromTree(*tree_->emplace(SharedString(key), PropertyListValue()).first).value;
 }
 
 bool PropertyListDictionary::erase(std::string_view key) {
-  auto* const value = find(key);
-  if (!value) return false;
-  entries_.erase(std::find_if(entries_.begin(), entries_.end(),
-                              [value](const Entry& entry) { return &entry.value == value; }));
+  if (!contains(key)) return false;
+  const auto place =
+      tree_ ? entries_.end() : std::lower_bound(entries_.begin(), entries_.end(), key, Before());
+  if (entries_.end() - place > mostMoved) growTree();
+  if (tree_) {
+    tree_->erase(tree_->find(key));
+  } else {
+    entries_.erase(place);
+  }
   return true;
 }
 
+// The nodes come first: once they are there, nothing can fail any more.
+void PropertyListDictionary::growTree() {
+  auto tree = std::make_unique<Tree>();
+  for (const auto& entry : entries_) tree->emplace_hint(tree->end(), entry.key, PropertyListValue());
+  auto node = tree->begin();
+  for (auto& entry : entries_) fromTree(*node++).value = std::move(entry.value);
+  entries_ = Entries();
+  tree_ = std::move(tree);
+}
+
+Entry& PropertyListDictionary::fromEnd(std::size_t place) {
+  if (!tree_) return entries_.end()[-static_cast<std::ptrdiff_t>(place)];
+  return fromTree(*std::next(tree_->rbegin(), static_cast<std::ptrdiff_t>(place) - 1));
+}
+
+void PropertyListDictionary::removeLast() {
+  if (!tree_) return entries_.pop_back();
+  tree_->erase(std::prev(tree_->end()));
+}
+
+void PropertyListDictionary::clear() noexcept {
+  entries_.clear();
+  tree_.reset();
+}
+
 bool PropertyListDictionary::operator==(const PropertyListDictionary& other) const {
-  return std::equal(
-      entries_.begin(), entries_.end(), other.entries_.begin(), other.entries_.end(),
-      [](const Entry& a, const Entry& b) { return a.key.view() == b.key.view() && a.value == b.value; });
+  return size() == other.size() &&
+         std::equal(begin(), end(), other.begin(), [](const Entry& a, const Entry& b) {
+           return a.key.view() == b.key.view() && a.value == b.value;
+         });
 }
 
 PropertyListValue::PropertyListValue(Array value) : payload(std::move(value)) {}
@@ -155,16 +203,16 @@ void PropertyListValue::clearContainer() noexcept {
   auto* const dictionary = std::get_if<Dictionary>(&payload);
   // Mostly nothing lies deeper, and depth needn't be looked at.
   const auto holdsContainer = [](const PropertyListValue& value) { return isContainer(value); };
+  const auto isDeep = [](const Entry& entry) { return isContainer(entry.value); };
   const bool isDeeper = array ? std::any_of(array->begin(), array->end(), holdsContainer)
-                              : std::any_of(dictionary->begin(), dictionary->end(),
-                                            [](const Entry& entry) { return isContainer(entry.value); });
+                              : std::any_of(dictionary->begin(), dictionary->end(), isDeep);
   if (!isDeeper) return;
   if (clearDepth == clearDepthLimit) return clearWithoutStack();
   ++clearDepth;
   if (array) {
     array->clear();
   } else {
-    dictionary->entries_.clear();
+    dictionary->clear();
   }
   --clearDepth;
 }
@@ -177,13 +225,12 @@ std::size_t PropertyListValue::containedCount() const {
 PropertyListValue& PropertyListValue::fromEnd(std::size_t place) {
   if (auto* const values = std::get_if<Array>(&payload))
     return values->end()[-static_cast<std::ptrdiff_t>(place)];
-  auto& entries = std::get<Dictionary>(payload).entries_;
-  return entries.end()[-static_cast<std::ptrdiff_t>(place)].value;
+  return std::get<Dictionary>(payload).fromEnd(place).value;
 }
 
 void PropertyListValue::removeLast() {
   if (auto* const values = std::get_if<Array>(&payload)) return values->pop_back();
-  std::get<Dictionary>(payload).entries_.pop_back();
+  std::get<Dictionary>(payload).removeLast();
 }
 
 /// A destructor has no memory to ask for: the last place of each container that was entered holds the one around it.

@@ -3,6 +3,9 @@
 #include <concepts>
 #include <cstdint>
 #include <initializer_list>
+#include <iterator>
+#include <memory>
+#include <set>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -17,12 +20,16 @@ namespace MarletFoundation {
 
 struct PropertyListValue;
 
-/// A dictionary from string to value, kept as one array in ascending key order (by code point), so that
-/// lookup is logarithmic, iteration sorted, and a large one costs one allocation.
+/// A dictionary from string to value in ascending key order (by code point): lookup is logarithmic, iteration
+/// sorted. It is kept as one array, so that a large one costs one allocation, until keys come or go one by one
+/// within a large one: from then on as a tree, so that filling and emptying takes n log n.
 class MARLET_EXPORT PropertyListDictionary {
  public:
   struct Entry;
+  class Iterator;
   using Entries = std::vector<Entry>;
+  using iterator = Iterator;
+  using const_iterator = Iterator;
 
   PropertyListDictionary() noexcept;
   PropertyListDictionary(const PropertyListDictionary& other);
@@ -46,15 +53,26 @@ class MARLET_EXPORT PropertyListDictionary {
   /// True when there was one.
   bool erase(std::string_view key);
 
-  Entries::const_iterator begin() const;
-  Entries::const_iterator end() const;
+  Iterator begin() const;
+  Iterator end() const;
   bool operator==(const PropertyListDictionary& other) const;
 
  private:
   friend struct PropertyListValue;
-  void sortEntries();
+  struct Before;
+  using Tree = std::set<Entry, Before>;
 
+  void sortEntries();
+  /// Moves the entries from the array to a tree.
+  void growTree();
+  /// The `place`th entry from the end, counted from 1: one of the last two.
+  Entry& fromEnd(std::size_t place);
+  void removeLast();
+  void clear() noexcept;
+
+  // All of them, or none once there is a tree.
   Entries entries_;
+  std::unique_ptr<Tree> tree_;
 };
 
 /// One value of a property list. Copies are independent. Two are equal when they are the same case with equal
@@ -75,13 +93,17 @@ struct MARLET_EXPORT PropertyListValue {
   PropertyListValue(std::string value) : payload(std::move(value)) {}
   PropertyListValue(std::string_view value) : payload(std::string(value)) {}
   PropertyListValue(const char* value) : payload(std::string(value)) {}
+  PropertyListValue(std::nullptr_t) = delete;
   PropertyListValue(Data value) : payload(std::move(value)) {}
   PropertyListValue(Date value) : payload(value) {}
   template <std::integral Integer>
   requires(!std::same_as<Integer, bool>) PropertyListValue(Integer value)
       : payload(static_cast<std::int64_t>(value)) {}
-  PropertyListValue(double value) : payload(value) {}
-  PropertyListValue(bool value) : payload(value) {}
+  template <std::floating_point Real>
+  PropertyListValue(Real value) : payload(static_cast<double>(value)) {}
+  /// Only `bool` itself: a pointer is none.
+  template <std::same_as<bool> Boolean>
+  PropertyListValue(Boolean value) : payload(value) {}
   /// The named case, made in place.
   template <class Case, class... Arguments>
   explicit PropertyListValue(std::in_place_type_t<Case> named, Arguments&&... arguments)
@@ -135,13 +157,62 @@ struct PropertyListDictionary::Entry {
       : key(std::move(itsKey)), value(named, std::forward<Arguments>(arguments)...) {}
 };
 
+struct PropertyListDictionary::Before {
+  using is_transparent = void;
+  bool operator()(const Entry& a, const Entry& b) const { return a.key.view() < b.key.view(); }
+  bool operator()(const Entry& a, std::string_view b) const { return a.key.view() < b; }
+  bool operator()(std::string_view a, const Entry& b) const { return a < b.key.view(); }
+};
+
+/// Walks the entries in ascending order of their keys. It holds until the dictionary changes.
+class PropertyListDictionary::Iterator {
+ public:
+  using iterator_category = std::forward_iterator_tag;
+  using value_type = Entry;
+  using difference_type = std::ptrdiff_t;
+  using pointer = const Entry*;
+  using reference = const Entry&;
+
+  Iterator() = default;
+  explicit Iterator(const Entry* entry) : entry_(entry) {}
+  explicit Iterator(Tree::const_iterator node) : node_(node) {}
+
+  reference operator*() const { return entry_ ? *entry_ : *node_; }
+  pointer operator->() const { return &**this; }
+  Iterator& operator++() {
+    if (entry_) {
+      ++entry_;
+    } else {
+      ++node_;
+    }
+    return *this;
+  }
+  Iterator operator++(int) {
+    auto before = *this;
+    ++*this;
+    return before;
+  }
+  bool operator==(const Iterator&) const = default;
+
+ private:
+  // In an array, else null.
+  const Entry* entry_ = nullptr;
+  Tree::const_iterator node_{};
+};
+
 // Entries hold values, so what handles them has to wait until here.
 inline PropertyListDictionary::PropertyListDictionary() noexcept = default;
 inline PropertyListDictionary::PropertyListDictionary(PropertyListDictionary&&) noexcept = default;
-inline PropertyListDictionary& PropertyListDictionary::operator=(PropertyListDictionary&&) noexcept = default;
+inline PropertyListDictionary& PropertyListDictionary::operator=(PropertyListDictionary&& other) noexcept {
+  // `other` may lie within this dictionary, which therefore lives until the end.
+  auto taken = std::move(other);
+  std::swap(entries_, taken.entries_);
+  std::swap(tree_, taken.tree_);
+  return *this;
+}
 inline PropertyListDictionary::~PropertyListDictionary() = default;
-inline std::size_t PropertyListDictionary::size() const { return entries_.size(); }
-inline bool PropertyListDictionary::empty() const { return entries_.empty(); }
+inline std::size_t PropertyListDictionary::size() const { return tree_ ? tree_->size() : entries_.size(); }
+inline bool PropertyListDictionary::empty() const { return size() == 0; }
 inline PropertyListValue::Payload PropertyListValue::moved(Payload& payload) noexcept {
   switch (payload.index()) {
     case 0:
@@ -162,11 +233,11 @@ inline PropertyListValue::Payload PropertyListValue::moved(Payload& payload) noe
       return Payload(std::in_place_index<7>, *std::get_if<7>(&payload));
   }
 }
-inline PropertyListDictionary::Entries::const_iterator PropertyListDictionary::begin() const {
-  return entries_.begin();
+inline PropertyListDictionary::Iterator PropertyListDictionary::begin() const {
+  return tree_ ? Iterator(tree_->begin()) : Iterator(entries_.data());
 }
-inline PropertyListDictionary::Entries::const_iterator PropertyListDictionary::end() const {
-  return entries_.end();
+inline PropertyListDictionary::Iterator PropertyListDictionary::end() const {
+  return tree_ ? Iterator(tree_->end()) : Iterator(entries_.data() + entries_.size());
 }
 
 /// The printed form: `integer(7)`, `string("X")`, `array([…])`, `dictionary(["k": …])`.

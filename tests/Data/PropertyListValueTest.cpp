@@ -10,6 +10,13 @@ namespace {
 
 using Array = PropertyListValue::Array;
 
+// A look-up's pointer is no value, least of all `true`.
+static_assert(std::is_convertible_v<bool, PropertyListValue> &&
+              std::is_convertible_v<float, PropertyListValue>);
+static_assert(!std::is_constructible_v<PropertyListValue, PropertyListValue*>);
+static_assert(!std::is_constructible_v<PropertyListValue, const void*>);
+static_assert(!std::is_constructible_v<PropertyListValue, std::nullptr_t>);
+
 TEST(PropertyListValue, TellsCasesApart) {
   const PropertyListValue values[] = {1,
                                       1.0,
@@ -51,11 +58,14 @@ TEST(PropertyListValue, IsCopiedIndependently) {
   EXPECT_EQ(nested, PropertyListValue(Array{"inner"}));
   nested = std::get<Array>(nested.payload)[0];
   EXPECT_EQ(nested, PropertyListValue("inner"));
+  PropertyListDictionary outer{{"k", PropertyListDictionary{{"inner", 1}}}};
+  outer = std::move(std::get<PropertyListDictionary>(outer.find("k")->payload));
+  EXPECT_TRUE(outer == (PropertyListDictionary{{"inner", 1}}));
 }
 
 TEST(PropertyListValue, NeedsNoStackForDepth) {
   PropertyListValue deep("end");
-  for (int i = 0; i < 500000; ++i) {
+  for (int i = 0; i < 200000; ++i) {
     if (i % 2 == 0) {
       Array array(3);
       array[1] = std::move(deep);
@@ -63,12 +73,14 @@ TEST(PropertyListValue, NeedsNoStackForDepth) {
     } else {
       PropertyListDictionary dictionary;
       dictionary["k"] = std::move(deep);
+      // Every thousandth has grown to a tree.
+      for (int k = 100; i % 1000 == 1 && k > 0; --k) dictionary[std::to_string(k)] = k;
       deep = PropertyListValue(std::move(dictionary));
     }
   }
   auto copy = deep;
   EXPECT_TRUE(copy == deep);
-  EXPECT_GT(description(deep).size(), 5000000U);
+  EXPECT_GT(description(deep).size(), 2000000U);
   copy = 1;
   EXPECT_FALSE(copy == deep);
 }
@@ -95,6 +107,42 @@ TEST(PropertyListDictionary, IsAMap) {
       ++place;
     }
   }));
+}
+
+// Each key comes in the midst of the others and goes from there, and they stay where they are.
+TEST(PropertyListDictionary, MovesFewOthersWhenAKeyComesOrGoes) {
+  constexpr int count = 1009;
+  const auto keyAt = [](int i) { return std::to_string(i * 607 % count); };
+  std::map<std::string, const PropertyListValue*, std::less<>> places;
+  int moved = 0;
+  const auto look = [&](const PropertyListDictionary& dictionary) {
+    for (const auto& [key, value] : dictionary) {
+      auto& place = places.find(key.view())->second;
+      moved += place && place != &value;
+      place = &value;
+    }
+  };
+  PropertyListDictionary dictionary;
+  PropertyListDictionary::Entries entries;
+  for (int i = 0; i < count; ++i) {
+    dictionary[keyAt(i)] = i;
+    entries.push_back({SharedString(keyAt(i)), i});
+    places[keyAt(i)] = nullptr;
+    look(dictionary);
+  }
+  EXPECT_TRUE(dictionary == PropertyListDictionary(std::move(entries)));
+  EXPECT_EQ(*std::as_const(dictionary).find(keyAt(5)), PropertyListValue(5));
+  // The copy is an array again.
+  auto copy = dictionary;
+  for (auto* const emptied : {&dictionary, &copy}) {
+    for (auto& [key, place] : places) place = nullptr;
+    for (int i = 0; i < count; ++i) {
+      EXPECT_TRUE(emptied->erase(keyAt(i)) && !emptied->erase(keyAt(i)));
+      look(*emptied);
+    }
+    EXPECT_TRUE(emptied->empty() && *emptied == PropertyListDictionary());
+  }
+  EXPECT_LT(moved, 10 * count);
 }
 
 }  // namespace
