@@ -2,10 +2,11 @@
 #include <cmath>
 #include <cstring>
 
+#include "MarletFoundation/Data/PropertyListChildren.h"
 #include "MarletFoundation/Data/PropertyListWriters.h"
 #include "MarletFoundation/Platform/PropertyListError.h"
-#include "MarletFoundation/Platform/PropertyListEvents.h"
 #include "MarletFoundation/Platform/PropertyListText.h"
+#include "MarletFoundation/Platform/PropertyListWork.h"
 
 namespace MarletFoundation {
 namespace {
@@ -43,6 +44,8 @@ std::uint32_t hash(const Object& object) {
     if (place < object.bits) std::memcpy(&word, object.bytes + place, object.bits - place);
     mix(word);
   }
+  // A product's low bits know nothing of its factors' high ones, which for some numbers are all.
+  state = (state ^ state >> 32) * multiplier;
   return static_cast<std::uint32_t>(state >> 32);
 }
 
@@ -60,6 +63,18 @@ struct Slot {
   std::uint32_t object = 0;
 };
 
+// A container whose next child's object is to be referred to at a place.
+struct OpenContainer {
+  PropertyListChildren children;
+  std::size_t reference;
+};
+
+// How many places of the table are looked at for an equal scalar. Good hashes never need as many; where somebody
+// made numbers that share theirs, some are written again. At a place with the same hash a text may be compared, which
+// counts for more.
+constexpr int mostProbes = 512;
+constexpr int probesOfComparison = 64;
+
 class BinaryWriter {
  public:
   std::string write(const PropertyListValue& value);
@@ -67,6 +82,7 @@ class BinaryWriter {
  private:
   std::uint32_t add(const PropertyListValue& value);
   std::uint32_t addContainer(const PropertyListValue& value);
+  void addNextChild();
   std::uint32_t addScalar(const Object& scalar);
   std::uint32_t addText(Kind kind, std::string_view text);
   std::uint32_t append(const Object& object);
@@ -85,7 +101,8 @@ class BinaryWriter {
   // Scalars by hash. Its size is a power of two.
   std::vector<Slot> table_ = std::vector<Slot>(64);
   std::size_t scalarCount_ = 0;
-  std::size_t depth_ = 0;
+  std::vector<OpenContainer> open_;
+  std::size_t probes_ = 0;
   std::size_t textWritten_ = 0;
   std::size_t textShared_ = 0;
   unsigned referenceWidth_ = 1;
@@ -94,6 +111,8 @@ class BinaryWriter {
 
 std::string BinaryWriter::write(const PropertyListValue& value) {
   add(value);
+  while (!open_.empty()) addNextChild();
+  countPropertyListWork(probes_);
   referenceWidth_ = widthOf(objects_.size() - 1);
   bytes_ = "bplist00";
   std::vector<std::uint64_t> offsets;
@@ -130,34 +149,27 @@ std::uint32_t BinaryWriter::add(const PropertyListValue& value) {
   return addContainer(value);
 }
 
+// Of a dictionary, the keys come before all values.
 std::uint32_t BinaryWriter::addContainer(const PropertyListValue& value) {
-  if (depth_++ == PropertyListDepthLimit) throw propertyListError(tooDeep);
+  const auto* dictionary = value.dictionary();
+  const auto count = dictionary ? dictionary->size() : value.array()->size();
   auto place = references_.size();
-  std::uint32_t object;
-  if (const auto* array = value.array()) {
-    object = append({Kind::array, place});
-    references_.resize(place + 1 + array->size());
-    references_[place++] = static_cast<std::uint32_t>(array->size());
-    for (const auto& child : *array) {
-      const auto number = add(child);
-      references_[place++] = number;
-    }
-  } else {
-    const auto& dictionary = *value.dictionary();
-    object = append({Kind::dictionary, place});
-    references_.resize(place + 1 + 2 * dictionary.size());
-    references_[place++] = static_cast<std::uint32_t>(dictionary.size());
-    for (const auto& entry : dictionary) {
-      const auto number = addText(Kind::string, entry.key);
-      references_[place++] = number;
-    }
-    for (const auto& entry : dictionary) {
-      const auto number = add(entry.value);
-      references_[place++] = number;
-    }
+  const auto object = append({dictionary ? Kind::dictionary : Kind::array, place});
+  references_.resize(place + 1 + (dictionary ? 2 * count : count));
+  references_[place++] = static_cast<std::uint32_t>(count);
+  if (dictionary) {
+    for (const auto& entry : *dictionary) references_[place++] = addText(Kind::string, entry.key);
   }
-  --depth_;
+  open_.push_back({PropertyListChildren(value), place});
   return object;
+}
+
+void BinaryWriter::addNextChild() {
+  auto& container = open_.back();
+  if (container.children.atEnd()) return open_.pop_back();
+  const auto place = container.reference++;
+  const auto object = add(container.children.next());
+  references_[place] = object;
 }
 
 std::uint32_t BinaryWriter::append(const Object& object) {
@@ -171,8 +183,11 @@ std::uint32_t BinaryWriter::addScalar(const Object& scalar) {
   const auto mask = table_.size() - 1;
   const auto key = hash(scalar);
   auto slot = key & mask;
-  for (; table_[slot].object != 0; slot = (slot + 1) & mask) {
+  for (auto left = mostProbes; table_[slot].object != 0; slot = (slot + 1) & mask) {
     const auto object = table_[slot].object;
+    ++probes_;
+    left -= table_[slot].hash == key ? probesOfComparison : 1;
+    if (left <= 0) return append(scalar);
     if (table_[slot].hash != key || !(objects_[object] == scalar)) continue;
     if (!scalar.isText()) return object;
     // A reader may only expand a file in proportion to its size. A long text that is repeated beyond that is

@@ -22,13 +22,13 @@ concept PropertyListSerializable = std::constructible_from<T, const PropertyList
   { t.propertyListValue() } -> std::convertible_to<PropertyListValue>;
 };
 
-/// Reading and writing of values: XML and binary. Failures are `ErrorObject`s of `PropertyListErrorDomain`
-/// that say what is wrong and where.
+/// Reading and writing of values of any depth: XML and binary. Failures are `ErrorObject`s of
+/// `PropertyListErrorDomain` that say what is wrong and where.
 namespace PropertyListSerialization {
 MARLET_EXPORT PropertyListValue read(const Data& data);
-/// Throws for what the form can't carry: containers nested deeper than 512, text that is not valid UTF-8, a
-/// date that is not finite; in XML also a character that XML has none of, and a date outside the years 0 to
-/// 9999. XML keeps of a date its whole second, rounded down.
+/// Throws for what the form can't carry: text that is not valid UTF-8, a date that is not finite; in XML also a
+/// character that XML has none of, and a date outside the years 0 to 9999. XML keeps of a date its whole second,
+/// rounded down.
 MARLET_EXPORT Data write(const PropertyListValue& value, PropertyListFormat format);
 }  // namespace PropertyListSerialization
 

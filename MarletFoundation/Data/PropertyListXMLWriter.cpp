@@ -1,8 +1,9 @@
+#include <algorithm>
 #include <array>
 
+#include "MarletFoundation/Data/PropertyListChildren.h"
 #include "MarletFoundation/Data/PropertyListWriters.h"
 #include "MarletFoundation/Platform/PropertyListError.h"
-#include "MarletFoundation/Platform/PropertyListEvents.h"
 #include "MarletFoundation/Platform/PropertyListScalars.h"
 #include "MarletFoundation/Platform/PropertyListText.h"
 #include "MarletFoundation/Platform/Text.h"
@@ -23,28 +24,30 @@ constexpr auto references = [] {
   return table;
 }();
 
+// Deeper lines are indented no further, so that the output grows with the value alone.
+constexpr std::size_t deepestIndentation = 512;
+
 class XMLWriter {
  public:
   std::string write(const PropertyListValue& value) {
     text_ = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<plist version=\"1.0\">\n";
     writeValue(value);
+    while (!open_.empty()) writeNextChild();
     text_ += "</plist>\n";
     return std::move(text_);
   }
 
  private:
   void writeValue(const PropertyListValue& value);
-  void writeArray(const PropertyListValue::Array& array);
-  void writeDictionary(const PropertyListDictionary& dictionary);
+  void open(const PropertyListValue& container);
+  void writeNextChild();
   void writeText(std::string_view text);
   static void checkText(std::string_view text);
   void writeWithReferences(std::string_view text);
-  void open();
-  void close();
-  void indent() { text_.append(depth_, '\t'); }
+  void indent() { text_.append(std::min(open_.size(), deepestIndentation), '\t'); }
 
   std::string text_;
-  std::size_t depth_ = 0;
+  std::vector<PropertyListChildren> open_;
 };
 
 void XMLWriter::writeValue(const PropertyListValue& value) {
@@ -72,52 +75,38 @@ void XMLWriter::writeValue(const PropertyListValue& value) {
     text_ += "<data>";
     PropertyListScalars::appendBase64(text_, data->view());
     text_ += "</data>\n";
-  } else if (const auto* array = value.array()) {
-    writeArray(*array);
   } else {
-    writeDictionary(*value.dictionary());
+    open(value);
   }
 }
 
-void XMLWriter::writeArray(const PropertyListValue::Array& array) {
-  open();
-  if (array.empty()) {
-    text_ += "<array/>\n";
-  } else {
-    text_ += "<array>\n";
-    for (const auto& child : array) writeValue(child);
+void XMLWriter::open(const PropertyListValue& container) {
+  const PropertyListChildren children(container);
+  if (children.atEnd()) {
+    text_ += children.isDictionary() ? "<dict/>\n" : "<array/>\n";
+    return;
   }
-  close();
-  if (array.empty()) return;
-  indent();
-  text_ += "</array>\n";
+  text_ += children.isDictionary() ? "<dict>\n" : "<array>\n";
+  open_.push_back(children);
 }
 
-void XMLWriter::writeDictionary(const PropertyListDictionary& dictionary) {
-  open();
-  if (dictionary.empty()) {
-    text_ += "<dict/>\n";
-  } else {
-    text_ += "<dict>\n";
-    for (const auto& [key, child] : dictionary) {
-      indent();
-      text_ += "<key>";
-      writeText(key);
-      text_ += "</key>\n";
-      writeValue(child);
-    }
+void XMLWriter::writeNextChild() {
+  auto& container = open_.back();
+  if (container.atEnd()) {
+    const bool isDictionary = container.isDictionary();
+    open_.pop_back();
+    indent();
+    text_ += isDictionary ? "</dict>\n" : "</array>\n";
+    return;
   }
-  close();
-  if (dictionary.empty()) return;
-  indent();
-  text_ += "</dict>\n";
+  if (container.isDictionary()) {
+    indent();
+    text_ += "<key>";
+    writeText(container.key());
+    text_ += "</key>\n";
+  }
+  writeValue(container.next());
 }
-
-void XMLWriter::open() {
-  if (depth_++ == PropertyListDepthLimit) throw propertyListError(tooDeep);
-}
-
-void XMLWriter::close() { --depth_; }
 
 void XMLWriter::writeText(std::string_view text) {
   // Most texts need neither a look at their characters nor references. One loop without branches tells.

@@ -1,9 +1,10 @@
 #include <algorithm>
-#include <array>
 #include <bit>
 #include <cmath>
 #include <cstring>
 #include <limits>
+#include <unordered_set>
+#include <vector>
 
 #include "MarletFoundation/Platform/PropertyListError.h"
 #include "MarletFoundation/Platform/PropertyListEvents.h"
@@ -66,9 +67,7 @@ class BinaryReader {
   std::uint64_t objectCount_ = 0;
   std::uint64_t rootObject_ = 0;
   std::size_t tableOffset_ = 0;
-  // The open containers, the first `depth_` of these.
-  std::array<OpenContainer, PropertyListDepthLimit> open_;
-  std::size_t depth_ = 0;
+  std::vector<OpenContainer> open_;
   std::string scratch_;
   // What sharing may still expand to.
   std::size_t nodesLeft_ = 0;
@@ -80,7 +79,7 @@ void BinaryReader::read() {
   nodesLeft_ = 4 * bytes_.size() + 1024;
   textLeft_ = 16 * bytes_.size() + 65536;
   readValue(rootObject_, bytes_.size() - 16);
-  while (depth_ > 0) readNextChild();
+  while (!open_.empty()) readNextChild();
 }
 
 void BinaryReader::readTrailer() {
@@ -216,9 +215,8 @@ void BinaryReader::open(std::uint64_t object, std::size_t place, bool isDictiona
   auto start = place;
   const auto length = count(start);
   body(place, start, length, isDictionary ? 2 * referenceWidth_ : referenceWidth_);
-  if (depth_ == PropertyListDepthLimit) fail(isCyclic() ? cycle : tooDeep, place);
   const auto values = isDictionary ? start + static_cast<std::size_t>(length) * referenceWidth_ : start;
-  open_[depth_++] = {object, values, start, length, 0, isDictionary};
+  open_.push_back({object, values, start, length, 0, isDictionary});
   if (isDictionary) {
     events_.beginDictionary();
   } else {
@@ -227,9 +225,9 @@ void BinaryReader::open(std::uint64_t object, std::size_t place, bool isDictiona
 }
 
 void BinaryReader::readNextChild() {
-  auto& container = open_[depth_ - 1];
+  auto& container = open_.back();
   if (container.next == container.count) {
-    --depth_;
+    open_.pop_back();
     return events_.end();
   }
   const auto distance = static_cast<std::size_t>(container.next++) * referenceWidth_;
@@ -267,12 +265,11 @@ inline void BinaryReader::spend(std::size_t nodes, std::size_t textBytes, std::s
 }
 
 bool BinaryReader::isCyclic() const {
-  const auto end = open_.begin() + static_cast<std::ptrdiff_t>(depth_);
-  for (auto outer = open_.begin(); outer != end; ++outer) {
-    const auto isSame = [outer](const OpenContainer& inner) { return inner.object == outer->object; };
-    if (std::any_of(outer + 1, end, isSame)) return true;
-  }
-  return false;
+  std::unordered_set<std::uint64_t> met;
+  const auto isRepeated = [&met](const OpenContainer& container) {
+    return !met.insert(container.object).second;
+  };
+  return std::any_of(open_.begin(), open_.end(), isRepeated);
 }
 
 }  // namespace

@@ -8,8 +8,6 @@ std::string_view words(PropertyListErrorCode code) {
   switch (code) {
     case unknownFormat:
       return "The data is neither an XML nor a binary property list";
-    case tooDeep:
-      return "Containers are nested deeper than 512";
     case integerOutOfRange:
       return "An integer does not fit in 64 bits with sign";
     case invalidEncoding:

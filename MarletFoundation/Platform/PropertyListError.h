@@ -14,8 +14,8 @@ inline constexpr std::string_view ByteOffsetKey = "ByteOffset";
 /// What can be wrong with a property list. The numbers stay the same between releases.
 enum class PropertyListErrorCode {
   unknownFormat = 1,
-  tooDeep,
-  integerOutOfRange,
+  // 2 was for depth, which has no limit any more.
+  integerOutOfRange = 3,
   // XML
   invalidEncoding,
   unsupportedEncoding,

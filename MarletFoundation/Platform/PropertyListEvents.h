@@ -9,9 +9,6 @@
 
 namespace MarletFoundation {
 
-/// Containers nested deeper than this are refused by the readers and the writers.
-inline constexpr std::size_t PropertyListDepthLimit = 512;
-
 /// Takes what a reader meets, in document order. A reader makes well-formed sequences only: one value, every
 /// container closed, in a dictionary a key before each value. Texts are valid UTF-8 and hold during the call.
 class PropertyListEvents {

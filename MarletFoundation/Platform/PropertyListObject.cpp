@@ -4,7 +4,6 @@
 #include <cmath>
 #include <functional>
 #include <limits>
-#include <new>
 
 namespace MarletFoundation {
 namespace {
@@ -12,26 +11,18 @@ namespace {
 // How deep destructors may follow objects on the stack. What lies deeper waits for the outermost one.
 constexpr int releaseDepthLimit = 64;
 thread_local int releaseDepth = 0;
-thread_local PropertyListObjects* waiting = nullptr;
+thread_local ContainedPropertyListObjects* waiting = nullptr;
 
-void release(PropertyListObjects& objects) noexcept {
-  if (releaseDepth == releaseDepthLimit) {
-    try {
-      waiting->insert(waiting->end(), std::make_move_iterator(objects.begin()),
-                      std::make_move_iterator(objects.end()));
-    } catch (const std::bad_alloc&) {
-      // They go with their owner, on the stack.
-    }
-    return;
-  }
-  PropertyListObjects deeper;
+void release(ContainedPropertyListObjects& objects) noexcept {
+  if (releaseDepth == releaseDepthLimit) return waiting->splice(waiting->end(), objects);
+  ContainedPropertyListObjects deeper;
   const bool isOutermost = releaseDepth == 0;
   if (isOutermost) waiting = &deeper;
   ++releaseDepth;
   objects.clear();
   while (isOutermost && !deeper.empty()) {
-    const auto next = std::move(deeper.back());
-    deeper.pop_back();
+    const auto next = std::move(deeper.front());
+    deeper.pop_front();
   }
   --releaseDepth;
 }
@@ -39,6 +30,39 @@ void release(PropertyListObjects& objects) noexcept {
 template <class Object>
 const Object* as(const PropertyListObject& object) {
   return dynamic_cast<const Object*>(&object);
+}
+
+// Compares containers without following them on the stack.
+bool haveEqualContents(const PropertyListObject& a, const PropertyListObject& b) {
+  std::vector<std::pair<PropertyListObjectPointer, PropertyListObjectPointer>> open;
+  // Whether two objects may be equal, as far as they tell without what they contain, which is compared later.
+  const auto mayBeEqual = [&open](const PropertyListObject& one, const PropertyListObject& other) {
+    if (const auto* ours = as<ArrayObject>(one)) {
+      const auto* theirs = as<ArrayObject>(other);
+      if (!theirs || ours->objects().size() != theirs->objects().size()) return false;
+      for (std::size_t i = 0; i < ours->objects().size(); ++i)
+        open.emplace_back(ours->objects()[i], theirs->objects()[i]);
+      return true;
+    }
+    // A host's own dictionaries compare as they like.
+    if (!as<PlainDictionary>(one) && !as<MLFSortedDictionary>(one)) return one.isEqual(other);
+    const auto* ours = as<DictionaryObject>(one);
+    const auto* theirs = as<DictionaryObject>(other);
+    if (!theirs || ours->count() != theirs->count()) return false;
+    for (const auto& key : ours->allKeys()) {
+      auto value = theirs->objectForKey(*key);
+      if (!value) return false;
+      open.emplace_back(ours->objectForKey(*key), std::move(value));
+    }
+    return true;
+  };
+  if (!mayBeEqual(a, b)) return false;
+  while (!open.empty()) {
+    const auto [one, other] = std::move(open.back());
+    open.pop_back();
+    if (!mayBeEqual(*one, *other)) return false;
+  }
+  return true;
 }
 
 int rank(const PropertyListObject& object) {
@@ -115,12 +139,8 @@ std::size_t NumberObject::hash() const { return std::hash<double>()(doubleValue(
 
 ArrayObject::~ArrayObject() { release(objects_); }
 
-bool ArrayObject::isEqual(const PropertyListObject& other) const {
-  const auto* array = as<ArrayObject>(other);
-  return array && std::equal(objects_.begin(), objects_.end(), array->objects_.begin(), array->objects_.end(),
-                             [](const auto& a, const auto& b) { return a->isEqual(*b); });
-}
-std::size_t ArrayObject::hash() const { return objects_.size(); }
+bool ArrayObject::isEqual(const PropertyListObject& other) const { return haveEqualContents(*this, other); }
+std::size_t ArrayObject::hash() const { return objects().size(); }
 
 bool DictionaryObject::isEqual(const PropertyListObject& other) const {
   const auto* dictionary = as<DictionaryObject>(other);
@@ -129,16 +149,18 @@ bool DictionaryObject::isEqual(const PropertyListObject& other) const {
 std::size_t DictionaryObject::hash() const { return count(); }
 
 PlainDictionary::PlainDictionary(const PropertyListObjects& objects, const PropertyListObjects& keys) {
-  keys_.reserve(keys.size());
-  values_.reserve(keys.size());
+  auto& kept = keys_.front();
+  auto& values = values_.front();
+  kept.reserve(keys.size());
+  values.reserve(keys.size());
   places_.reserve(keys.size());
   for (std::size_t i = 0; i < keys.size(); ++i) {
-    const auto [place, isNew] = places_.try_emplace(keys[i].get(), keys_.size());
+    const auto [place, isNew] = places_.try_emplace(keys[i].get(), kept.size());
     if (isNew) {
-      keys_.push_back(keys[i]);
-      values_.push_back(objects[i]);
+      kept.push_back(keys[i]);
+      values.push_back(objects[i]);
     } else {
-      values_[place->second] = objects[i];
+      values[place->second] = objects[i];
     }
   }
 }
@@ -150,16 +172,11 @@ PlainDictionary::~PlainDictionary() {
 
 PropertyListObjectPointer PlainDictionary::objectForKey(const PropertyListObject& key) const {
   const auto found = places_.find(&key);
-  return found == places_.end() ? nullptr : values_[found->second];
+  return found == places_.end() ? nullptr : values_.front()[found->second];
 }
 
 bool PlainDictionary::isEqualToDictionary(const DictionaryObject& other) const {
-  if (count() != other.count()) return false;
-  for (std::size_t i = 0; i < keys_.size(); ++i) {
-    const auto theirs = other.objectForKey(*keys_[i]);
-    if (!theirs || !values_[i]->isEqual(*theirs)) return false;
-  }
-  return true;
+  return haveEqualContents(*this, other);
 }
 
 MLFSortedDictionary::MLFSortedDictionary(const PropertyListObjects& objects, const PropertyListObjects& keys)

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <list>
 #include <memory>
 #include <string>
 #include <string_view>
@@ -16,9 +17,12 @@ class PropertyListObject;
 /// Objects are immutable and shared.
 using PropertyListObjectPointer = std::shared_ptr<const PropertyListObject>;
 using PropertyListObjects = std::vector<PropertyListObjectPointer>;
+/// A list of one: a container that lies too deep to be destroyed on the stack hands on what it holds, which may need
+/// no memory.
+using ContainedPropertyListObjects = std::list<PropertyListObjects>;
 
 /// An untyped object, as a reader makes it or a host hands it over. The class tells the kind; a host may add
-/// kinds of its own. Objects nested ever so deep are destroyed without using up the stack.
+/// kinds of its own. Objects nested ever so deep are compared and destroyed without using up the stack.
 class MARLET_EXPORT PropertyListObject {
  public:
   virtual ~PropertyListObject() = default;
@@ -79,14 +83,14 @@ class MARLET_EXPORT NumberObject final : public PropertyListObject {
 
 class MARLET_EXPORT ArrayObject final : public PropertyListObject {
  public:
-  explicit ArrayObject(PropertyListObjects objects) : objects_(std::move(objects)) {}
+  explicit ArrayObject(PropertyListObjects objects) { objects_.push_back(std::move(objects)); }
   ~ArrayObject() override;
-  const PropertyListObjects& objects() const { return objects_; }
+  const PropertyListObjects& objects() const { return objects_.front(); }
   bool isEqual(const PropertyListObject& other) const override;
   std::size_t hash() const override;
 
  private:
-  PropertyListObjects objects_;
+  ContainedPropertyListObjects objects_;
 };
 
 /// Gives one object after another, then null.
@@ -123,11 +127,11 @@ class MARLET_EXPORT PlainDictionary final : public DictionaryObject {
   PlainDictionary(const PropertyListObjects& objects, const PropertyListObjects& keys);
   ~PlainDictionary() override;
 
-  std::size_t count() const override { return keys_.size(); }
+  std::size_t count() const override { return keys_.front().size(); }
   PropertyListObjectPointer objectForKey(const PropertyListObject& key) const override;
   bool isEqualToDictionary(const DictionaryObject& other) const override;
-  PropertyListObjects allKeys() const override { return keys_; }
-  PropertyListObjects allValues() const override { return values_; }
+  PropertyListObjects allKeys() const override { return keys_.front(); }
+  PropertyListObjects allValues() const override { return values_.front(); }
 
  private:
   struct KeyHash {
@@ -137,8 +141,8 @@ class MARLET_EXPORT PlainDictionary final : public DictionaryObject {
     bool operator()(const PropertyListObject* a, const PropertyListObject* b) const { return a->isEqual(*b); }
   };
 
-  PropertyListObjects keys_;
-  PropertyListObjects values_;
+  ContainedPropertyListObjects keys_{1};
+  ContainedPropertyListObjects values_{1};
   std::unordered_map<const PropertyListObject*, std::size_t, KeyHash, KeyEqual> places_;
 };
 

@@ -35,8 +35,11 @@ const char* PropertyListXMLCursor::find(char character, const char* from) const 
     if (zeros != 0) break;
   }
   if (from == end_) return end_;
-  const auto* const found = std::memchr(from, character, static_cast<std::size_t>(end_ - from));
-  return found ? static_cast<const char*>(found) : end_;
+  const auto* found =
+      static_cast<const char*>(std::memchr(from, character, static_cast<std::size_t>(end_ - from)));
+  if (!found) found = end_;
+  searched_ += static_cast<std::size_t>(found - from);
+  return found;
 }
 
 std::string_view PropertyListXMLCursor::readName() {

@@ -5,6 +5,7 @@
 
 #include "MarletFoundation/Platform/PropertyListEncoding.h"
 #include "MarletFoundation/Platform/PropertyListError.h"
+#include "MarletFoundation/Platform/PropertyListWork.h"
 
 namespace MarletFoundation {
 
@@ -18,6 +19,9 @@ class PropertyListXMLCursor {
         begin_(document.view().data()),
         end_(begin_ + document.view().size()),
         place_(begin_) {}
+  PropertyListXMLCursor(const PropertyListXMLCursor&) = delete;
+  PropertyListXMLCursor& operator=(const PropertyListXMLCursor&) = delete;
+  ~PropertyListXMLCursor() { countPropertyListWork(searched_); }
 
   const char* place() const { return place_; }
   const char* end() const { return end_; }
@@ -73,6 +77,8 @@ class PropertyListXMLCursor {
   const char* const begin_;
   const char* const end_;
   const char* place_;
+  // Bytes, beyond what lies near.
+  mutable std::size_t searched_ = 0;
 };
 
 }  // namespace MarletFoundation

@@ -1,6 +1,6 @@
 #include <algorithm>
-#include <array>
 #include <optional>
+#include <vector>
 
 #include "MarletFoundation/Platform/PropertyListEvents.h"
 #include "MarletFoundation/Platform/PropertyListScalars.h"
@@ -61,7 +61,8 @@ class XMLReader {
   template <std::size_t Size>
   std::string_view readText(Element element, const char (&endTag)[Size]);
   std::string_view readMixedText(Element element);
-  /// The first reference or carriage return from `place` on, or the end.
+  /// The first tag, reference or carriage return from `place` on, or the end.
+  const char* nextTag(const char* place) { return next('<', place, nextTag_); }
   const char* nextReference(const char* place) { return next('&', place, nextReference_); }
   const char* nextReturn(const char* place) { return next('\r', place, nextReturn_); }
   const char* next(char character, const char* place, const char*& known) {
@@ -78,11 +79,10 @@ class XMLReader {
 
   PropertyListXMLCursor cursor_;
   PropertyListEvents& events_;
-  // The open elements, the first `depth_` of these.
-  std::array<OpenElement, PropertyListDepthLimit + 1> open_;
-  std::size_t depth_ = 0;
+  std::vector<OpenElement> open_;
   std::string scratch_;
-  // As far as they are known, so that texts without them are not searched for them one by one.
+  // As far as they are known, so that what lies before them is searched for them once.
+  const char* nextTag_ = cursor_.place();
   const char* nextReference_ = cursor_.place();
   const char* nextReturn_ = cursor_.place();
   bool hasRoot_ = false;
@@ -98,7 +98,7 @@ void XMLReader::read() {
     if (cursor_.next() != '<') fail(misplacedText, cursor_.place());
     readMarkup();
   }
-  if (depth_ > 0) fail(unexpectedEnd, cursor_.end());
+  if (!open_.empty()) fail(unexpectedEnd, cursor_.end());
   if (!hasRoot_) fail(missingRoot, cursor_.end());
 }
 
@@ -148,7 +148,7 @@ void XMLReader::readMarkup() {
 void XMLReader::skipDeclaration(const char* tag) {
   if (cursor_.startsWith("<!--", tag)) return cursor_.skipComment();
   if (cursor_.startsWith("<![CDATA[", tag)) fail(misplacedText, tag);
-  if (!cursor_.startsWith("<!DOCTYPE", tag) || depth_ > 0 || hasRoot_ || hasPlist_ || hasDocumentType_)
+  if (!cursor_.startsWith("<!DOCTYPE", tag) || !open_.empty() || hasRoot_ || hasPlist_ || hasDocumentType_)
     fail(malformedMarkup, tag);
   hasDocumentType_ = true;
   cursor_.skipDocumentType();
@@ -176,30 +176,29 @@ void XMLReader::readStartTag(const char* tag) {
 }
 
 void XMLReader::readEndTag(const char* tag) {
-  const auto element = depth_ > 0 ? open_[depth_ - 1].element : Element::plist;
+  const auto element = open_.empty() ? Element::plist : open_.back().element;
   if ((element == Element::dict && cursor_.accept("</dict>")) ||
       (element == Element::array && cursor_.accept("</array>"))) {
     return endContainer(tag);
   }
   cursor_.moveTo(tag + 2);
   const auto name = cursor_.readName();
-  if (depth_ == 0 || name != nameOf(element)) fail(mismatchedTag, tag, name);
+  if (open_.empty() || name != nameOf(element)) fail(mismatchedTag, tag, name);
   cursor_.skipBlanks();
   if (!cursor_.accept(">")) fail(malformedMarkup, tag);
   endContainer(tag);
 }
 
 void XMLReader::beginRoot(const char* tag) {
-  if (depth_ > 0) fail(misplacedElement, tag, nameOf(Element::plist));
+  if (!open_.empty()) fail(misplacedElement, tag, nameOf(Element::plist));
   if (hasRoot_) fail(secondRoot, tag);
   hasPlist_ = true;
-  open_[depth_++] = {Element::plist, false};
+  open_.push_back({Element::plist, false});
 }
 
 void XMLReader::beginContainer(Element element, const char* tag) {
   beginValue(tag);
-  if (depth_ - hasPlist_ == PropertyListDepthLimit) fail(tooDeep, tag);
-  open_[depth_++] = {element, false};
+  open_.push_back({element, false});
   if (element == Element::array) {
     events_.beginArray();
   } else {
@@ -208,9 +207,9 @@ void XMLReader::beginContainer(Element element, const char* tag) {
 }
 
 void XMLReader::endContainer(const char* tag) {
-  const auto [element, hasKey] = open_[depth_ - 1];
+  const auto [element, hasKey] = open_.back();
   if (hasKey) fail(missingValue, tag);
-  --depth_;
+  open_.pop_back();
   if (element != Element::plist) {
     events_.end();
   } else if (!hasRoot_) {
@@ -219,20 +218,20 @@ void XMLReader::endContainer(const char* tag) {
 }
 
 inline void XMLReader::beginValue(const char* tag) {
-  if (depth_ == 0 || open_[depth_ - 1].element == Element::plist) {
-    if (hasRoot_ || (depth_ == 0 && hasPlist_)) fail(secondRoot, tag);
+  if (open_.empty() || open_.back().element == Element::plist) {
+    if (hasRoot_ || (open_.empty() && hasPlist_)) fail(secondRoot, tag);
     hasRoot_ = true;
-  } else if (open_[depth_ - 1].element == Element::dict) {
-    if (!open_[depth_ - 1].hasKey) fail(missingKey, tag);
-    open_[depth_ - 1].hasKey = false;
+  } else if (open_.back().element == Element::dict) {
+    if (!open_.back().hasKey) fail(missingKey, tag);
+    open_.back().hasKey = false;
   }
 }
 
 inline void XMLReader::beginKey(const char* tag) {
-  if (depth_ == 0 || open_[depth_ - 1].element != Element::dict)
+  if (open_.empty() || open_.back().element != Element::dict)
     fail(misplacedElement, tag, nameOf(Element::key));
-  if (open_[depth_ - 1].hasKey) fail(missingValue, tag);
-  open_[depth_ - 1].hasKey = true;
+  if (open_.back().hasKey) fail(missingValue, tag);
+  open_.back().hasKey = true;
 }
 
 void XMLReader::readScalar(Element element, bool isEmpty, const char* tag) {
@@ -281,7 +280,7 @@ void XMLReader::sendInteger(std::string_view text, const char* tag) {
 template <std::size_t Size>
 inline std::string_view XMLReader::readText(Element element, const char (&endTag)[Size]) {
   const char* const start = cursor_.place();
-  const char* const tag = cursor_.find('<', start);
+  const char* const tag = nextTag(start);
   if (nextReference(start) < tag || nextReturn(start) < tag || !cursor_.startsWith(endTag, tag))
     return readMixedText(element);
   cursor_.moveTo(tag + Size - 1);
@@ -295,7 +294,7 @@ std::string_view XMLReader::readMixedText(Element element) {
     if (*start == '&') {
       appendReference();
     } else if (*start != '<') {
-      cursor_.moveTo(std::min(cursor_.find('<', start), nextReference(start)));
+      cursor_.moveTo(std::min(nextTag(start), nextReference(start)));
       appendText(start, cursor_.place());
     } else if (cursor_.accept("<![CDATA[")) {
       const char* const text = cursor_.place();

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "MarletFoundation/Data/PropertyListSerializable.h"
+#include "support/FailingAllocation.h"
 
 namespace MarletFoundation::test {
 namespace {
@@ -128,6 +129,14 @@ TEST(PropertyListObject, ComesOfDeepValuesWithSortedDictionaries) {
   }
   const auto object = propertyListObject(deep);
   EXPECT_TRUE(propertyListValue(object) == deep);
+  auto same = propertyListObject(deep);
+  EXPECT_TRUE(same->isEqual(*object));
+  EXPECT_FALSE(array({same})->isEqual(*object));
+  {
+    // It goes without asking for memory.
+    const FailingAllocation failing(1, true);
+    same.reset();
+  }
   const auto sorted =
       propertyListObject(PropertyListDictionary{{"b", PropertyListDictionary{{"z", 1}, {"y", 2}}}});
   const auto inner = dynamic_cast<const MLFSortedDictionary&>(*sorted).objectForKey(*text("b"));
