@@ -1,5 +1,6 @@
 #include "MarletFoundation/Marlet/MarletBookSnapshot.h"
 
+#include "MarletFoundation/Marlet/ListedSnapshots.h"
 #include "MarletFoundation/Marlet/LoadChecks.h"
 #include "MarletFoundation/Marlet/MarletBook.h"
 #include "MarletFoundation/PathUtilities/PathUniquifier.h"
@@ -47,15 +48,17 @@ TargetPointer loadTarget(const PropertyListDictionary& manifest) {
   return target;
 }
 
-MarletChapterSnapshot loadChapter(const FileWrapper& chapters, const URL& chaptersURL,
-                                  const PropertyListValue& element,
-                                  const std::optional<DiffPackSnapshot>& userEditsDiffPack) {
+void addChapter(ListedSnapshots<MarletChapterSnapshot>& listed, const FileWrapper& chapters,
+                const URL& chaptersURL, const PropertyListValue& element,
+                const std::optional<DiffPackSnapshot>& userEditsDiffPack) {
   require<E>(element.string(), Case::chapterFilenameNotAString);
   const auto& filename = *element.string();
   const auto chapter = chapters.child(filename);
   if (!chapter) throw E(Case::missingChapter, filename);
   try {
-    return {*chapter, chaptersURL.appendingPathComponent(filename), userEditsDiffPack};
+    listed.add(filename, [&] {
+      return MarletChapterSnapshot(*chapter, chaptersURL.appendingPathComponent(filename), userEditsDiffPack);
+    });
   } catch (const Error& error) {
     throw E(Case::invalidChapter, filename, error);
   }
@@ -106,9 +109,9 @@ MarletBookSnapshot loadBook(const FileWrapper& fileWrapper, const URL& baseURL,
   const auto chaptersWrapper =
       requiredDirectory<E>(contents, "Chapters", Case::missingChaptersDirectory, Case::chaptersNotADirectory);
   const auto chaptersURL = contentsURL.appendingPathComponent("Chapters", true);
-  std::vector<MarletChapterSnapshot> chapters;
+  ListedSnapshots<MarletChapterSnapshot> chapters;
   for (const auto& element : filenames) {
-    chapters.push_back(loadChapter(chaptersWrapper, chaptersURL, element, userEditsDiffPack));
+    addChapter(chapters, chaptersWrapper, chaptersURL, element, userEditsDiffPack);
   }
   auto keyValueStore = edits ? loadKeyValueStore(*edits) : MarletKeyValueStoreSnapshot();
 
@@ -123,7 +126,7 @@ MarletBookSnapshot loadBook(const FileWrapper& fileWrapper, const URL& baseURL,
           std::move(resourcesURL),
           std::move(userResourcesURL),
           std::move(imageReference),
-          std::move(chapters),
+          chapters.take(),
           std::move(keyValueStore)};
 }
 

@@ -1,5 +1,6 @@
 #include "MarletFoundation/Marlet/MarletChapterSnapshot.h"
 
+#include "MarletFoundation/Marlet/ListedSnapshots.h"
 #include "MarletFoundation/Marlet/LoadChecks.h"
 #include "MarletFoundation/Marlet/MarletChapter.h"
 #include "MarletFoundation/Platform/FatalError.h"
@@ -40,16 +41,18 @@ const ErrorTable& errorTable(Case) {
 
 namespace {
 
-BookPagePlaceholderSnapshot loadPage(const FileWrapper& pages, const URL& pagesURL,
-                                     const PropertyListValue& element,
-                                     const std::optional<DiffPackSnapshot>& userEditsDiffPack) {
+void addPage(ListedSnapshots<BookPagePlaceholderSnapshot>& listed, const FileWrapper& pages,
+             const URL& pagesURL, const PropertyListValue& element,
+             const std::optional<DiffPackSnapshot>& userEditsDiffPack) {
   using E = MarletChapterSnapshot::SerializationError;
   require<E>(element.string(), Case::pageFilenameNotAString);
   const auto& filename = *element.string();
   const auto page = pages.child(filename);
   if (!page) throw E(Case::missingPage, filename);
   try {
-    return {*page, pagesURL.appendingPathComponent(filename), userEditsDiffPack};
+    listed.add(filename, [&] {
+      return BookPagePlaceholderSnapshot(*page, pagesURL.appendingPathComponent(filename), userEditsDiffPack);
+    });
   } catch (const Error& error) {
     throw E(Case::invalidPage, filename, error);
   }
@@ -90,9 +93,9 @@ MarletChapterSnapshot::MarletChapterSnapshot(const FileWrapper& fileWrapper, con
   const auto pagesWrapper =
       requiredDirectory<E>(fileWrapper, "Pages", Case::missingPagesDirectory, Case::pagesNotADirectory);
   const auto pagesURL = baseURL.appendingPathComponent("Pages", true);
-  pages.reserve(filenames.size());
-  for (const auto& element : filenames)
-    pages.push_back(loadPage(pagesWrapper, pagesURL, element, userEditsDiffPack));
+  ListedSnapshots<BookPagePlaceholderSnapshot> listed;
+  for (const auto& element : filenames) addPage(listed, pagesWrapper, pagesURL, element, userEditsDiffPack);
+  pages = listed.take();
 }
 
 MarletChapterSnapshot::MarletChapterSnapshot(const MarletChapter& chapter)

@@ -2,8 +2,11 @@
 
 #include <gtest/gtest.h>
 
+#include <cmath>
+
 #include "MarletFoundation/Data/PropertyListSerializable.h"
 #include "support/Documents.h"
+#include "support/FailingAllocation.h"
 #include "support/Failure.h"
 
 namespace MarletFoundation::test {
@@ -327,6 +330,46 @@ TEST_F(BookSnapshot, WhatIsToleratedOpens) {
   for (const auto& tree : trees) EXPECT_EQ(failureOf(tree), "") << tree;
   EXPECT_FALSE(open(good.without("Edits")).userResourcesDirectoryURL);
   EXPECT_EQ(open(trees[8]).chapters[0].pages[0].resultInfoSnapshot, MarletResultInfoSnapshot());
+}
+
+// A few bytes of a manifest name a page again: it is read once, and all that is listed is bounded.
+TEST_F(BookSnapshot, WhatIsListedAgainIsReadOnce) {
+  const auto listing = [](std::size_t chapters, std::size_t pages) {
+    return goodBook()
+        .withKey(book, "Chapters", A(chapters, "One.marletchapter"))
+        .withKey(one + "/Manifest.plist", "Pages", A(pages, "A.marletpage"));
+  };
+  const auto snapshot = open(listing(2, 3));
+  ASSERT_EQ(snapshot.chapters.size(), 2u);
+  EXPECT_EQ(snapshot.chapters[1].manifest(), snapshot.chapters[0].manifest());
+  ASSERT_EQ(snapshot.chapters[1].pages.size(), 3u);
+  EXPECT_EQ(snapshot.chapters[1].pages[2].filename, "A.marletpage");
+  EXPECT_TRUE(snapshot.chapters[1].pages[2].resultInfoSnapshot->assessmentInformation()->everPassed);
+
+  A unread;
+  for (int i = 0; i < 1000; ++i) unread.push_back(D{{"k", "a text that is no page's"}});
+  const auto allocations = [&](std::size_t pages) {
+    const auto wrapper = listing(1, pages).withKey(pageA + "/Manifest.plist", "Unread", unread).wrapper();
+    takeAllocationCount();
+    MarletBookSnapshot(wrapper, baseURL);
+    return takeAllocationCount();
+  };
+  EXPECT_LT(allocations(20), allocations(1) + 1000);
+
+  const auto tooMuch = [](const std::string& outer, const std::string& inner) {
+    return outer + "The chapters and pages that are listed take more than 128 MB of memory together." + inner;
+  };
+  const auto large = listing(1, 200).withKey(pageA + "/Manifest.plist", "Name", std::string(1000000, 'x'));
+  expectFailures({
+      {listing(2400, 2400),
+       tooMuch("invalidChapter(filename: \"One.marletchapter\", error: Error(domain: POSIX, code: 27, \"",
+               "\")) | ") +
+           tooMuch("", " | One.marletchapter: List each chapter and each page once.")},
+      {large, tooMuch("invalidChapter(filename: \"One.marletchapter\", error: invalidPage(filename: "
+                      "\"A.marletpage\", error: Error(domain: POSIX, code: 27, \"",
+                      "\"))) | ") +
+                  tooMuch("", " | One.marletchapter: A.marletpage: List each chapter and each page once.")},
+  });
 }
 
 TEST_F(BookSnapshot, ResultInfoIsReadThroughTheLearnersPack) {
