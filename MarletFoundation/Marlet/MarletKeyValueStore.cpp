@@ -30,19 +30,19 @@ MarletKeyValueStoreSnapshot::MarletKeyValueStoreSnapshot(const Data& plistData) 
   const auto verdict = judgeManifestVersion(version);
   require<SerializationError>(verdict != ManifestVersionVerdict::invalid, Case::InvalidVersion);
   require<SerializationError>(verdict != ManifestVersionVerdict::tooNew, Case::VersionTooNew);
-  const auto* contents = root.dictionary()->find("Contents");
+  auto* const contents = std::get<PropertyListDictionary>(root.payload).find("Contents");
   require<SerializationError>(contents, Case::MissingContents);
   require<SerializationError>(contents->dictionary(), Case::ContentsNotADictionary);
-  contents_ = *contents->dictionary();
+  contents_ = std::get<PropertyListDictionary>(std::move(contents->payload));
 }
 
 MarletKeyValueStoreSnapshot::MarletKeyValueStoreSnapshot(const MarletKeyValueStore& store)
     : contents_(store.contents()) {}
 
 Data MarletKeyValueStoreSnapshot::plistData() const {
-  const PropertyListValue root(
-      PropertyListDictionary{{"Version", CurrentManifestVersionString}, {"Contents", contents_}});
-  return propertyListData(root, PropertyListFormat::binary);
+  PropertyListDictionary root{{"Version", CurrentManifestVersionString}};
+  root["Contents"] = contents_;
+  return PropertyListSerialization::write(std::move(root), PropertyListFormat::binary);
 }
 
 }  // namespace MarletFoundation

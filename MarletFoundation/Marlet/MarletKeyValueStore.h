@@ -35,7 +35,8 @@ class MARLET_EXPORT MarletKeyValueStoreSnapshot final : public MarletKeyValueSto
   explicit MarletKeyValueStoreSnapshot(const MarletKeyValueStore& store);
 
   const PropertyListDictionary& contents() const override { return contents_; }
-  /// The bytes of the file, a binary property list.
+  /// The bytes of the file, a binary property list. The store holds what running content put into it: throws an
+  /// `ErrorObject` of `PropertyListErrorDomain` for text that is not valid UTF-8 and dates that aren't finite.
   Data plistData() const;
   /// Whether there is anything to write: an empty store has no file.
   bool needsSerialization() const { return !contents_.empty(); }
@@ -55,6 +56,10 @@ class MARLET_EXPORT MarletKeyValueStore final : public MarletKeyValueStoreType {
 
   const PropertyListDictionary& contents() const override { return contents_; }
   void setContents(PropertyListDictionary contents) { contents_ = std::move(contents); }
+  /// Sets one key; the others stay where they are.
+  void setValue(std::string_view key, PropertyListValue value) { contents_[key] = std::move(value); }
+  /// Removes one key. True when it was there.
+  bool removeValue(std::string_view key) { return contents_.erase(key); }
   MarletKeyValueStoreSnapshot snapshot() const { return MarletKeyValueStoreSnapshot(*this); }
 
  private:

@@ -37,7 +37,7 @@ class MARLET_EXPORT MarletResultInfoSnapshot final : public MarletResultInfoType
 
   /// Whether there is anything to write in that form.
   bool needsSerialization(Format format) const;
-  /// The stored form. A `ResultInfo` keeps no character offsets.
+  /// The stored form; throws the property-list writer's error. A `ResultInfo` keeps no character offsets.
   Data data(Format format) const;
 
   bool operator==(const MarletResultInfoSnapshot& other) const {

@@ -449,4 +449,41 @@ TEST(KeyValueStore, RoundTripsInBinaryForm) {
   EXPECT_TRUE(MarletKeyValueStoreSnapshot(data).contents() == store.contents());
 }
 
+// Running content may put anything into it.
+TEST(KeyValueStore, WritesWhatHasAFormAndRefusesTheRest) {
+  PropertyListValue deep("end");
+  for (int i = 0; i < 100000; ++i) {
+    PropertyListDictionary around;
+    around["k"] = std::move(deep);
+    deep = std::move(around);
+  }
+  MarletKeyValueStore store;
+  store.setValue("deep", deep);
+  EXPECT_TRUE(MarletKeyValueStoreSnapshot(store.snapshot().plistData()).contents() == store.contents());
+  store.removeValue("deep");
+  const PropertyListValue formless[] = {Date{std::nan("")}, Date{HUGE_VAL}, "\xFF", A{D{{"\xC0\x80", 1}}}};
+  for (const auto& value : formless) {
+    store.setValue("x", value);
+    const auto error = errorOf([&] { store.snapshot().plistData(); });
+    ASSERT_TRUE(error) << description(value);
+    EXPECT_EQ(error->domain(), PropertyListErrorDomain);
+  }
+  EXPECT_TRUE(store.removeValue("x") && !store.removeValue("x"));
+  EXPECT_NO_THROW(store.snapshot().plistData());
+}
+
+TEST(KeyValueStore, SetsAndRemovesAKeyWithoutCopying) {
+  const auto allocations = [](int size) {
+    MarletKeyValueStore store;
+    for (int i = 0; i < size; ++i)
+      store.setValue(std::to_string(i * 7919 % size), "a text that needs memory");
+    takeAllocationCount();
+    store.setValue("5", "another text that needs memory");
+    store.setValue("5 1/2", "a text that needs memory");
+    store.removeValue("6");
+    return takeAllocationCount();
+  };
+  EXPECT_EQ(allocations(200), allocations(20000));
+}
+
 }  // namespace MarletFoundation::test
