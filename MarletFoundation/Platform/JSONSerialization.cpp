@@ -85,10 +85,13 @@ Library treeOfNumber(const NumberObject& number) {
 
 Library treeOfDictionary(const DictionaryObject& dictionary, int depth) {
   auto tree = Library::object();
+  // A dictionary's keys differ. Added by the array beneath, none is searched for among those before it.
+  auto& entries = tree.get_ref<Library::object_t&>();
+  entries.reserve(dictionary.count());
   for (const auto& key : dictionary.allKeys()) {
     const auto* name = dynamic_cast<const StringObject*>(key.get());
     if (!name) fail("JSON has no form for keys that aren't strings.");
-    tree.push_back({name->value, treeOf(*dictionary.objectForKey(*key), depth + 1)});
+    entries.emplace_back(name->value, treeOf(*dictionary.objectForKey(*key), depth + 1));
   }
   return tree;
 }

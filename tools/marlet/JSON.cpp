@@ -4,7 +4,7 @@
 #include <cmath>
 #include <ctime>
 
-#include "MarletFoundation/Utils/Overloaded.h"
+#include "MarletFoundation/Data/PropertyListChildren.h"
 #include "SafeText.h"
 
 using namespace MarletFoundation;
@@ -42,101 +42,101 @@ std::string iso8601(Date date) {
   return std::string(text) + fraction + "Z";
 }
 
-ordered_json jsonOfScalar(const Data& data) { return {{"$data", base64(data.bytes())}}; }
+// Deeper lines are indented no further, so that the output grows with the value alone.
+constexpr std::size_t deepestIndentation = 512;
 
-ordered_json jsonOfScalar(const Date& date) { return {{"$date", iso8601(date)}}; }
+/// Writes a property list as it goes, in the form of `dumped`: a tree of the library's would be filled in quadratic
+/// time, and printed and destroyed by the stack or by memory that may not be there.
+class Writer {
+ public:
+  /// The value stands on a line of that depth.
+  explicit Writer(std::size_t depth) : depth_(depth) {}
 
-ordered_json jsonOfScalar(double number) {
+  std::string write(const PropertyListValue& value) {
+    writeValue(value);
+    while (!open_.empty()) writeNextChild();
+    return std::move(text_);
+  }
+
+ private:
+  struct OpenContainer {
+    PropertyListChildren children;
+    bool isFirst = true;
+  };
+
+  void writeValue(const PropertyListValue& value) {
+    if (isPropertyListContainer(value)) return open(value);
+    if (const auto* data = value.data()) return writeTagged("$data", base64(data->bytes()));
+    if (const auto* date = value.date()) return writeTagged("$date", iso8601(*date));
+    if (const auto* number = value.floatingPoint()) {
+      text_ += finiteNumber(*number).dump();
+    } else if (const auto* text = value.string()) {
+      text_ += dumped(*text);
+    } else if (const auto* integer = value.integer()) {
+      text_ += std::to_string(*integer);
+    } else {
+      text_ += *value.boolean() ? "true" : "false";
+    }
+  }
+
+  void writeTagged(std::string_view tag, const std::string& text) {
+    text_ += '{';
+    beginLine(1);
+    text_ += dumped(tag) + ": " + dumped(text);
+    beginLine();
+    text_ += '}';
+  }
+
+  void open(const PropertyListValue& container) {
+    const PropertyListChildren children(container);
+    if (children.atEnd()) {
+      text_ += children.isDictionary() ? "{}" : "[]";
+      return;
+    }
+    text_ += children.isDictionary() ? '{' : '[';
+    open_.push_back({children});
+  }
+
+  void writeNextChild() {
+    auto& [children, isFirst] = open_.back();
+    if (children.atEnd()) {
+      const char bracket = children.isDictionary() ? '}' : ']';
+      open_.pop_back();
+      beginLine();
+      text_ += bracket;
+      return;
+    }
+    if (!std::exchange(isFirst, false)) text_ += ',';
+    beginLine();
+    if (children.isDictionary()) text_ += dumped(children.key()) + ": ";
+    writeValue(children.next());
+  }
+
+  void beginLine(std::size_t deeper = 0) {
+    text_ += '\n';
+    text_.append(2 * std::min(depth_ + open_.size() + deeper, deepestIndentation), ' ');
+  }
+
+  const std::size_t depth_;
+  std::vector<OpenContainer> open_;
+  std::string text_;
+};
+
+}  // namespace
+
+ordered_json finiteNumber(double number) {
   if (!std::isfinite(number)) throw NotRepresentable("JSON has no form for a number that is not finite.");
   return number;
 }
 
-template <class Scalar>
-ordered_json jsonOfScalar(const Scalar& scalar) {
-  return scalar;
-}
-
-using Members = std::vector<ordered_json::object_t::value_type>;
-
-/// A value whose JSON is still to be put in its place.
-struct Pending {
-  const PropertyListValue* source;
-  ordered_json* target;
-};
-
-/// An array or object that is being written, and what of it comes next.
-struct Open {
-  const ordered_json* container;
-  ordered_json::const_iterator next;
-};
-
-/// Levels from which on lines move no further to the right, so that deep values stay linear in length.
-constexpr std::size_t deepestIndentation = 512;
-
-}  // namespace
-
-ordered_json json(const PropertyListValue& value) {
-  ordered_json root;
-  // Not by recursion: a list may be deeper than the stack.
-  std::vector<Pending> pending{{&value, &root}};
-  while (!pending.empty()) {
-    const auto [source, target] = pending.back();
-    pending.pop_back();
-    std::visit(overloaded{
-                   [&](const PropertyListValue::Array& array) {
-                     *target = ordered_json::array();
-                     auto& elements = target->get_ref<ordered_json::array_t&>();
-                     elements.resize(array.size());
-                     for (std::size_t i = 0; i < elements.size(); ++i)
-                       pending.push_back({&array[i], &elements[i]});
-                   },
-                   [&](const PropertyListDictionary& dictionary) {
-                     *target = ordered_json::object();
-                     // Its keys are different from each other; an object would look for each among all.
-                     Members& members = target->get_ref<ordered_json::object_t&>();
-                     members.reserve(dictionary.size());
-                     for (const auto& [key, element] : dictionary) {
-                       members.emplace_back(std::string(key), nullptr);
-                       pending.push_back({&element, &members.back().second});
-                     }
-                   },
-                   [&](const auto& scalar) { *target = jsonOfScalar(scalar); },
-               },
-               source->payload);
-  }
-  return root;
-}
-
 std::string dumped(const ordered_json& value) {
-  std::string text;
-  std::vector<Open> open;
-  const auto startLine = [&] {
-    text += '\n';
-    text.append(2 * std::min(open.size(), deepestIndentation), ' ');
-  };
-  const auto put = [&](const ordered_json& item) {
-    if (item.is_structured() && !item.empty()) {
-      text += item.is_array() ? '[' : '{';
-      open.push_back({&item, item.begin()});
-    } else {
-      text += item.dump(-1, ' ', false, ordered_json::error_handler_t::replace);
-    }
-  };
-  put(value);
-  while (!open.empty()) {
-    auto& [container, next] = open.back();
-    if (next == container->end()) {
-      const char end = container->is_array() ? ']' : '}';
-      open.pop_back();
-      startLine();
-      text += end;
-      continue;
-    }
-    if (next != container->begin()) text += ',';
-    startLine();
-    if (container->is_object())
-      text += ordered_json(next.key()).dump(-1, ' ', false, ordered_json::error_handler_t::replace) + ": ";
-    put(*next++);
-  }
-  return printableJSON(text);
+  return printableJSON(value.dump(2, ' ', false, ordered_json::error_handler_t::replace));
+}
+
+std::string jsonText(const PropertyListValue& value) { return Writer(0).write(value); }
+
+std::string dumpedWith(const ordered_json& object, std::string_view key, const PropertyListValue& value) {
+  auto text = dumped(object);
+  text.resize(text.size() - 2);  // a line feed and the bracket
+  return text + ",\n  " + dumped(key) + ": " + Writer(1).write(value) + "\n}";
 }

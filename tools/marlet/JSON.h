@@ -12,9 +12,8 @@ struct NotRepresentable : std::runtime_error {
   using std::runtime_error::runtime_error;
 };
 
-/// Data as `{"$data": base64}`, a date as `{"$date": ISO 8601}`, the rest as itself. Throws
-/// `NotRepresentable` for numbers that are not finite and dates beyond the years 0 to 9999.
-nlohmann::ordered_json json(const MarletFoundation::PropertyListValue& value);
+/// Throws `NotRepresentable` for one that is not finite.
+nlohmann::ordered_json finiteNumber(double number);
 
 template <class T>
 nlohmann::ordered_json orNull(const std::optional<T>& value) {
@@ -23,3 +22,11 @@ nlohmann::ordered_json orNull(const std::optional<T>& value) {
 
 /// Indented, in UTF-8, safe on a terminal (`printableJSON`); ill-formed bytes, which only paths can hold, as U+FFFD.
 std::string dumped(const nlohmann::ordered_json& value);
+
+/// A property list of any size and depth, in the form of `dumped`: data as `{"$data": base64}`, a date as
+/// `{"$date": ISO 8601}`, the rest as itself; beyond 512 levels indented no further. Throws `NotRepresentable` for
+/// numbers that are not finite and dates beyond the years 0 to 9999.
+std::string jsonText(const MarletFoundation::PropertyListValue& value);
+/// An object that isn't empty, with a property list under one more key behind its own.
+std::string dumpedWith(const nlohmann::ordered_json& object, std::string_view key,
+                       const MarletFoundation::PropertyListValue& value);

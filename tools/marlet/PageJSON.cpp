@@ -31,10 +31,9 @@ ordered_json json(const MarletInlineResultData::Visible& visible) {
   static constexpr const char* modes[] = {"Latest", "List", "Graph"};
   const auto* atMost = std::get_if<MarletInlineResultData::AtMost>(&visible.size);
   const auto* fullWidth = std::get_if<MarletInlineResultData::FullWidth>(&visible.size);
-  const auto number = [](double value) { return ::json(PropertyListValue(value)); };
   return {{"type", atMost ? "MaxSize" : "FullWidth"},
-          {"width", atMost ? number(atMost->width) : ordered_json(nullptr)},
-          {"height", number(atMost ? atMost->height : fullWidth->height)},
+          {"width", atMost ? finiteNumber(atMost->width) : ordered_json(nullptr)},
+          {"height", finiteNumber(atMost ? atMost->height : fullWidth->height)},
           {"mode", modes[static_cast<int>(visible.mode)]}};
 }
 

@@ -32,7 +32,7 @@ Data inForm(const PropertyListValue& value, PropertyListOutput form) {
     case PropertyListOutput::json:
       break;
   }
-  return Data(dumped(json(value)) + "\n");
+  return Data(jsonText(value) + "\n");
 }
 
 }  // namespace

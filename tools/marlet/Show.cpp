@@ -39,6 +39,7 @@ ordered_json json(const MarletChapterSnapshot& chapter) {
           {"pages", std::move(pages)}};
 }
 
+/// All but the store.
 ordered_json json(const MarletBookSnapshot& book) {
   auto chapters = ordered_json::array();
   for (const auto& chapter : book.chapters) chapters.push_back(json(chapter));
@@ -50,8 +51,7 @@ ordered_json json(const MarletBookSnapshot& book) {
           {"uniquifier", book.uniquifier},
           {"target", {{"identifier", book.target->identifier}, {"targetOS", book.target->targetOS}}},
           {"imageReference", orNull(book.imageReference)},
-          {"chapters", std::move(chapters)},
-          {"keyValueStore", ::json(PropertyListValue(book.keyValueStore.contents()))}};
+          {"chapters", std::move(chapters)}};
 }
 
 void printTree(const MarletBookSnapshot& book, const Terminal& terminal) {
@@ -79,7 +79,7 @@ void printTree(const MarletBookSnapshot& book, const Terminal& terminal) {
 
 void showBook(const MarletBookSnapshot& book, bool asJSON, const Terminal& terminal) {
   if (asJSON) {
-    std::cout << dumped(json(book)) << "\n";
+    std::cout << dumpedWith(json(book), "keyValueStore", book.keyValueStore.contents()) << "\n";
   } else {
     printTree(book, terminal);
   }
