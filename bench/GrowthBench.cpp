@@ -5,6 +5,7 @@
 #include <benchmark/benchmark.h>
 #include <stdlib.h>
 
+#include <algorithm>
 #include <cstdio>
 #include <fstream>
 #include <functional>
@@ -15,6 +16,7 @@
 #include "MarletDiff/ContentMerge.h"
 #include "MarletFoundation/MarletFoundation.h"
 #include "Process.h"
+#include "tools/marlet/JSON.h"
 
 namespace fs = std::filesystem;
 using namespace MarletFoundation;
@@ -145,6 +147,61 @@ Work merging(int lines) {
   };
 }
 
+Work readingReferences(int count) {
+  std::string text = "<string>";
+  for (int i = 0; i < count; ++i) text += "a &lt; b &amp;&amp; c\n";
+  return
+      [data = Data(text + "</string>")] { benchmark::DoNotOptimize(PropertyListSerialization::read(data)); };
+}
+
+Work writingNumbers(int count) {
+  PropertyListValue::Array numbers;
+  for (std::int64_t i = 1; i <= count; ++i) numbers.push_back(i << 44);
+  return [value = PropertyListValue(std::move(numbers))] {
+    benchmark::DoNotOptimize(PropertyListSerialization::write(value, PropertyListFormat::binary));
+  };
+}
+
+std::vector<std::string> shuffledKeys(int count) {
+  std::vector<std::string> keys;
+  for (int i = 0; i < count; ++i) keys.push_back("key " + std::to_string(i));
+  std::shuffle(keys.begin(), keys.end(), std::mt19937(1));
+  return keys;
+}
+
+Work fillingDictionary(int count) {
+  return [keys = shuffledKeys(count)] {
+    PropertyListDictionary dictionary;
+    for (const auto& key : keys) dictionary[key] = true;
+    for (const auto& key : keys) dictionary.erase(key);
+    benchmark::DoNotOptimize(dictionary.size());
+  };
+}
+
+Work printingKeys(int count) {
+  PropertyListDictionary::Entries entries;
+  for (const auto& key : shuffledKeys(count)) entries.push_back({SharedString(key), true});
+  return [value = PropertyListValue(PropertyListDictionary(std::move(entries)))] {
+    benchmark::DoNotOptimize(jsonText(value));
+  };
+}
+
+/// One chapter whose manifest names its first page so many times.
+Work openingRepeats(int times) {
+  const auto scratch = std::make_shared<Scratch>();
+  const auto url = bookIn(scratch);
+  generateBook(url.path(), 1, 0);
+  const PropertyListDictionary manifest{
+      {"Name", "Repeats"},
+      {"Pages",
+       PropertyListValue::Array(static_cast<std::size_t>(times), PropertyListValue("Page0.marletpage"))}};
+  writePropertyList(PropertyListValue(manifest),
+                    URL::file(url.path() + "/Contents/Chapters/Chapter0.marletchapter/Manifest.plist"),
+                    PropertyListFormat::binary);
+  return
+      [scratch, url] { benchmark::DoNotOptimize(MarletBookSnapshot(FileWrapper(url), url).chapters.size()); };
+}
+
 std::string sourcePath(int page) {
   return "Chapters/Chapter" + std::to_string(page / 100) + ".marletchapter/Pages/Page" +
          std::to_string(page) + ".marletpage/Contents.swift";
@@ -219,6 +276,11 @@ constexpr Operation operations[] = {
     {"diffingAccents", diffingAccents, 500},
     {"merging", merging, 16000},
     {"mergingParagraphs", mergingParagraphs, 100},
+    {"readingReferences", readingReferences, 16000},
+    {"writingNumbers", writingNumbers, 16000},
+    {"fillingDictionary", fillingDictionary, 16000},
+    {"printingKeys", printingKeys, 16000},
+    {"openingRepeats", openingRepeats, 2000},
     {"packing", packing, 32},
     {"applying", applying, 32},
 };

@@ -130,6 +130,11 @@ GROWTH = {
     "diffing 40 equal lines of accents and 39": ("diffingAccents", 500),
     "merging": ("merging", 16000),
     "merging within paragraphs of Japanese": ("mergingParagraphs", 100),
+    "reading a text with references from XML": ("readingReferences", 16000),
+    "writing numbers with low zero bits": ("writingNumbers", 16000),
+    "filling and emptying a dictionary key by key": ("fillingDictionary", 16000),
+    "many keys as JSON": ("printingKeys", 16000),
+    "opening a book that lists one page again and again": ("openingRepeats", 2000),
     "making and writing an update": ("packing", 32),
     "applying an update and undoing it": ("applying", 32),
 }
