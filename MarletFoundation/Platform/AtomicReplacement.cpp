@@ -32,8 +32,9 @@ bool isRefusal(int error) {
 }
 
 /// The host's own failures don't reach a writer that is done.
-void reportLeftBehind(const std::string& path, int error) noexcept {
+void reportLeftBehind(const std::string& itemPath, const std::string& name, int error) noexcept {
   try {
+    const auto path = SplitPath(itemPath).parent + name;
     HostEnvironment::current().leftBehind(path, ErrorObject::posix(error, path));
   } catch (...) {
   }
@@ -70,7 +71,7 @@ AtomicReplacement::~AtomicReplacement() { discard(); }
 void AtomicReplacement::discard() noexcept {
   if (staging_.empty()) return;
   if (const int error = removeTree(place_.parent.get(), staging_); error != 0)
-    reportLeftBehind(SplitPath(path_).parent + staging_, error);
+    reportLeftBehind(path_, staging_, error);
   staging_.clear();
 }
 
@@ -137,7 +138,7 @@ void AtomicReplacement::clearLeftovers() {
     const Descriptor left(::openat(place_.parent.get(), entry.name.c_str(), ReadingFlags | O_NOFOLLOW));
     if (!left || ::flock(left.get(), LOCK_EX | LOCK_NB) != 0) continue;
     if (const int error = removeTree(place_.parent.get(), entry.name); error != 0)
-      reportLeftBehind(SplitPath(path_).parent + entry.name, error);
+      reportLeftBehind(path_, entry.name, error);
   }
 }
 

@@ -54,10 +54,13 @@ std::vector<std::string> linesOf(const std::string& text) {
 }
 
 test::Tree firstBook() {
-  test::Tree book{{"Contents/Manifest.plist",
-                   PropertyListDictionary{{"Version", "1.0"}, {"Name", "Machine"}, {"ContentIdentifier", "org.example"},
-                                          {"ContentVersion", "1.0"}, {"DeploymentTarget", "slateos9.0"},
-                                          {"Chapters", PropertyListValue::Array{"One"}}}}};
+  test::Tree book{
+      {"Contents/Manifest.plist", PropertyListDictionary{{"Version", "1.0"},
+                                                         {"Name", "Machine"},
+                                                         {"ContentIdentifier", "org.example"},
+                                                         {"ContentVersion", "1.0"},
+                                                         {"DeploymentTarget", "slateos9.0"},
+                                                         {"Chapters", PropertyListValue::Array{"One"}}}}};
   PropertyListValue::Array names;
   for (int page = 0; page < Pages; ++page) {
     names.push_back("P" + std::to_string(page) + ".marletpage");
@@ -76,8 +79,9 @@ class Machine {
   }
 
   void step() {
-    static constexpr void (Machine::*steps[])() = {&Machine::type, &Machine::revert, &Machine::keepFile, &Machine::draw,
-                                                   &Machine::store, &Machine::update, &Machine::attack};
+    static constexpr void (Machine::*steps[])() = {&Machine::type,  &Machine::revert, &Machine::keepFile,
+                                                   &Machine::draw,  &Machine::store,  &Machine::update,
+                                                   &Machine::attack};
     next_ = learner_;
     work_ = {};
     (this->*steps[below(std::size(steps))])();
@@ -136,7 +140,8 @@ class Machine {
     for (const auto& [place, line] : learner.lines) {
       const auto lines = linesOf(text(pageFile(place.first)));
       const auto number = static_cast<std::size_t>(place.second) + 2;
-      if (number >= lines.size() || lines[number] != line) return "lost " + line + " in " + pageFile(place.first);
+      if (number >= lines.size() || lines[number] != line)
+        return "lost " + line + " in " + pageFile(place.first);
     }
     for (const auto& [path, contents] : learner.files) {
       if (text(path) != contents) return "lost " + path;
@@ -171,8 +176,8 @@ class Machine {
   std::vector<std::string> editedLines(int page) const {
     const auto book = openBook(url());
     const auto contents = url().appendingPathComponent("Contents", true);
-    const auto data = mergedUserEdit(book.userEdits ? *book.userEdits : makeUserEditDiffPack(book.snapshot, contents),
-                                     pageFile(page));
+    const auto data = mergedUserEdit(
+        book.userEdits ? *book.userEdits : makeUserEditDiffPack(book.snapshot, contents), pageFile(page));
     return linesOf(std::string(data->view()));
   }
 
@@ -231,7 +236,8 @@ class Machine {
     next_.drawings[name] = fresh("drawn ");
     lastStep = "drawing " + name;
     changeEdits([name, contents = next_.drawings[name]](FileWrapper edits) {
-      if (!edits.child("UserResources")) edits.addFileWrapper(named("UserResources", FileWrapper::directory()));
+      if (!edits.child("UserResources"))
+        edits.addFileWrapper(named("UserResources", FileWrapper::directory()));
       edits.child("UserResources")->addFileWrapper(named(name, FileWrapper::regularFile(Data(contents))));
     });
   }
@@ -250,8 +256,8 @@ class Machine {
 
   void apply(std::vector<FileDiffDescriptor> updates) {
     work_ = [url = url(), source = sourceURL(), updates = std::move(updates)] {
-      applyCheckedUpdate(url, DiffPackSnapshot(DiffPackType::UpdatePack, DiffPackDocumentType::MarletBook, source,
-                                               "org.example", "1.0", "1.0", updates));
+      applyCheckedUpdate(url, DiffPackSnapshot(DiffPackType::UpdatePack, DiffPackDocumentType::MarletBook,
+                                               source, "org.example", "1.0", "1.0", updates));
     };
   }
 
@@ -260,8 +266,8 @@ class Machine {
   /// Changes the line above the editable ones, or one of them, which may be the learner's by now.
   void update() {
     const int page = static_cast<int>(below(Pages));
-    const auto old =
-        std::string(FileManager::readFile(url().appendingPathComponent("Contents/" + pageFile(page), false)).view());
+    const auto old = std::string(
+        FileManager::readFile(url().appendingPathComponent("Contents/" + pageFile(page), false)).view());
     auto lines = linesOf(old);
     const auto line = below(Lines + 1);
     lines[line == Lines ? 0 : line + 2] = fresh("// updated ");
@@ -273,18 +279,22 @@ class Machine {
   }
 
   void attack() {
-    const auto page = pageFile(static_cast<int>(below(Pages)));
-    test::Tree{{page, "let mine = 1\n"}, {"Chapters/One/Manifest.plist", "garbage"}, {"Resources/own-0", "theirs"}}.writeTo(
-        directory_ / "update");
-    const std::vector<FileDiffDescriptor> attacks{{FileDiffDescriptor::Removed{"Edits"}},
-                                                  {FileDiffDescriptor::Removed{"Edits/UserEdits.diffpack"}},
-                                                  {FileDiffDescriptor::Removed{"Edits/UserResources/drawing-0"}},
-                                                  {FileDiffDescriptor::Removed{"Contents"}},
-                                                  {FileDiffDescriptor::Removed{"Contents/" + page}},
-                                                  {FileDiffDescriptor::Replaced{page, {}}},
-                                                  {FileDiffDescriptor::Added{"Chapters/One/Manifest.plist", {}}},
-                                                  {FileDiffDescriptor::Added{"Resources/own-0", {}}},
-                                                  {FileDiffDescriptor::Modified{page, {{{0, 4}, {0, 4}, u"nope", u"gone"}}}}};
+    const int number = static_cast<int>(below(Pages));
+    const auto page = pageFile(number);
+    test::Tree{{page, source(number, "theirs", {"e", "f", "g", "h"})},
+               {"Chapters/One/Manifest.plist", "garbage"},
+               {"Resources/own-0", "theirs"}}
+        .writeTo(directory_ / "update");
+    const std::vector<FileDiffDescriptor> attacks{
+        {FileDiffDescriptor::Removed{"Edits"}},
+        {FileDiffDescriptor::Removed{"Edits/UserEdits.diffpack"}},
+        {FileDiffDescriptor::Removed{"Edits/UserResources/drawing-0"}},
+        {FileDiffDescriptor::Removed{"Contents"}},
+        {FileDiffDescriptor::Removed{"Contents/" + page}},
+        {FileDiffDescriptor::Replaced{page, {}}},
+        {FileDiffDescriptor::Added{"Chapters/One/Manifest.plist", {}}},
+        {FileDiffDescriptor::Added{"Resources/own-0", {}}},
+        {FileDiffDescriptor::Modified{page, {{{0, 4}, {0, 4}, u"nope", u"gone"}}}}};
     lastStep = "attacking";
     apply({attacks[below(attacks.size())]});
   }
