@@ -10,6 +10,7 @@
 #include "MarletFoundation/DiffPack/MergedPages.h"
 #include "MarletFoundation/DiffPack/UpdateDiffPack.h"
 #include "MarletFoundation/DiffPack/UserEditsPlace.h"
+#include "MarletFoundation/Platform/OneState.h"
 #include "MarletFoundation/Platform/RelativePath.h"
 #include "MarletFoundation/Platform/Text.h"
 
@@ -141,11 +142,16 @@ std::string description(const std::vector<UpdateConflict>& conflicts) {
 
 CheckedUpdate checkedUpdate(const URL& documentUrl, const DiffPackSnapshot& diffPack) {
   requireBookDocument(documentUrl);
-  const auto book = mergedBook(documentUrl, diffPack);
-  auto conflicts = UpdateCheck(documentUrl, diffPack, book).run();
-  // What it was compared with may be of another book by then.
-  if (book.document.wasReplaced()) throw ErrorObject::posix(ESTALE, documentUrl.path());
-  return {book.document, std::move(conflicts)};
+  // What the merged book is compared with may be of another one by then.
+  struct Compared {
+    MergedBook book;
+    bool isUnchanged() const { return book.document.isUnchanged(); }
+  };
+  return readOneState(
+      documentUrl.path(), [&] { return Compared{mergedBook(documentUrl, diffPack)}; },
+      [&](const Compared& compared) {
+        return CheckedUpdate{compared.book.document, UpdateCheck(documentUrl, diffPack, compared.book).run()};
+      });
 }
 
 void applyCheckedUpdate(const URL& documentUrl, const DiffPackSnapshot& diffPack) {

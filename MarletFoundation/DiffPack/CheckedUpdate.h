@@ -42,8 +42,8 @@ struct MARLET_EXPORT CheckedUpdate {
 /// outcome in full: the book, its pages, the learner's pack and each edited file's text. Nothing is written. Whether
 /// the update is meant for this book is left to the host.
 ///
-/// Throws what `applyUpdateDiffPack` throws, and an `ErrorObject` of the POSIX domain (ESTALE) when the book was
-/// replaced meanwhile: call again.
+/// Throws what `applyUpdateDiffPack` throws, and a POSIX ESTALE when the book changes faster than it can be read: it is
+/// read again a bounded number of times.
 MARLET_EXPORT CheckedUpdate checkedUpdate(const URL& documentUrl, const DiffPackSnapshot& diffPack);
 
 /// `applyUpdateDiffPack` for packs from anywhere: the book is written when nothing stands against it. Throws what

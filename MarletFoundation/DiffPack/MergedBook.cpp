@@ -6,6 +6,7 @@
 #include "MarletDiff/ContentMerge.h"
 #include "MarletFoundation/DiffPack/TreePaths.h"
 #include "MarletFoundation/DiffPack/UserEditsPlace.h"
+#include "MarletFoundation/Platform/OneState.h"
 #include "MarletFoundation/Platform/RelativePath.h"
 #include "MarletFoundation/Platform/Text.h"
 
@@ -101,8 +102,9 @@ class BookMerge {
 
 }  // namespace
 
-MergedBook mergedBook(const URL& bookURL, const DiffPackSnapshot& pack) {
-  const FileWrapper root(bookURL);
+namespace {
+
+MergedBook mergedTree(const FileWrapper& root, const URL& bookURL, const DiffPackSnapshot& pack) {
   const auto contents = root.child("Contents");
   if (!contents) throw failure("Marlet Book has no Contents directory");
   std::optional<DiffPackSnapshot> editsBefore;
@@ -116,6 +118,14 @@ MergedBook mergedBook(const URL& bookURL, const DiffPackSnapshot& pack) {
     setUserEdits(root, book.edits->fileWrapper());
   }
   return book;
+}
+
+}  // namespace
+
+MergedBook mergedBook(const URL& bookURL, const DiffPackSnapshot& pack) {
+  return readOneState(
+      bookURL.path(), [&] { return FileWrapper(bookURL); },
+      [&](const FileWrapper& root) { return mergedTree(root, bookURL, pack); });
 }
 
 }  // namespace MarletFoundation

@@ -48,7 +48,9 @@ enum class Call { look, change, write };
 /// change after it.
 bool counts(Call call) {
   static const std::string_view fault = setting("FAULT");
-  return fault == "short" ? call == Call::write : fault == "exit" ? call != Call::look : fault == "error";
+  return fault == "short"  ? call == Call::write
+         : fault == "exit" ? call != Call::look
+                           : fault == "error" || fault == "hold";
 }
 
 bool isHeld(long number) {

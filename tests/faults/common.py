@@ -53,3 +53,11 @@ def make_book(marlet, directory):
     assert marlet(["edit", directory, "--set", f"{page}={directory}/edited.swift", "--set",
                        f"Resources/own.txt={directory}/edited.swift"]).returncode == 0
     os.remove(f"{directory}/edited.swift")
+
+
+def change(path, before, after):
+    with open(path) as file:
+        text = file.read()
+    assert before in text, (path, before)
+    with open(path, "w") as file:
+        file.write(text.replace(before, after, 1))
