@@ -171,7 +171,7 @@ void Tokens<Unit>::cutWords(Characters<Unit>& characters, std::uint32_t start, s
   StartsWriter writer(starts);
   writer.add(start, start < end);
   for (auto at = start + 1; at < end; ++at) {
-    writer.add(at, !wordSpans(text, at) & characters.startAt(at));
+    writer.add(at, !wordSpans(text, at) && characters.startAt(at));
   }
   writer.flush();
   starts.push_back(end);
