@@ -174,7 +174,7 @@ TEST(PropertyListSerialization, WorksInProportion) {
   const std::pair<PropertyListFormat, std::function<PropertyListValue(int)>> cases[] = {
       {xml, references}, {binary, highBitsOnly}, {binary, alike}};
   for (const auto& [format, valueOf] : cases) {
-    const auto steps = [&](int size) {
+    const auto steps = [&format = format, &valueOf = valueOf](int size) {
       const auto value = valueOf(size);
       takePropertyListWork();
       EXPECT_TRUE(read(write(value, format)) == value);

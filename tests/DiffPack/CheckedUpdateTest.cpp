@@ -104,7 +104,7 @@ TEST_F(CheckedUpdates, RefuseWhatHarmsTheBookOrItsLearner) {
   for (const auto& [updates, expected] : cases) {
     EXPECT_EQ(conflicts(update(updates)), expected) << updates[0].filePath();
     if (expected.empty()) continue;
-    const auto error = thrown<ErrorObject>([&] { applyCheckedUpdate(url_, update(updates)); });
+    const auto error = thrown<ErrorObject>([&, &pack = updates] { applyCheckedUpdate(url_, update(pack)); });
     EXPECT_EQ(error.code(), static_cast<int>(DiffErrorCode::CriticalMergeError));
     EXPECT_NE(error.description().find(expected.substr(2, expected.find(';') - 2)), std::string::npos);
     EXPECT_EQ(learnersText(), before);

@@ -274,7 +274,7 @@ TEST_F(UpdatingUserEdits, RefusesFilesThatCollide) {
       {{{"Manifest", text}, {"bare.delt", text}, {"n", text}, {"n-", text}, {"n.m", text}}, {}, "room"},
   };
   for (const auto& [edits, before, place] : cases) {
-    const auto error = errorOf([&] { updated(edits, before); });
+    const auto error = errorOf([&, &own = edits, &there = before] { updated(own, there); });
     if (place == "room") {
       EXPECT_FALSE(error) << edits.begin()->first;
       continue;

@@ -181,10 +181,10 @@ TEST(LiveBook, SnapshotOfALiveBookIsTheBook) {
 }
 
 TEST(LiveBook, NullPartsAreStatedFatalErrors) {
-  const auto book = [] {
+  const auto live = [] {
     return std::make_unique<MarletBook>(MarletBookSnapshot(goodBook().wrapper(), baseURL));
   };
-  const auto withoutTarget = book(), withoutChapter = book(), withoutPage = book();
+  const auto withoutTarget = live(), withoutChapter = live(), withoutPage = live();
   withoutTarget->target = nullptr;
   withoutChapter->chapters[1] = nullptr;
   withoutPage->chapters[1]->pages[0] = nullptr;
