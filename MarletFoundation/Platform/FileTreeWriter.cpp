@@ -241,6 +241,10 @@ class TreeWriter {
                                                       job.target->descriptor(), entry.name.c_str(), 0) != 0) {
       return false;
     }
+    // The name may have become another file's by then, and be the first one's inode again at the last look.
+    struct stat linked;
+    if (job.target->status(entry.name.c_str(), linked) != 0) fail(errno, *job.target, entry.name);
+    if (FileStamp(linked) != entry.stamp) fail(ESTALE, *job.target, entry.name);
     entry.isShared = job.source.survey == original_;
     note(job, {entry.name, S_IFREG, entry.stamp});
     return true;
