@@ -224,17 +224,21 @@ void AtomicReplacement::settle(const std::function<void()>& check) {
   }
 }
 
-/// Puts the old item back; what took its place is a stage again.
+/// Puts the old item back; what took its place is a stage again. Without an exchange the old item bears the displaced
+/// name meanwhile, so that the next writer takes it for the item, and not for a stage, if this one ends here.
 void AtomicReplacement::takeBack() {
   const int parent = place_.parent.get();
-  if (!staging_.empty() &&
-      ::renameat2(parent, staging_.c_str(), parent, place_.name.c_str(), RENAME_EXCHANGE) == 0)
-    return;
   const auto old = std::exchange(staging_, {});
+  if (!old.empty() && ::renameat2(parent, old.c_str(), parent, place_.name.c_str(), RENAME_EXCHANGE) == 0) {
+    staging_ = old;
+    return;
+  }
   if (old.empty() && place_.item) return;  // a file is gone once another was renamed to its name
+  if (!old.empty() && old != displaced_ && moveToFreeName(old, displaced_) != 0) return;
   auto built = newStageName(stagePrefix_);
   if (moveToFreeName(place_.name, built) != 0) return;
-  if (old.empty() || moveToFreeName(old, place_.name) == 0) staging_ = std::move(built);
+  if (!old.empty()) moveToFreeName(displaced_, place_.name);
+  staging_ = std::move(built);
 }
 
 void AtomicReplacement::requireSamePlace() const {

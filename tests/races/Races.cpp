@@ -297,6 +297,7 @@ int main(int count, char** arguments) {
     return work(URL::file(arguments[2], true), arguments[3], std::stoi(arguments[4]),
                 static_cast<unsigned>(std::stoul(arguments[5])));
   }
+  if (count < 3) return 2;
   const std::string library = arguments[1];
   const auto end = std::chrono::steady_clock::now() + std::chrono::seconds(std::stoi(arguments[2]));
   std::mt19937 random(count > 3 ? static_cast<unsigned>(std::stoul(arguments[3])) : 1u);

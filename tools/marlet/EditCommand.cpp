@@ -39,17 +39,19 @@ UserEdits readEdits(const std::vector<std::string>& settings, const std::vector<
   return edits;
 }
 
-/// The hunks of an edit of a text that aren't editable.
-std::vector<DiffDescriptor> droppedHunks(const MendableBook& book, const DiffPackSnapshot& pack,
+/// The hunks of an edit of a text that its entry doesn't keep. An entry that holds the whole text keeps what leads to it.
+std::vector<DiffDescriptor> droppedHunks(const MendableBook& book,
+                                         const std::optional<FileDiffDescriptor>& entry,
                                          const std::string& file, const std::optional<Data>& data) {
   const auto authored = mergedUserEdit(makeUserEditDiffPack(book.snapshot, book.contentsUrl()), file);
   const auto original = authored ? utf16FromUTF8(authored->view()) : std::nullopt;
   const auto edited = data ? utf16FromUTF8(data->view()) : std::nullopt;
   if (!original || !edited) return {};
   auto hunks = userEditHunks(*original, *edited);
-  const auto valid =
-      UserEditDiffPackValidator(pack).validatedUpdate({FileDiffDescriptor::Modified{file, hunks}}, *original);
-  const auto kept = valid ? hunksOf(*valid) : MarletDiff::DiffDescriptors();
+  auto kept = entry ? hunksOf(*entry) : MarletDiff::DiffDescriptors();
+  const auto* whole = entry ? std::get_if<FileDiffDescriptor::Replaced>(&entry->change) : nullptr;
+  if (const auto text = whole && whole->data ? utf16FromUTF8(whole->data->view()) : std::nullopt)
+    kept = userEditHunks(*original, *text);
   // Both lists are in the same order.
   const auto* next = kept.begin();
   std::erase_if(hunks, [&](const DiffDescriptor& hunk) {
@@ -82,9 +84,10 @@ std::vector<SavedEdit> save(const MendableBook& book, const UserEdits& edits) {
   std::vector<SavedEdit> saved;
   for (const auto& [path, data] : edits) {
     const auto file = plainPath(path);
-    const auto* entry = pack.updates.first(file);
-    saved.push_back(
-        {file, entry ? std::optional(*entry) : std::nullopt, droppedHunks(book, pack, file, data)});
+    const auto* found = pack.updates.first(file);
+    auto entry = found ? std::optional(*found) : std::nullopt;
+    auto dropped = droppedHunks(book, entry, file, data);
+    saved.push_back({file, std::move(entry), std::move(dropped)});
   }
   setUserEdits(book.document.wrapper, checkedFileWrapper(pack));
   commit(book.document.path, [&] { book.document.wrapper.write(book.document.url); });
