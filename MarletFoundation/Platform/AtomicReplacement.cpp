@@ -83,7 +83,7 @@ AtomicReplacement::Place AtomicReplacement::currentPlace() const {
     place.name = split.name;
     if (!isFileName(place.name)) throwPosix(EINVAL, path_);
     place.parent =
-        Descriptor(retrying([&] { return ::open(split.parent.c_str(), DirectoryFlags & ~O_NOFOLLOW); }));
+        Descriptor(walkingAgain([&] { return ::open(split.parent.c_str(), DirectoryFlags & ~O_NOFOLLOW); }));
     if (!place.parent) throwPosix(errno, path_);
     struct stat status;
     if (::fstatat(place.parent.get(), place.name.c_str(), &status, AT_SYMLINK_NOFOLLOW) != 0) {
@@ -145,6 +145,7 @@ void AtomicReplacement::clearLeftovers() {
 Descriptor AtomicReplacement::openReplaced() const {
   Descriptor opened(retrying(
       [&] { return ::openat(place_.parent.get(), place_.name.c_str(), ReadingFlags | O_NOFOLLOW); }));
+  if (!opened && errno == ENOENT) failStale(path_);
   if (!opened) throwPosix(errno, path_);
   return opened;
 }
@@ -188,6 +189,7 @@ void AtomicReplacement::start(Make make) {
   const int error = built_ ? EBUSY : errno;
   if (error != EEXIST) removeTree(place_.parent.get(), staging_);
   staging_.clear();
+  if (error == ENOENT) failStale(path_);  // the directory itself is gone
   throwPosix(error, path_);
 }
 
@@ -242,11 +244,17 @@ void AtomicReplacement::takeBack() {
 }
 
 void AtomicReplacement::requireSamePlace() const {
-  const auto now = currentPlace();
+  Place now;
+  try {
+    now = currentPlace();
+  } catch (const ErrorObject& error) {
+    if (error.code() != ENOENT) throw;
+  }
   struct stat parent, parentNow;
   const bool isSame = now.name == place_.name && ::fstat(place_.parent.get(), &parent) == 0 &&
                       ::fstat(now.parent.get(), &parentNow) == 0 && isSameItem(parent, parentNow);
-  if (!isSame) throwPosix(ESTALE, path_, "A link on the way to the document changed while it was written.");
+  if (!isSame)
+    throwPosix(ESTALE, path_, "What lies on the way to the document changed while it was written.");
 }
 
 /// A directory is replaced only by who took it for what it is.

@@ -46,6 +46,14 @@ auto retrying(Call call) {
   }
 }
 
+/// Walks along a path once more when it led nowhere: a document on the way may have been exchanged, and the old one
+/// removed, while the first walk was inside.
+template <class Call>
+auto walkingAgain(Call call) {
+  const auto result = retrying(call);
+  return result < 0 && errno == ENOENT ? retrying(call) : result;
+}
+
 inline bool isSameItem(const struct stat& a, const struct stat& b) {
   return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
 }

@@ -60,7 +60,8 @@ std::shared_ptr<FileNode> FileNode::atPath(const std::string& path) {
     node->lookByName();
   }
   if (node->kind_ == Kind::directory) {
-    Descriptor root(retrying([&] { return ::open(node->diskName_.c_str(), DirectoryFlags & ~O_NOFOLLOW); }));
+    Descriptor root(
+        walkingAgain([&] { return ::open(node->diskName_.c_str(), DirectoryFlags & ~O_NOFOLLOW); }));
     if (!root) throwPosix(errno, path);
     node->becomeDirectory(DiskDirectory::root(std::move(root)), true);
     node->diskName_ = SharedString(path);
@@ -114,7 +115,7 @@ void FileNode::setPreferredName(std::string name) {
 
 int FileNode::lookAgain(struct stat& status) {
   if (parent_) return parent_->status(diskName_.c_str(), status);
-  return retrying([&] { return ::stat(diskName_.c_str(), &status); });
+  return walkingAgain([&] { return ::stat(diskName_.c_str(), &status); });
 }
 
 /// Looks at an item by opening it, since a look at what is open costs half as much as one by name, and most
@@ -308,8 +309,9 @@ void FileNode::readContents() {
 }
 
 Descriptor FileNode::openOnDisk(struct stat& status) {
-  Descriptor file = parent_ ? parent_->open(diskName_.c_str())
-                            : Descriptor(retrying([&] { return ::open(diskName_.c_str(), ReadingFlags); }));
+  Descriptor file = parent_
+                        ? parent_->open(diskName_.c_str())
+                        : Descriptor(walkingAgain([&] { return ::open(diskName_.c_str(), ReadingFlags); }));
   if (!file || ::fstat(file.get(), &status) != 0) return Descriptor();
   if (S_ISREG(status.st_mode)) return file;
   errno = EINVAL;

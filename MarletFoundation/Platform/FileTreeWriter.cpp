@@ -133,7 +133,7 @@ class TreeWriter {
   /// A reference is to what lies there now.
   Source referenceOf(FileNode& node) {
     const std::string path(node.diskName());
-    const Descriptor opened(retrying([&] { return ::open(path.c_str(), DirectoryFlags & ~O_NOFOLLOW); }));
+    const Descriptor opened(walkingAgain([&] { return ::open(path.c_str(), DirectoryFlags & ~O_NOFOLLOW); }));
     if (!opened) refuse(errno, path);
     return {&survey(duplicate(opened.get())), 0};
   }

@@ -179,7 +179,9 @@ void readOnce(const URL& url, int writers) {
   const auto book = openBook(url);
   for (const auto& chapter : book.snapshot.chapters)
     expect(!chapter.pages.empty(), "a chapter without pages");
-  expect(text(book.document, "Edits/UserResources/drawing") == "a learner's", "no drawing");
+  // What nobody has looked at yet goes away with the tree that another writer displaced.
+  expect(text(book.document, "Edits/UserResources/drawing") == "a learner's" || !book.document.isUnchanged(),
+         "no drawing");
   for (int id = 0; id < writers; ++id) {
     const auto number = std::to_string(id);
     for (const std::string kind : {"book-", "update-"}) {
