@@ -31,7 +31,9 @@ PathNames namesOf(const std::string& path) {
   return path.empty() ? PathNames() : relativePathComponents(path).value();
 }
 
+/// Nothing where there is no file; throws where it can't be read, since the learner's changes start from it.
 std::optional<Data> contentsAt(const FileWrapper& root, const std::string& path) {
+  root.requireReadable(path);
   const auto file = descendant(root, path);
   return file ? file->regularFileContents() : std::nullopt;
 }
@@ -107,6 +109,8 @@ namespace {
 MergedBook mergedTree(const FileWrapper& root, const URL& bookURL, const DiffPackSnapshot& pack) {
   const auto contents = root.child("Contents");
   if (!contents) throw failure("Marlet Book has no Contents directory");
+  // To the load a pack that can't be read at the moment is none; an update would then pass it by.
+  root.requireReadable("Edits/UserEdits.diffpack");
   std::optional<DiffPackSnapshot> editsBefore;
   MarletBookSnapshot before(root, bookURL, editsBefore);
   MergedBook book{root, std::move(before), std::move(editsBefore), {}, {}, {}};

@@ -1,7 +1,11 @@
 #include "MarletFoundation/Platform/FileWrapper.h"
 
+#include <cerrno>
+
+#include "MarletFoundation/Platform/ErrorObject.h"
 #include "MarletFoundation/Platform/FatalError.h"
 #include "MarletFoundation/Platform/FileNode.h"
+#include "MarletFoundation/Platform/RelativePath.h"
 
 namespace MarletFoundation {
 
@@ -51,6 +55,26 @@ std::optional<FileWrapper::Children> FileWrapper::fileWrappers() const {
       wrappers.emplace(name.view(), FileWrapper(child));
   }
   return wrappers;
+}
+
+void FileWrapper::requireReadable(std::string_view path) const {
+  const auto names = relativePathComponents(path);
+  if (!names) return;
+  const auto requireChildren = [&](FileNode& node) {
+    if (node.kind() == FileNode::Kind::directory && !node.hasChildren())
+      throw ErrorObject::posix(EACCES, std::string(path));
+  };
+  auto node = node_;
+  for (const auto name : *names) {
+    requireChildren(*node);
+    node = node->child(name);
+    if (!node) return;
+    if (node->kind() == FileNode::Kind::unreadable)
+      throw ErrorObject::posix(node->error(), std::string(path));
+  }
+  requireChildren(*node);
+  if (node->kind() == FileNode::Kind::regularFile && !node->contents())
+    throw ErrorObject::posix(node->error(), std::string(path));
 }
 
 bool FileWrapper::wasReplaced() const { return node_->wasReplaced(); }

@@ -48,6 +48,9 @@ class MARLET_EXPORT FileWrapper {
   std::optional<FileWrapper> child(std::string_view name) const;
   /// All children by name; nothing for a node that isn't a directory or can't be listed.
   std::optional<Children> fileWrappers() const;
+  /// Throws an `ErrorObject` of the POSIX domain when what lies at a path below this directory can't be read, and so
+  /// shows as absent or without contents. For those who act on absence.
+  void requireReadable(std::string_view path) const;
 
   std::optional<std::string> preferredFilename() const;
   void setPreferredFilename(std::string name);

@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include <cerrno>
+
 #include "DiffPack/Packs.h"
 #include "MarletFoundation/DiffPack/MergedUserEdit.h"
 #include "MarletFoundation/DiffPack/UpdateDiffPack.h"
@@ -124,6 +126,13 @@ TEST_F(CheckedUpdates, RefuseWhatHarmsTheBookOrItsLearner) {
   EXPECT_EQ(withNewPage("N.cutscenepage", "none.html"),
             opens + "Contents/" + chapter + "/Pages/N.cutscenepage; ");
   EXPECT_EQ(withNewPage("none.cutscenepage", "n.html"), opens + once);
+}
+
+/// A pack or text that can't be read at the moment isn't taken for none.
+TEST_F(CheckedUpdates, EndWhereTheLearnersWorkCannotBeRead) {
+  std::filesystem::resize_file(directory_.path() / "b.marletbook/Contents" / text,
+                               (std::uintmax_t{1} << 30) + 1);
+  EXPECT_EQ(thrown<ErrorObject>([&] { conflicts(update({{FileDiff::Replaced{text}}})); }).code(), EFBIG);
 }
 
 /// Insertions fit a text however often they are made.
