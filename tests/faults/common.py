@@ -6,13 +6,13 @@ page = "Chapters/One/Pages/A.marletpage/Contents.swift"
 
 def marlet_of(path, faults):
     """A function that runs the command, quietly and with the faults that the settings ask for."""
-    def run(arguments, wait=True, **settings):
+    def run(arguments, wait=True, preexec_fn=None, **settings):
         environment = {**os.environ, **settings}
         if settings:
             environment["LD_PRELOAD"] = faults
         command = [path, "-q", *arguments]
         if wait:
-            return subprocess.run(command, env=environment, stdin=subprocess.DEVNULL, capture_output=True)
+            return subprocess.run(command, env=environment, stdin=subprocess.DEVNULL, capture_output=True, preexec_fn=preexec_fn)
         return subprocess.Popen(command, env=environment, stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
 
     return run
