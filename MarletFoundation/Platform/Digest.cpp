@@ -1,8 +1,8 @@
 #include "MarletFoundation/Platform/Digest.h"
 
-#include <openssl/evp.h>
-
-#include <new>
+#define OPENSSL_SUPPRESS_DEPRECATED
+#include <openssl/md5.h>
+#include <openssl/sha.h>
 
 #include "MarletFoundation/Platform/Data.h"
 #include "MarletFoundation/Platform/ErrorObject.h"
@@ -14,52 +14,48 @@ namespace {
 
 constexpr std::size_t SHA1SliceSize = 16384;
 
-/// OpenSSL's running digest of one kind.
+/// OpenSSL's running digest of one kind, in the form that takes no memory and so can't fail: the one that chooses among
+/// providers crashes where memory runs out while it starts.
+template <class State, auto start, auto add, auto end, std::size_t size>
 class RunningDigest {
  public:
-  explicit RunningDigest(const EVP_MD* kind) : context_(EVP_MD_CTX_new()) {
-    if (!context_) throw std::bad_alloc();
-    if (EVP_DigestInit_ex(context_, kind, nullptr) != 1) fatalError("A digest is not available");
-  }
-  ~RunningDigest() { EVP_MD_CTX_free(context_); }
-  RunningDigest(const RunningDigest&) = delete;
-  RunningDigest& operator=(const RunningDigest&) = delete;
-
+  RunningDigest() { start(&state_); }
   void update(std::string_view bytes) {
-    if (EVP_DigestUpdate(context_, bytes.data(), bytes.size()) != 1) usedAfterEnd();
+    requireUnended();
+    add(&state_, bytes.data(), bytes.size());
   }
-  template <std::size_t size>
   std::array<std::uint8_t, size> final() {
+    requireUnended();
+    hasEnded_ = true;
     std::array<std::uint8_t, size> digest;
-    if (EVP_DigestFinal_ex(context_, digest.data(), nullptr) != 1) usedAfterEnd();
+    end(digest.data(), &state_);
     return digest;
   }
 
  private:
-  [[noreturn]] static void usedAfterEnd() { fatalError("A digest was used after its end"); }
+  void requireUnended() const {
+    if (hasEnded_) fatalError("A digest was used after its end");
+  }
 
-  EVP_MD_CTX* context_;
+  State state_;
+  bool hasEnded_ = false;
 };
 
 }  // namespace
 
-struct MD5::Context {
-  RunningDigest digest{EVP_md5()};
-};
+struct MD5::Context : RunningDigest<MD5_CTX, MD5_Init, MD5_Update, MD5_Final, MD5_DIGEST_LENGTH> {};
 
 MD5::MD5() : context_(std::make_unique<Context>()) {}
 MD5::~MD5() = default;
-void MD5::update(std::string_view bytes) { context_->digest.update(bytes); }
-std::array<std::uint8_t, 16> MD5::final() { return context_->digest.final<16>(); }
+void MD5::update(std::string_view bytes) { context_->update(bytes); }
+std::array<std::uint8_t, 16> MD5::final() { return context_->final(); }
 
-struct SHA1::Context {
-  RunningDigest digest{EVP_sha1()};
-};
+struct SHA1::Context : RunningDigest<SHA_CTX, SHA1_Init, SHA1_Update, SHA1_Final, SHA_DIGEST_LENGTH> {};
 
 SHA1::SHA1() : context_(std::make_unique<Context>()) {}
 SHA1::~SHA1() = default;
-void SHA1::update(std::string_view bytes) { context_->digest.update(bytes); }
-std::array<std::uint8_t, 20> SHA1::final() { return context_->digest.final<20>(); }
+void SHA1::update(std::string_view bytes) { context_->update(bytes); }
+std::array<std::uint8_t, 20> SHA1::final() { return context_->final(); }
 
 std::string hexadecimal(std::span<const std::uint8_t> bytes) {
   std::string text;
