@@ -18,7 +18,7 @@ namespace {
 
 struct stat statusOf(const std::string& path) {
   struct stat status;
-  if (retrying([&] { return ::stat(path.c_str(), &status); }) != 0) throwPosix(errno, path);
+  if (walkingAgain([&] { return ::stat(path.c_str(), &status); }) != 0) throwPosix(errno, path);
   return status;
 }
 
@@ -43,7 +43,7 @@ Relationship relationship(const URL& directory, const URL& item) {
 bool fileExists(const URL& url) {
   const auto path = fileSystemPath(url);
   struct stat status;
-  return path && retrying([&] { return ::stat(path->c_str(), &status); }) == 0;
+  return path && walkingAgain([&] { return ::stat(path->c_str(), &status); }) == 0;
 }
 
 bool isDirectory(const URL& url) { return S_ISDIR(statusOf(systemPath(url)).st_mode); }
@@ -55,7 +55,7 @@ bool resourceIsReachable(const URL& url) {
 
 std::vector<std::string> contentsOfDirectory(const URL& url, bool skipHidden) {
   const auto path = systemPath(url);
-  Descriptor root(retrying([&] { return ::open(path.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC); }));
+  Descriptor root(walkingAgain([&] { return ::open(path.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC); }));
   if (!root) throwPosix(errno, path);
   const auto entries = DiskDirectory::root(std::move(root))->entries();
   if (!entries) throwPosix(errno, path);
@@ -71,7 +71,7 @@ Data readFile(const URL& url) {
   const auto path = systemPath(url);
   const auto status = statusOf(path);
   if (!S_ISREG(status.st_mode)) throwNoRegularFile(status, path);
-  const Descriptor file(retrying([&] { return ::open(path.c_str(), ReadingFlags); }));
+  const Descriptor file(walkingAgain([&] { return ::open(path.c_str(), ReadingFlags); }));
   if (!file) throwPosix(errno, path);
   auto contents = readToEnd(file.get(), status.st_size);
   if (contents.error != 0) throwPosix(contents.error, path);

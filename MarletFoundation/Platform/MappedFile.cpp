@@ -16,7 +16,7 @@ Data readInstead(const Descriptor& file, std::optional<off_t> expectedSize, cons
 
 Data mapFile(const URL& url) {
   const auto path = systemPath(url);
-  const Descriptor file(retrying([&] { return ::open(path.c_str(), ReadingFlags); }));
+  const Descriptor file(walkingAgain([&] { return ::open(path.c_str(), ReadingFlags); }));
   struct stat status;
   if (!file || ::fstat(file.get(), &status) != 0) throwPosix(errno, path);
   if (!S_ISREG(status.st_mode)) throwNoRegularFile(status, path);

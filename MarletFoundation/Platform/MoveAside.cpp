@@ -27,7 +27,7 @@ int renameToFreeName(int directory, const std::string& from, const std::string& 
 
 std::string moveAside(const URL& directory, std::string_view name) {
   const auto open = [&] {
-    Descriptor opened(retrying([&] { return ::open(systemPath(directory).c_str(), DirectoryFlags); }));
+    Descriptor opened(walkingAgain([&] { return ::open(systemPath(directory).c_str(), DirectoryFlags); }));
     if (!opened) throwPosix(errno, directory.path());
     return opened;
   };

@@ -60,7 +60,7 @@ Data readDescendant(const URL& directory, std::string_view path) {
   const auto fail = [&](int error) { throwPosix(error, directory.appendingPathComponent(path).path()); };
   if (!relativePathComponents(path)) fail(EINVAL);
   const Descriptor parent(
-      retrying([&] { return ::open(systemPath(directory).c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC); }));
+      walkingAgain([&] { return ::open(systemPath(directory).c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC); }));
   if (!parent) fail(errno);
   const auto file = openWithoutLinks(parent, std::string(path));
   if (!file) {
