@@ -47,7 +47,8 @@ class AtomicReplacement {
   /// Flushes what was started, puts it in place, flushes the directory, and removes the old item. Refuses
   /// (ESTALE) when the path leads elsewhere by now, or to something else than at the start where that was a
   /// directory. `check` throws when the old item is no longer what it is taken for: it is asked before and after the
-  /// two are exchanged. After any failure the old item is in its place again.
+  /// two are exchanged. After any failure the old item is in its place again, but for a file where names can't be
+  /// exchanged: once another was renamed to its name, that one stays.
   void commit(const std::function<void()>& check = {});
 
   /// Where the old item lies after a replacement in two steps that was cut off between them; nothing when

@@ -81,6 +81,23 @@ int writeAll(int descriptor, std::string_view bytes) {
   return 0;
 }
 
+int copyBytes(int from, int to) {
+  while (true) {
+    const auto count =
+        retrying([&] { return ::copy_file_range(from, nullptr, to, nullptr, std::size_t{1} << 30, 0); });
+    if (count == 0) break;
+    if (count < 0 && errno != EXDEV && errno != EINVAL && errno != ENOSYS && errno != EOPNOTSUPP) return -1;
+    if (count < 0) break;
+  }
+  // For file systems that can't, and for files that claim to be empty and aren't.
+  std::vector<char> buffer(std::size_t{1} << 16);
+  while (true) {
+    const auto count = retrying([&] { return ::read(from, buffer.data(), buffer.size()); });
+    if (count <= 0) return static_cast<int>(count);
+    if (writeAll(to, {buffer.data(), static_cast<std::size_t>(count)}) != 0) return -1;
+  }
+}
+
 std::optional<std::string> fileSystemPath(const URL& url) {
   auto path = url.path();
   if (!url.isFileURL() || path.empty() || path.find('\0') != std::string::npos) return std::nullopt;

@@ -86,6 +86,9 @@ FileContents readToEnd(int descriptor, std::optional<off_t> expectedSize);
 /// Writes all bytes.
 int writeAll(int descriptor, std::string_view bytes);
 
+/// Copies what is left to read of an open file, sharing its blocks where the file system can.
+int copyBytes(int from, int to);
+
 /// The path of a file URL for the system. Nothing when the URL is no file's or the path holds a NUL.
 std::optional<std::string> fileSystemPath(const URL& url);
 /// The same, but throws EINVAL.

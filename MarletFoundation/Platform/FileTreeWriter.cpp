@@ -13,24 +13,6 @@
 namespace MarletFoundation {
 namespace {
 
-/// Copies what is left to read of an open file, sharing its blocks where the file system can.
-int copyBytes(int from, int to) {
-  while (true) {
-    const auto count =
-        retrying([&] { return ::copy_file_range(from, nullptr, to, nullptr, std::size_t{1} << 30, 0); });
-    if (count == 0) break;
-    if (count < 0 && errno != EXDEV && errno != EINVAL && errno != ENOSYS && errno != EOPNOTSUPP) return -1;
-    if (count < 0) break;
-  }
-  // For file systems that can't, and for files that claim to be empty and aren't.
-  std::vector<char> buffer(std::size_t{1} << 16);
-  while (true) {
-    const auto count = retrying([&] { return ::read(from, buffer.data(), buffer.size()); });
-    if (count <= 0) return static_cast<int>(count);
-    if (writeAll(to, {buffer.data(), static_cast<std::size_t>(count)}) != 0) return -1;
-  }
-}
-
 /// Builds a tree of nodes in a new directory, level by level without recursion, since trees may be deep. What nobody
 /// looked at is taken over as it lies on disk.
 class TreeWriter {

@@ -206,7 +206,7 @@ int work(const URL& url, const std::string& scratch, int process, unsigned seed)
   const auto end = std::chrono::steady_clock::now() + RoundLength;
   for (int thread = 0; thread < ThreadsEach; ++thread) {
     const int id = process * ThreadsEach + thread;
-    threads.emplace_back([&, id, thread] {
+    threads.emplace_back([&, id] {
       std::ofstream log(scratch + "/log-" + std::to_string(id));
       const Writer writer{url, std::to_string(id), scratch};
       const int kind = static_cast<int>((seed + static_cast<unsigned>(id)) % (Kinds + 1));
