@@ -181,8 +181,11 @@ PropertyListValue::PropertyListValue(const PropertyListValue& other) {
     } else {
       auto& to = target->payload.emplace<Dictionary>().entries_;
       to.reserve(source->dictionary()->size());
-      for (const auto& entry : *source->dictionary())
-        copyChild(entry.value, to.emplace_back(Entry{entry.key, {}}).value);
+      for (const auto& [key, value] : *source->dictionary()) {
+        auto& entry = to.emplace_back();
+        entry.key = key;
+        copyChild(value, entry.value);
+      }
     }
   }
 }
