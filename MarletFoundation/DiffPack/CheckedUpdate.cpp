@@ -94,7 +94,8 @@ class UpdateCheck {
   void checkEdit(const FileDiffDescriptor::Modified& edit, const FileWrapper& contents, std::size_t index) {
     const auto file = descendant(contents, edit.path);
     const auto text = file ? file->regularFileContents() : std::nullopt;
-    if (text != book_.editedTexts[index]) return add(Kind::DoesNotFitEdit, "Contents/" + edit.path);
+    if (!text || *text != *book_.editedTexts[index])
+      return add(Kind::DoesNotFitEdit, "Contents/" + edit.path);
     try {
       MarletDiff::mergeContent(text->view(), edit.diff);
     } catch (const Error& error) {
